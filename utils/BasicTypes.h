@@ -1,0 +1,20 @@
+/// @file
+/// Scalar types of fixed width that every other header uses, and the mark of what the library exports.
+
+#pragma once
+
+#include <cstdint>
+
+/// Marks a class or function that a program may use from the shared library; everything else stays hidden.
+#define MIREL_API __attribute__((visibility("default")))
+
+namespace mirel {
+
+/// Signed size, count or index. What it counts (elements, bytes, code units) is said where it is used.
+typedef intptr_t ssize_t;
+
+typedef uint8_t uint8;
+typedef uint16_t uint16;
+typedef int64_t int64;
+
+} // namespace mirel

@@ -1,0 +1,43 @@
+/// @file
+/// The precondition assertion: a bad argument stops the process, in every build.
+///
+/// Unlike `assert` it doesn't look at NDEBUG, neither the library's nor the program's: a check that is inlined
+/// into an optimised program must not disappear there. The report is that of the C library's own `assert`.
+
+#pragma once
+
+#include <utils/BasicTypes.h>
+
+namespace mirel {
+
+/// Reports a violated precondition through the C library's assertion facility and ends the process (SIGABRT).
+///
+/// @param expression  what should have been true, as text
+/// @param function    signature of the function that made the check
+[[noreturn, gnu::cold]] MIREL_API void AssertionFailed(const char* expression, const char* file, int line,
+                                                       const char* function);
+
+namespace detail {
+
+/// Whether n elements from index i on lie within size elements. True to its meaning for every pair of values:
+/// written as a sum, i + n could overflow and pass.
+constexpr bool IsSubrange(ssize_t i, ssize_t n, ssize_t size) {
+  return 0 <= i && 0 <= n && i <= size && n <= size - i;
+}
+
+} // namespace detail
+
+} // namespace mirel
+
+/// Stops the process with the given text unless the condition, evaluated once, is true.
+#define MIREL_ASSERT_AS(condition, text)                                                                     \
+  ((condition) ? static_cast<void>(0)                                                                        \
+               : ::mirel::AssertionFailed(text, __FILE__, __LINE__, __PRETTY_FUNCTION__))
+
+/// Stops the process with the expression's own text unless the expression, evaluated once, is true.
+#define MIREL_ASSERT(expression) MIREL_ASSERT_AS(expression, #expression)
+
+/// Asserts that the n elements from index i on lie within size, for every pair of values.
+/// For (ri, rn, r.size()) the text is "0 <= ri && 0 <= rn && ri+rn <= r.size()".
+#define MIREL_ASSERT_SUBRANGE(i, n, size)                                                                    \
+  MIREL_ASSERT_AS(::mirel::detail::IsSubrange(i, n, size), "0 <= " #i " && 0 <= " #n " && " #i "+" #n " <= " #size)

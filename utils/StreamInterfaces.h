@@ -1,0 +1,20 @@
+/// @file
+/// The sink of bytes that an output stream writes to.
+
+#pragma once
+
+#include <utils/BasicTypes.h>
+
+namespace mirel {
+
+/// Where the bytes of an xostream go: implement it for a file, a socket or a string.
+/// What an implementation throws leaves the stream member that called it.
+struct MIREL_API IOutputStream {
+  virtual ~IOutputStream();
+  /// Takes the count bytes at address, all of them; count is above 0.
+  virtual void WriteStream(const void* address, ssize_t count) = 0;
+  /// Passes on whatever the sink may have kept back.
+  virtual void FlushStream() = 0;
+};
+
+} // namespace mirel

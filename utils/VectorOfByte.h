@@ -1,0 +1,358 @@
+/// @file
+/// Algorithms over ranges of code units, and the buffer of bytes that owns the storage of every container.
+///
+/// The algorithms only read the ranges they are given: they allocate nothing, check nothing and can't fail.
+/// The buffer knows bytes: every size, offset and capacity is in bytes. It knows neither elements nor text.
+
+#pragma once
+
+#include <cstring>
+#include <initializer_list>
+#include <iterator>
+#include <type_traits>
+
+#include <utils/Precondition.h>
+#include <utils/xchar.h>
+
+namespace mirel {
+
+namespace detail {
+
+/// The value by which a code unit compares. Plain char may be signed, the order of text may not.
+inline unsigned char UnitValue(char x) { return static_cast<unsigned char>(x); }
+template <class T> const T& UnitValue(const T& x) { return x; }
+
+/// Lets an overload take part only for integers. An integer argument of any type matches such an overload
+/// exactly, which is how a literal 0 stays an index or a count where a pointer could be meant too.
+template <class... N> using IfIntegers = std::enable_if_t<(std::is_integral_v<N> && ...), int>;
+
+} // namespace detail
+
+/// @name Comparing ranges
+/// A range is a pair of pointers or iterators, the second one past the last element. Code units compare as
+/// unsigned values in both widths. An empty range may be a pair of null pointers.
+/// @{
+
+/// Orders two ranges by their first differing element; of a range and its proper prefix, the prefix is first.
+/// @return -1, 0 or 1
+template <class It1, class It2> int LexicographicalCompareX(It1 x1, It1 x2, It2 y1, It2 y2) {
+  for (; x1 != x2 && y1 != y2; ++x1, ++y1) {
+    if (detail::UnitValue(*x1) < detail::UnitValue(*y1))
+      return -1;
+    if (detail::UnitValue(*y1) < detail::UnitValue(*x1))
+      return 1;
+  }
+  if (x1 != x2)
+    return 1;
+  return y1 == y2 ? 0 : -1;
+}
+
+/// The same order for bytes. A difference within the common length yields the value of memcmp, of any size;
+/// otherwise the lengths decide: -1, 0 or 1.
+inline int LexicographicalCompareX(const unsigned char* x1, const unsigned char* x2, const unsigned char* y1,
+                                   const unsigned char* y2) {
+  const ssize_t lenX = x2 - x1;
+  const ssize_t lenY = y2 - y1;
+  const ssize_t len = lenX < lenY ? lenX : lenY;
+  // Even for no bytes memcmp may not be given the null pointers of an empty range.
+  const int result = len == 0 ? 0 : std::memcmp(x1, y1, static_cast<std::size_t>(len));
+  if (result != 0)
+    return result;
+  return lenX < lenY ? -1 : lenX > lenY;
+}
+
+/// The same for 8-bit code units, compared as bytes.
+inline int LexicographicalCompareX(const char* x1, const char* x2, const char* y1, const char* y2) {
+  const auto bytes = [](const char* p) { return reinterpret_cast<const unsigned char*>(p); };
+  return LexicographicalCompareX(bytes(x1), bytes(x2), bytes(y1), bytes(y2));
+}
+
+/// Whether the range [x1, x2) and the run of the same length at y1 hold the same elements.
+inline bool IsEqual(const char8* x1, const char8* x2, const char8* y1) {
+  return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1)) == 0;
+}
+inline bool IsEqual(const uint16* x1, const uint16* x2, const uint16* y1) {
+  return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1) * sizeof(uint16)) == 0;
+}
+
+/// Whether [y1, y2) is a prefix of [x1, x2). An empty range is a prefix of every range.
+template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
+  for (; y1 != y2; ++x1, ++y1)
+    if (x1 == x2 || detail::UnitValue(*x1) != detail::UnitValue(*y1))
+      return false;
+  return true;
+}
+
+/// @}
+/// @name Searching ranges
+/// Each search returns a position in the searched range, or that range's end when nothing is found. None
+/// prepares anything: at worst the cost is the product of the two lengths.
+/// @{
+
+/// The first element equal to v, or i2.
+template <class It, class T> It Find(It i1, It i2, const T& v) {
+  while (i1 != i2 && detail::UnitValue(*i1) != detail::UnitValue(v))
+    ++i1;
+  return i1;
+}
+
+/// The start of the first occurrence of [y1, y2) in [x1, x2), or x2. An empty pattern is found at x1.
+template <class It1, class It2> It1 FindFirstSubSequence(It1 x1, It1 x2, It2 y1, It2 y2) {
+  while (x1 != x2 && !IsPrefix(x1, x2, y1, y2))
+    ++x1;
+  return x1;
+}
+
+/// The first element of [x1, x2) that occurs in [y1, y2), or x2.
+template <class It1, class It2> It1 FindFirstOf(It1 x1, It1 x2, It2 y1, It2 y2) {
+  while (x1 != x2 && Find(y1, y2, *x1) == y2)
+    ++x1;
+  return x1;
+}
+
+/// The first element of [x1, x2) that doesn't occur in [y1, y2), or x2.
+template <class It1, class It2> It1 FindFirstNotOf(It1 x1, It1 x2, It2 y1, It2 y2) {
+  while (x1 != x2 && Find(y1, y2, *x1) != y2)
+    ++x1;
+  return x1;
+}
+
+/// The last element equal to v, or i2.
+template <class It, class T> It FindLast(It i1, It i2, const T& v) {
+  for (It p = i2; p != i1;)
+    if (detail::UnitValue(*--p) == detail::UnitValue(v))
+      return p;
+  return i2;
+}
+
+/// The start of the last occurrence of [y1, y2) in [x1, x2), or x2. An empty pattern is found at x2.
+template <class It1, class It2> It1 FindLastSubSequence(It1 x1, It1 x2, It2 y1, It2 y2) {
+  for (It1 p = x2;; --p) {
+    if (IsPrefix(p, x2, y1, y2))
+      return p;
+    if (p == x1)
+      return x2;
+  }
+}
+
+/// The last element of [x1, x2) that occurs in [y1, y2), or x2.
+template <class It1, class It2> It1 FindLastOf(It1 x1, It1 x2, It2 y1, It2 y2) {
+  for (It1 p = x2; p != x1;)
+    if (Find(y1, y2, *--p) != y2)
+      return p;
+  return x2;
+}
+
+/// The last element of [x1, x2) that doesn't occur in [y1, y2), or x2.
+template <class It1, class It2> It1 FindLastNotOf(It1 x1, It1 x2, It2 y1, It2 y2) {
+  for (It1 p = x2; p != x1;)
+    if (Find(y1, y2, *--p) == y2)
+      return p;
+  return x2;
+}
+
+/// @}
+
+/// An untyped, growable array of bytes: the storage of every vector and string.
+///
+/// Parameters: `i` is an offset or an iterator, `n` a number of bytes from there, `i1`/`i2` and `r1`/`r2` the
+/// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a repeat count.
+///
+/// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments stop
+/// the process with the text after "@pre". Memory that can't be had is std::bad_alloc, thrown before anything
+/// has changed. Whatever may grow the buffer may move its storage and so invalidates pointers into it; erasing
+/// keeps the storage and moves down the bytes behind. A run of edits costs amortised constant time per byte
+/// added, plus the bytes that it moves.
+class MIREL_API VectorOfByte {
+public:
+  typedef uint8 value_type;
+  typedef value_type* iterator;
+
+  /// @name Construction, copy
+  /// @{
+
+  /// An empty buffer without storage.
+  VectorOfByte() noexcept;
+  /// A copy of the bytes of [r1, r2). @pre "r1 <= r2"
+  VectorOfByte(const value_type* r1, const value_type* r2);
+  /// count bytes of value x. @pre "0 <= count"
+  explicit VectorOfByte(ssize_t count, value_type x);
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  explicit VectorOfByte(N count, X x)
+      : VectorOfByte(ssize_t(count), value_type(x)) {}
+  VectorOfByte(std::initializer_list<uint8> r);
+  VectorOfByte(const VectorOfByte& r);
+  ~VectorOfByte();
+
+  /// Becomes a copy of r; keeps the storage where it is large enough.
+  VectorOfByte& operator=(const VectorOfByte& r);
+  /// Exchanges contents, sizes and capacities in constant time.
+  void swap(VectorOfByte& r) noexcept;
+
+  /// @}
+  /// @name Capacity
+  /// @{
+
+  ssize_t size() const { return size_; }
+  ssize_t capacity() const { return m_capacity; }
+  bool empty() const { return size_ == 0; }
+
+  /// Makes room for n bytes in all, exactly; does nothing where there is room. It is const so that a const
+  /// string can make room for its terminator; the contents stay as they are.
+  void reserve(ssize_t n) const;
+  /// Makes the size n bytes; new bytes have no particular value. @pre "0 <= n"
+  void resize(ssize_t n);
+  /// Appends count bytes of no particular value. @pre "0 <= n"
+  void growbytes(ssize_t count) { insertbytes(size(), count); }
+  /// Makes the size 0 and keeps the storage.
+  void clear() noexcept;
+
+  /// @}
+  /// @name Access
+  /// data() and begin() are null in a buffer that has no storage yet.
+  /// @{
+
+  value_type* begin() { return m_buffer; }
+  const value_type* begin() const { return m_buffer; }
+  value_type* end() { return m_buffer + size_; }
+  const value_type* end() const { return m_buffer + size_; }
+  value_type* data() { return m_buffer; }
+  const value_type* data() const { return m_buffer; }
+  value_type* data_end() { return m_buffer + size_; }
+  const value_type* data_end() const { return m_buffer + size_; }
+
+  /// Unchecked, so that it can address a gap that has just been opened.
+  value_type& operator[](ssize_t i) { return m_buffer[i]; }
+  /// @pre "0 <= i && i < size()"
+  value_type operator[](ssize_t i) const {
+    MIREL_ASSERT(0 <= i && i < size());
+    return m_buffer[i];
+  }
+  /// @pre "size() > 0", as in the three below
+  value_type& front() {
+    MIREL_ASSERT(size() > 0);
+    return m_buffer[0];
+  }
+  value_type front() const {
+    MIREL_ASSERT(size() > 0);
+    return m_buffer[0];
+  }
+  value_type& back() {
+    MIREL_ASSERT(size() > 0);
+    return m_buffer[size_ - 1];
+  }
+  value_type back() const {
+    MIREL_ASSERT(size() > 0);
+    return m_buffer[size_ - 1];
+  }
+
+  /// Whether p points into the storage, the spare part included.
+  bool owns(const void* p) const {
+    return reinterpret_cast<uintptr_t>(p) - reinterpret_cast<uintptr_t>(m_buffer) <
+           static_cast<uintptr_t>(m_capacity);
+  }
+
+  /// @}
+  /// @name Assigning, appending
+  /// @{
+
+  /// Becomes a copy of [r1, r2). @pre "r1 <= r2"
+  void assign(const value_type* r1, const value_type* r2);
+  /// Appends the bytes of r.
+  VectorOfByte& operator+=(const VectorOfByte& r);
+  /// Appends the bytes of [r1, r2). @pre "r1 <= r2"
+  void push_back(const value_type* r1, const value_type* r2);
+
+  /// Appends the bytes of one T. When the buffer is full it reserves the new size plus the old capacity.
+  template <class T> void push_back(const T& x) {
+    const T value = x; // x may lie in the storage that reserve() is about to give up
+    const ssize_t n = size_ + ssize_t(sizeof(T));
+    if (m_capacity < n)
+      reserve(n + m_capacity);
+    std::memcpy(m_buffer + size_, &value, sizeof(T));
+    size_ = n;
+  }
+
+  /// Removes the last count bytes. @pre "0 <= count", then "size_ >= 0" of the size that would be left
+  void pop_back(ssize_t count) {
+    MIREL_ASSERT(0 <= count);
+    MIREL_ASSERT_AS(count <= size_, "size_ >= 0");
+    size_ -= count;
+  }
+
+  /// @}
+  /// @name Inserting
+  /// @pre "0 <= i && i <= size()", then "0 <= n", "r1 <= r2" or "0 <= count"
+  /// @{
+
+  /// Opens a gap of n bytes, of no particular value, before offset i.
+  void insertbytes(ssize_t i, ssize_t n);
+  /// Inserts the bytes of [r1, r2).
+  void insert(ssize_t i, const value_type* r1, const value_type* r2);
+  void insert(iterator i, const value_type* r1, const value_type* r2) { insert(i - begin(), r1, r2); }
+  /// Inserts count bytes of value x.
+  void insert(ssize_t i, ssize_t count, value_type x);
+  void insert(iterator i, ssize_t count, value_type x) { insert(i - begin(), count, x); }
+  /// Inserts one byte; the iterator form returns where it is now.
+  void insert(ssize_t i, value_type x) { insert(i, ssize_t(1), x); }
+  iterator insert(iterator i, value_type x);
+
+  /// Integers of any type: the offset forms above.
+  template <class N, detail::IfIntegers<N> = 0>
+  void insert(N i, const value_type* r1, const value_type* r2) {
+    insert(ssize_t(i), r1, r2);
+  }
+  template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
+    insert(ssize_t(i), ssize_t(count), value_type(x));
+  }
+  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) {
+    insert(ssize_t(i), value_type(x));
+  }
+
+  /// @}
+  /// @name Moving, erasing
+  /// @{
+
+  /// Moves n bytes from offset s to offset d, also where the two stretches overlap.
+  /// @pre "0 <= d && 0 <= n && d+n <= size()", then "0 <= s && 0 <= n && s+n <= size()"
+  void move(ssize_t d, ssize_t s, ssize_t n);
+  /// Removes the bytes of [i1, i2). @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
+  void erase(iterator i1, iterator i2);
+  /// Removes the byte at i and returns where the next one is now. @pre "begin() <= i && i < end()"
+  iterator erase(iterator i);
+  /// Removes n bytes from offset i on. @pre "0 <= i && 0 <= n && i+n <= size()"
+  void erase(ssize_t i, ssize_t n);
+  template <class N, class M, detail::IfIntegers<N, M> = 0> void erase(N i, M n) {
+    erase(ssize_t(i), ssize_t(n));
+  }
+  /// Removes the byte at offset i. @pre "0 <= i && i < size()"
+  void erase_element(ssize_t i);
+
+  /// @}
+  /// @name Comparison
+  /// The sign of compare() tells the order of the bytes as unsigned values.
+  /// @{
+
+  int compare(const VectorOfByte& r) const;
+  /// @pre "0 <= i && 0 <= n && i+n <= size()"
+  int compare(ssize_t i, ssize_t n, const VectorOfByte& r) const;
+  /// @pre as above, then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  int compare(ssize_t i, ssize_t n, const VectorOfByte& r, ssize_t ri, ssize_t rn) const;
+  /// @pre as above, then "pn == 0 || (pn > 0 && p != nullptr)"
+  int compare(ssize_t i, ssize_t n, const value_type* p, ssize_t pn) const;
+
+  bool operator==(const VectorOfByte& r) const { return size_ == r.size_ && compare(r) == 0; }
+  bool operator!=(const VectorOfByte& r) const { return !(*this == r); }
+  bool operator<(const VectorOfByte& r) const { return compare(r) < 0; }
+  bool operator<=(const VectorOfByte& r) const { return compare(r) <= 0; }
+  bool operator>(const VectorOfByte& r) const { return compare(r) > 0; }
+  bool operator>=(const VectorOfByte& r) const { return compare(r) >= 0; }
+
+  /// @}
+
+  mutable value_type* m_buffer; ///< The storage, or null while there is none.
+  ssize_t size_;                ///< Bytes in use, 0 <= size_ <= m_capacity; the rest is spare and may be written.
+  mutable ssize_t m_capacity;   ///< Bytes of storage.
+};
+
+} // namespace mirel

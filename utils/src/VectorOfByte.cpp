@@ -1,0 +1,184 @@
+#include <utils/VectorOfByte.h>
+
+#include <cstdlib>
+#include <limits>
+#include <new>
+#include <utility>
+
+namespace mirel {
+
+namespace {
+
+constexpr ssize_t kMaxBytes = std::numeric_limits<ssize_t>::max();
+
+// The C library's functions may not be given null pointers, which empty ranges may consist of, even for no bytes.
+
+void CopyBytes(uint8* dst, const uint8* src, ssize_t n) {
+  if (n != 0)
+    std::memcpy(dst, src, static_cast<std::size_t>(n));
+}
+
+void MoveBytes(uint8* dst, const uint8* src, ssize_t n) {
+  if (n != 0)
+    std::memmove(dst, src, static_cast<std::size_t>(n));
+}
+
+void FillBytes(uint8* dst, ssize_t n, uint8 x) {
+  if (n != 0)
+    std::memset(dst, x, static_cast<std::size_t>(n));
+}
+
+/// Makes room for n bytes in all. This is where growth is decided, for all edits but push_back of an element,
+/// which follows the same rule inline: the new size plus the old capacity. The capacity at least doubles, so a
+/// run of edits moves each byte a constant number of times on average; a first request is granted exactly.
+void GrowTo(const VectorOfByte& buffer, ssize_t n) {
+  const ssize_t capacity = buffer.capacity();
+  if (capacity < n)
+    buffer.reserve(n <= kMaxBytes - capacity ? n + capacity : n);
+}
+
+} // namespace
+
+VectorOfByte::VectorOfByte() noexcept : m_buffer(nullptr), size_(0), m_capacity(0) {}
+
+VectorOfByte::VectorOfByte(const value_type* r1, const value_type* r2) : VectorOfByte() { assign(r1, r2); }
+
+VectorOfByte::VectorOfByte(ssize_t count, value_type x) : VectorOfByte() { insert(0, count, x); }
+
+VectorOfByte::VectorOfByte(std::initializer_list<uint8> r) : VectorOfByte() { assign(r.begin(), r.end()); }
+
+VectorOfByte::VectorOfByte(const VectorOfByte& r) : VectorOfByte() { assign(r.begin(), r.end()); }
+
+VectorOfByte::~VectorOfByte() { std::free(m_buffer); }
+
+VectorOfByte& VectorOfByte::operator=(const VectorOfByte& r) {
+  if (this != &r)
+    assign(r.begin(), r.end());
+  return *this;
+}
+
+void VectorOfByte::swap(VectorOfByte& r) noexcept {
+  std::swap(m_buffer, r.m_buffer);
+  std::swap(size_, r.size_);
+  std::swap(m_capacity, r.m_capacity);
+}
+
+void VectorOfByte::reserve(ssize_t n) const {
+  if (n <= m_capacity)
+    return;
+  void* const buffer = std::realloc(m_buffer, static_cast<std::size_t>(n));
+  if (buffer == nullptr)
+    throw std::bad_alloc(); // the old storage is still ours, untouched
+  m_buffer = static_cast<value_type*>(buffer);
+  m_capacity = n;
+}
+
+void VectorOfByte::resize(ssize_t n) {
+  MIREL_ASSERT(0 <= n);
+  GrowTo(*this, n);
+  size_ = n;
+}
+
+void VectorOfByte::clear() noexcept { size_ = 0; }
+
+void VectorOfByte::assign(const value_type* r1, const value_type* r2) {
+  MIREL_ASSERT(r1 <= r2);
+  if (owns(r1)) {
+    VectorOfByte copy(r1, r2);
+    return swap(copy);
+  }
+  resize(r2 - r1);
+  CopyBytes(m_buffer, r1, size_);
+}
+
+VectorOfByte& VectorOfByte::operator+=(const VectorOfByte& r) {
+  insert(size_, r.begin(), r.end());
+  return *this;
+}
+
+void VectorOfByte::push_back(const value_type* r1, const value_type* r2) { insert(size_, r1, r2); }
+
+void VectorOfByte::insertbytes(ssize_t i, ssize_t n) {
+  MIREL_ASSERT(0 <= i && i <= size());
+  MIREL_ASSERT(0 <= n);
+  if (n > kMaxBytes - size_)
+    throw std::bad_alloc();
+  GrowTo(*this, size_ + n);
+  MoveBytes(m_buffer + i + n, m_buffer + i, size_ - i);
+  size_ += n;
+}
+
+void VectorOfByte::insert(ssize_t i, const value_type* r1, const value_type* r2) {
+  MIREL_ASSERT(0 <= i && i <= size());
+  MIREL_ASSERT(r1 <= r2);
+  if (owns(r1)) {
+    const VectorOfByte copy(r1, r2);
+    return insert(i, copy.begin(), copy.end());
+  }
+  insertbytes(i, r2 - r1);
+  CopyBytes(m_buffer + i, r1, r2 - r1);
+}
+
+void VectorOfByte::insert(ssize_t i, ssize_t count, value_type x) {
+  MIREL_ASSERT(0 <= i && i <= size());
+  MIREL_ASSERT(0 <= count);
+  insertbytes(i, count);
+  FillBytes(m_buffer + i, count, x);
+}
+
+VectorOfByte::iterator VectorOfByte::insert(iterator i, value_type x) {
+  const ssize_t n = i - begin();
+  insert(n, x);
+  return begin() + n;
+}
+
+void VectorOfByte::move(ssize_t d, ssize_t s, ssize_t n) {
+  MIREL_ASSERT_SUBRANGE(d, n, size());
+  MIREL_ASSERT_SUBRANGE(s, n, size());
+  MoveBytes(m_buffer + d, m_buffer + s, n);
+}
+
+void VectorOfByte::erase(iterator i1, iterator i2) {
+  MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
+  MoveBytes(i1, i2, end() - i2);
+  size_ -= i2 - i1;
+}
+
+VectorOfByte::iterator VectorOfByte::erase(iterator i) {
+  MIREL_ASSERT(begin() <= i && i < end());
+  erase(i, i + 1);
+  return i;
+}
+
+void VectorOfByte::erase(ssize_t i, ssize_t n) {
+  MIREL_ASSERT_SUBRANGE(i, n, size());
+  erase(begin() + i, begin() + i + n);
+}
+
+void VectorOfByte::erase_element(ssize_t i) {
+  MIREL_ASSERT(0 <= i && i < size());
+  erase(begin() + i);
+}
+
+int VectorOfByte::compare(const VectorOfByte& r) const {
+  return LexicographicalCompareX(begin(), end(), r.begin(), r.end());
+}
+
+int VectorOfByte::compare(ssize_t i, ssize_t n, const VectorOfByte& r) const {
+  MIREL_ASSERT_SUBRANGE(i, n, size());
+  return LexicographicalCompareX(begin() + i, begin() + i + n, r.begin(), r.end());
+}
+
+int VectorOfByte::compare(ssize_t i, ssize_t n, const VectorOfByte& r, ssize_t ri, ssize_t rn) const {
+  MIREL_ASSERT_SUBRANGE(i, n, size());
+  MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
+  return LexicographicalCompareX(begin() + i, begin() + i + n, r.begin() + ri, r.begin() + ri + rn);
+}
+
+int VectorOfByte::compare(ssize_t i, ssize_t n, const value_type* p, ssize_t pn) const {
+  MIREL_ASSERT_SUBRANGE(i, n, size());
+  MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
+  return LexicographicalCompareX(begin() + i, begin() + i + n, p, p + pn);
+}
+
+} // namespace mirel

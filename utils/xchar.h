@@ -1,0 +1,22 @@
+/// @file
+/// The code units that strings are made of.
+
+#pragma once
+
+#include <utils/BasicTypes.h>
+
+namespace mirel {
+
+/// A UTF-8 code unit, or a byte of ASCII text. Whether plain char is signed makes no difference to any result.
+typedef char char8;
+
+/// A UTF-16 code unit in the machine's own byte order; the same type as uint16, not `char16_t`.
+typedef uint16_t char16;
+
+/// The character type of xostream.
+typedef char8 xchar;
+
+/// Points at a run of char8 that ends before its first zero.
+typedef const char8* ConstString8Z;
+
+} // namespace mirel

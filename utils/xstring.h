@@ -1,0 +1,239 @@
+/// @file
+/// string8 and string16, their zero-terminated interface, and the conversions between UTF-8, UTF-16 and ASCII.
+///
+/// The string knows zero termination and nothing else: it measures a zero-terminated argument once and hands
+/// the run to the vector. It has no storage and no invariant of its own.
+
+#pragma once
+
+#include <cstring>
+
+#include <utils/xvector.h>
+
+namespace mirel {
+
+class xostream;
+
+/// The number of code units before the first zero unit at s, which may not be null. Linear.
+inline ssize_t GetStringLength(const char8* s) { return static_cast<ssize_t>(std::strlen(s)); }
+inline ssize_t GetStringLength(const char16* s) {
+  const char16* end = s;
+  while (*end != 0)
+    ++end;
+  return end - s;
+}
+
+/// A string: a vector of code units that also takes and gives zero-terminated runs.
+///
+/// Any of its units may be zero, and no terminator is kept: c_str() writes one behind the contents, where the
+/// next change may overwrite it. All that xvector offers is offered here too, and what is said there of bad
+/// arguments, memory, invalidation and aliasing holds.
+///
+/// A zero-terminated argument (`const T*` without a count) must not be null, and ends before its first zero; it
+/// is measured once, before anything is checked or changed, and then treated as a pointer and count.
+template <class T> class MIREL_API basic_xstring : public xvector<T> {
+  typedef xvector<T> Base;
+
+public:
+  /// @name Construction
+  /// @{
+
+  basic_xstring() {}
+  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"; npos isn't a count here
+  basic_xstring(const basic_xstring<T>& r, ssize_t ri, ssize_t rn) : Base(r, ri, rn) {}
+  /// @pre "pn == 0 || (pn > 0 && p != nullptr)", of r and rn
+  basic_xstring(const T* r, ssize_t rn) : Base(r, rn) {}
+  template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
+  basic_xstring(P r, N rn) : Base(static_cast<const T*>(r), ssize_t(rn)) {}
+  /// A zero-terminated run.
+  basic_xstring(const T* r) : Base(r, r + GetStringLength(r)) {}
+  /// count units x. @pre "0 <= count"
+  explicit basic_xstring(ssize_t count, T x) : Base(count, x) {}
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  explicit basic_xstring(N count, X x) : Base(ssize_t(count), T(x)) {}
+  /// @pre "r1 <= r2"
+  basic_xstring(const T* r1, const T* r2) : Base(r1, r2) {}
+  basic_xstring(const basic_xstring<T>& r) : Base(r) {}
+  /// The units of a vector, such as the result of operator+.
+  basic_xstring(const Base& r) : Base(r) {}
+  ~basic_xstring() {}
+
+  /// @}
+  /// @name Assignment
+  /// @{
+
+  basic_xstring<T>& operator=(const basic_xstring<T>& r) = default;
+  basic_xstring<T>& operator=(const T* rhs) { return assign(rhs); }
+  /// The listed units. Without it `s = {}` would be a null pointer.
+  basic_xstring<T>& operator=(std::initializer_list<T> r) {
+    assign(r.begin(), r.end());
+    return *this;
+  }
+  using Base::assign;
+  basic_xstring<T>& assign(const T* s) {
+    assign(s, GetStringLength(s));
+    return *this;
+  }
+
+  /// @}
+  /// @name Zero termination
+  /// @{
+
+  /// The contents with a zero unit behind them, which is not part of the string.
+  ///
+  /// It counts as a change, though it is const: it may move the storage, and no other thread may use the string
+  /// meanwhile. It does move it where there is no spare unit, and then makes room for more than one, so that
+  /// appends and c_str() in turn take amortised constant time. The result is valid until the next change; a
+  /// second call without one gives the same pointer.
+  /// @pre "p": never null after room was made
+  const T* c_str() const {
+    const ssize_t n = this->size();
+    if (n == this->capacity())
+      this->reserve(n + 1 + n / 2);
+    const T* const p = this->data();
+    MIREL_ASSERT(p);
+    const_cast<T*>(p)[n] = 0;
+    return p;
+  }
+
+  /// @}
+  /// @name Appending, inserting, replacing
+  /// @{
+
+  using Base::operator+=;
+  basic_xstring<T>& operator+=(const T* s) { return append(s); }
+  template <class X, detail::IfIntegers<X> = 0> basic_xstring<T>& operator+=(X x) {
+    this->push_back(T(x));
+    return *this;
+  }
+  using Base::append;
+  basic_xstring<T>& append(const T* s) {
+    this->push_back(s, s + GetStringLength(s));
+    return *this;
+  }
+  using Base::insert;
+  /// @pre "0 <= i && i <= size()"
+  basic_xstring<T>& insert(ssize_t i, const T* s) {
+    insert(i, s, s + GetStringLength(s));
+    return *this;
+  }
+  using Base::replace;
+  /// @pre "0 <= i && 0 <= n && i+n <= size()"
+  basic_xstring<T>& replace(ssize_t i, ssize_t n, const T* p) {
+    replace(i, n, p, GetStringLength(p));
+    return *this;
+  }
+
+  /// @}
+  /// @name Comparison
+  /// @{
+
+  using Base::compare;
+  int compare(const T* p) const { return compare(p, GetStringLength(p)); }
+  /// @pre "0 <= i && 0 <= n && i+n <= size()"
+  int compare(ssize_t i, ssize_t n, const T* p) const { return compare(i, n, p, GetStringLength(p)); }
+  using Base::_Eq;
+  bool _Eq(const T* rhs) const { return compare(rhs) == 0; }
+  using Base::_Lt;
+  bool _Lt(const T* rhs) const { return compare(rhs) < 0; }
+
+  /// @}
+  /// @name Search
+  /// An integer of any type is a unit: find(0) looks for a zero unit, not at a null pointer.
+  /// @{
+
+  using Base::find;
+  ssize_t find(const T* p, ssize_t offset = 0) const { return find(p, p + GetStringLength(p), offset); }
+  template <class X, detail::IfIntegers<X> = 0> ssize_t find(X c, ssize_t offset = 0) const {
+    return Base::find(T(c), offset);
+  }
+  using Base::rfind;
+  ssize_t rfind(const T* p, ssize_t offset = Base::npos) const {
+    return rfind(p, p + GetStringLength(p), offset);
+  }
+  template <class X, detail::IfIntegers<X> = 0> ssize_t rfind(X c, ssize_t offset = Base::npos) const {
+    return Base::rfind(T(c), offset);
+  }
+  using Base::find_first_of;
+  ssize_t find_first_of(const T* s, ssize_t offset = 0) const {
+    return find_first_of(s, s + GetStringLength(s), offset);
+  }
+  template <class X, detail::IfIntegers<X> = 0> ssize_t find_first_of(X c, ssize_t offset = 0) const {
+    return Base::find_first_of(T(c), offset);
+  }
+  using Base::find_first_not_of;
+  ssize_t find_first_not_of(const T* s, ssize_t offset = 0) const {
+    return find_first_not_of(s, s + GetStringLength(s), offset);
+  }
+  template <class X, detail::IfIntegers<X> = 0> ssize_t find_first_not_of(X c, ssize_t offset = 0) const {
+    return Base::find_first_not_of(T(c), offset);
+  }
+  using Base::find_last_of;
+  ssize_t find_last_of(const T* s, ssize_t offset = Base::npos) const {
+    return find_last_of(s, s + GetStringLength(s), offset);
+  }
+  template <class X, detail::IfIntegers<X> = 0> ssize_t find_last_of(X c, ssize_t offset = Base::npos) const {
+    return Base::find_last_of(T(c), offset);
+  }
+  using Base::find_last_not_of;
+  ssize_t find_last_not_of(const T* s, ssize_t offset = Base::npos) const {
+    return find_last_not_of(s, s + GetStringLength(s), offset);
+  }
+  template <class X, detail::IfIntegers<X> = 0>
+  ssize_t find_last_not_of(X c, ssize_t offset = Base::npos) const {
+    return Base::find_last_not_of(T(c), offset);
+  }
+
+  /// As the vector's, but a string.
+  basic_xstring<T> substr(ssize_t offset = 0, ssize_t count = Base::npos) const {
+    Base units = Base::substr(offset, count);
+    basic_xstring<T> result;
+    result.swap(units);
+    return result;
+  }
+
+  /// @}
+};
+
+typedef basic_xstring<char8> string8;
+typedef basic_xstring<char16> string16;
+typedef basic_xstring<char> xstring;
+
+extern template class xvector<char8>;
+extern template class basic_xstring<char8>;
+extern template class xvector<char16>;
+extern template class basic_xstring<char16>;
+
+/// @name Conversions
+/// Replace the contents of the destination with those of the run of srcLen units at src, in one pass. UTF-16 is
+/// in the machine's own byte order; a byte order mark is a code point like any other, and so is a zero. What is
+/// well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for UTF-16. Memory that
+/// can't be had is std::bad_alloc and leaves the destination partly filled.
+/// @{
+
+/// One unit for each byte: its value, or "?" for bytes from 0x80 on. @pre "newSize >= 0", of srcLen
+MIREL_API void Utf16FromAscii(string16& dst, const char8* src, ssize_t srcLen);
+
+/// @return false where the source is malformed or cut off; then what precedes the bad sequence has been converted
+/// @pre "srcLen >= 0"
+MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src, ssize_t srcLen);
+/// The same for a zero-terminated run. @pre "src"
+MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src);
+MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src, ssize_t srcLen);
+MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src);
+
+/// What the four above do, for generic code: (char16, char8) is UTF-8 to UTF-16, (char8, char16) the way back.
+template <class CharOut, class CharIn>
+bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen);
+extern template MIREL_API bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);
+extern template MIREL_API bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen);
+
+/// @}
+
+/// Writes the units of v, zeros included and unformatted, to os.
+MIREL_API xostream& operator<<(xostream& os, const string8& v);
+
+/// Does nothing; a reference to it pulls the string code of a static library into a program.
+MIREL_API void HackToForcexstringIntoUtilsDll();
+
+} // namespace mirel
