@@ -76,12 +76,10 @@ Encoding ParseEncoding(const char* text) {
 }
 
 Options ParseOptions(int argc, char** argv) {
-  static const option kOptions[] = {{"from", required_argument, nullptr, 'f'},
-                                    {"to", required_argument, nullptr, 't'},
-                                    {"output", required_argument, nullptr, 'o'},
-                                    {"report", no_argument, nullptr, 'r'},
-                                    {"help", no_argument, nullptr, 'h'},
-                                    {nullptr, 0, nullptr, 0}};
+  static const option kOptions[] = {
+      {"from", required_argument, nullptr, 'f'},   {"to", required_argument, nullptr, 't'},
+      {"output", required_argument, nullptr, 'o'}, {"report", no_argument, nullptr, 'r'},
+      {"help", no_argument, nullptr, 'h'},         {nullptr, 0, nullptr, 0}};
   Options options;
   for (int c; (c = getopt_long(argc, argv, "f:t:o:rh", kOptions, nullptr)) != -1;) {
     switch (c) {
@@ -322,7 +320,9 @@ string8 Report(const Options& options, const string8& bytes, const string16& tex
   os << "ASCII code points     ";
   os.width(12);
   os.precision(4);
-  os.put(s.codePoints == 0 ? 0.0 : 100.0 * static_cast<double>(s.asciiCodePoints) / static_cast<double>(s.codePoints));
+  os.put(s.codePoints == 0
+             ? 0.0
+             : 100.0 * static_cast<double>(s.asciiCodePoints) / static_cast<double>(s.codePoints));
   os << " %";
   os.endl();
   const Encoding way = options.from == Encoding::kAscii ? Encoding::kUtf8 : options.from;

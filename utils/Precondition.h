@@ -1,8 +1,9 @@
 /// @file
 /// The precondition assertion: a bad argument stops the process, in every build.
 ///
-/// Unlike `assert` it doesn't look at NDEBUG, neither the library's nor the program's: a check that is inlined
-/// into an optimised program must not disappear there. The report is that of the C library's own `assert`.
+/// Unlike `assert` it doesn't look at NDEBUG, neither the library's nor the program's: a check that is
+/// inlined into an optimised program must not disappear there. The report is that of the C library's own
+/// `assert`.
 
 #pragma once
 
@@ -40,4 +41,5 @@ constexpr bool IsSubrange(ssize_t i, ssize_t n, ssize_t size) {
 /// Asserts that the n elements from index i on lie within size, for every pair of values.
 /// For (ri, rn, r.size()) the text is "0 <= ri && 0 <= rn && ri+rn <= r.size()".
 #define MIREL_ASSERT_SUBRANGE(i, n, size)                                                                    \
-  MIREL_ASSERT_AS(::mirel::detail::IsSubrange(i, n, size), "0 <= " #i " && 0 <= " #n " && " #i "+" #n " <= " #size)
+  MIREL_ASSERT_AS(::mirel::detail::IsSubrange(i, n, size),                                                   \
+                  "0 <= " #i " && 0 <= " #n " && " #i "+" #n " <= " #size)

@@ -158,11 +158,11 @@ template <class It1, class It2> It1 FindLastNotOf(It1 x1, It1 x2, It2 y1, It2 y2
 /// Parameters: `i` is an offset or an iterator, `n` a number of bytes from there, `i1`/`i2` and `r1`/`r2` the
 /// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a repeat count.
 ///
-/// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments stop
-/// the process with the text after "@pre". Memory that can't be had is std::bad_alloc, thrown before anything
-/// has changed. Whatever may grow the buffer may move its storage and so invalidates pointers into it; erasing
-/// keeps the storage and moves down the bytes behind. A run of edits costs amortised constant time per byte
-/// added, plus the bytes that it moves.
+/// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments
+/// stop the process with the text after "@pre". Memory that can't be had is std::bad_alloc, thrown before
+/// anything has changed. Whatever may grow the buffer may move its storage and so invalidates pointers into
+/// it; erasing keeps the storage and moves down the bytes behind. A run of edits costs amortised constant
+/// time per byte added, plus the bytes that it moves.
 class MIREL_API VectorOfByte {
 public:
   typedef uint8 value_type;
@@ -178,8 +178,7 @@ public:
   /// count bytes of value x. @pre "0 <= count"
   explicit VectorOfByte(ssize_t count, value_type x);
   template <class N, class X, detail::IfIntegers<N, X> = 0>
-  explicit VectorOfByte(N count, X x)
-      : VectorOfByte(ssize_t(count), value_type(x)) {}
+  explicit VectorOfByte(N count, X x) : VectorOfByte(ssize_t(count), value_type(x)) {}
   VectorOfByte(std::initializer_list<uint8> r);
   VectorOfByte(const VectorOfByte& r);
   ~VectorOfByte();
@@ -298,8 +297,7 @@ public:
   iterator insert(iterator i, value_type x);
 
   /// Integers of any type: the offset forms above.
-  template <class N, detail::IfIntegers<N> = 0>
-  void insert(N i, const value_type* r1, const value_type* r2) {
+  template <class N, detail::IfIntegers<N> = 0> void insert(N i, const value_type* r1, const value_type* r2) {
     insert(ssize_t(i), r1, r2);
   }
   template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
@@ -351,8 +349,8 @@ public:
   /// @}
 
   mutable value_type* m_buffer; ///< The storage, or null while there is none.
-  ssize_t size_;                ///< Bytes in use, 0 <= size_ <= m_capacity; the rest is spare and may be written.
-  mutable ssize_t m_capacity;   ///< Bytes of storage.
+  ssize_t size_; ///< Bytes in use, 0 <= size_ <= m_capacity; the rest is spare and may be written.
+  mutable ssize_t m_capacity; ///< Bytes of storage.
 };
 
 } // namespace mirel

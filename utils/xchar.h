@@ -7,7 +7,8 @@
 
 namespace mirel {
 
-/// A UTF-8 code unit, or a byte of ASCII text. Whether plain char is signed makes no difference to any result.
+/// A UTF-8 code unit, or a byte of ASCII text. Whether plain char is signed makes no difference to any
+/// result.
 typedef char char8;
 
 /// A UTF-16 code unit in the machine's own byte order; the same type as uint16, not `char16_t`.

@@ -1,8 +1,8 @@
 /// @file
 /// xostream, the formatted text output stream.
 ///
-/// It formats as the standard library's streams do, in the classic locale, and hands every byte to its sink at
-/// once. It knows no containers: strings write themselves to it.
+/// It formats as the standard library's streams do, in the classic locale, and hands every byte to its sink
+/// at once. It knows no containers: strings write themselves to it.
 
 #pragma once
 
@@ -33,7 +33,8 @@ public:
 
   /// @}
   /// @name Writing bytes as they are
-  /// Zeros included; width and precision don't matter, the indent does. A null pointer may come with a count of 0.
+  /// Zeros included; width and precision don't matter, the indent does. A null pointer may come with a count
+  /// of 0.
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   /// @{
 
@@ -93,7 +94,8 @@ public:
   streamsize precision(streamsize x);
   streamsize width() const;
   streamsize width(streamsize x);
-  /// Sets the number of spaces that are put after each newline, before whatever comes next. @pre "0 <= indent"
+  /// Sets the number of spaces that are put after each newline, before whatever comes next. @pre "0 <=
+  /// indent"
   void Indent(ssize_t indent);
   ssize_t GetIndent() const;
 

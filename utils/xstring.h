@@ -1,5 +1,6 @@
 /// @file
-/// string8 and string16, their zero-terminated interface, and the conversions between UTF-8, UTF-16 and ASCII.
+/// string8 and string16, their zero-terminated interface, and the conversions between UTF-8, UTF-16 and
+/// ASCII.
 ///
 /// The string knows zero termination and nothing else: it measures a zero-terminated argument once and hands
 /// the run to the vector. It has no storage and no invariant of its own.
@@ -29,8 +30,8 @@ inline ssize_t GetStringLength(const char16* s) {
 /// next change may overwrite it. All that xvector offers is offered here too, and what is said there of bad
 /// arguments, memory, invalidation and aliasing holds.
 ///
-/// A zero-terminated argument (`const T*` without a count) must not be null, and ends before its first zero; it
-/// is measured once, before anything is checked or changed, and then treated as a pointer and count.
+/// A zero-terminated argument (`const T*` without a count) must not be null, and ends before its first zero;
+/// it is measured once, before anything is checked or changed, and then treated as a pointer and count.
 template <class T> class MIREL_API basic_xstring : public xvector<T> {
   typedef xvector<T> Base;
 
@@ -81,10 +82,10 @@ public:
 
   /// The contents with a zero unit behind them, which is not part of the string.
   ///
-  /// It counts as a change, though it is const: it may move the storage, and no other thread may use the string
-  /// meanwhile. It does move it where there is no spare unit, and then makes room for more than one, so that
-  /// appends and c_str() in turn take amortised constant time. The result is valid until the next change; a
-  /// second call without one gives the same pointer.
+  /// It counts as a change, though it is const: it may move the storage, and no other thread may use the
+  /// string meanwhile. It does move it where there is no spare unit, and then makes room for more than one,
+  /// so that appends and c_str() in turn take amortised constant time. The result is valid until the next
+  /// change; a second call without one gives the same pointer.
   /// @pre "p": never null after room was made
   const T* c_str() const {
     const ssize_t n = this->size();
@@ -195,6 +196,9 @@ public:
   /// @}
 };
 
+/// Exchanges the contents of two strings in constant time.
+template <class T> void swap(basic_xstring<T>& a, basic_xstring<T>& b) noexcept { a.swap(b); }
+
 typedef basic_xstring<char8> string8;
 typedef basic_xstring<char16> string16;
 typedef basic_xstring<char> xstring;
@@ -205,16 +209,17 @@ extern template class xvector<char16>;
 extern template class basic_xstring<char16>;
 
 /// @name Conversions
-/// Replace the contents of the destination with those of the run of srcLen units at src, in one pass. UTF-16 is
-/// in the machine's own byte order; a byte order mark is a code point like any other, and so is a zero. What is
-/// well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for UTF-16. Memory that
-/// can't be had is std::bad_alloc and leaves the destination partly filled.
+/// Replace the contents of the destination with those of the run of srcLen units at src, in one pass. UTF-16
+/// is in the machine's own byte order; a byte order mark is a code point like any other, and so is a zero.
+/// What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for UTF-16.
+/// Memory that can't be had is std::bad_alloc and leaves the destination partly filled.
 /// @{
 
 /// One unit for each byte: its value, or "?" for bytes from 0x80 on. @pre "newSize >= 0", of srcLen
 MIREL_API void Utf16FromAscii(string16& dst, const char8* src, ssize_t srcLen);
 
-/// @return false where the source is malformed or cut off; then what precedes the bad sequence has been converted
+/// @return false where the source is malformed or cut off; then what precedes the bad sequence has been
+/// converted
 /// @pre "srcLen >= 0"
 MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src, ssize_t srcLen);
 /// The same for a zero-terminated run. @pre "src"
@@ -222,7 +227,8 @@ MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src);
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src, ssize_t srcLen);
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src);
 
-/// What the four above do, for generic code: (char16, char8) is UTF-8 to UTF-16, (char8, char16) the way back.
+/// What the four above do, for generic code: (char16, char8) is UTF-8 to UTF-16, (char8, char16) the way
+/// back.
 template <class CharOut, class CharIn>
 bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen);
 extern template MIREL_API bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);

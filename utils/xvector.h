@@ -54,7 +54,9 @@ template <class T, class It> void p_copy(T* dst, It src1, It src2) {
   for (; src1 != src2; ++src1, ++dst)
     *dst = *src1;
 }
-inline void p_copy(char8* dst, const char8* src1, const char8* src2) { memcpy_p_copy<char8>(dst, src1, src2); }
+inline void p_copy(char8* dst, const char8* src1, const char8* src2) {
+  memcpy_p_copy<char8>(dst, src1, src2);
+}
 inline void p_copy(char16* dst, const char16* src1, const char16* src2) {
   memcpy_p_copy<char16>(dst, src1, src2);
 }
@@ -70,7 +72,8 @@ namespace detail {
 /// Lets a template take part in overload resolution only for iterators, never for numbers.
 template <class It>
 using IfIterator = std::enable_if_t<
-    std::is_convertible_v<typename std::iterator_traits<It>::iterator_category, std::input_iterator_tag>, int>;
+    std::is_convertible_v<typename std::iterator_traits<It>::iterator_category, std::input_iterator_tag>,
+    int>;
 
 /// Lets a template take part only for (pointer, integer), where a literal 0 counts as an integer.
 template <class P, class Ptr, class N>
@@ -80,10 +83,11 @@ using IfPointerAndCount = std::enable_if_t<std::is_convertible_v<P, Ptr> && std:
 
 /// A growable array of code units (char8 or char16) with the operations of a string.
 ///
-/// Parameters, throughout: `i` an index or iterator, `n` a number of elements from there; `i1`/`i2` the ends of
-/// a half-open range of this vector; `r` another vector, `ri`/`rn` a sub-range of it; `p`/`pn` a pointer and a
-/// number of elements; `r1`/`r2` a half-open range elsewhere; `x` an element; `c` an element that is looked for;
-/// `offset` where a search starts; `count` a repeat, fill or substring length. All are in elements, and signed.
+/// Parameters, throughout: `i` an index or iterator, `n` a number of elements from there; `i1`/`i2` the ends
+/// of a half-open range of this vector; `r` another vector, `ri`/`rn` a sub-range of it; `p`/`pn` a pointer
+/// and a number of elements; `r1`/`r2` a half-open range elsewhere; `x` an element; `c` an element that is
+/// looked for; `offset` where a search starts; `count` a repeat, fill or substring length. All are in
+/// elements, and signed.
 ///
 /// @par Bad arguments
 /// stop the process with the text given after "@pre", before anything has changed. They are never clamped. A
@@ -100,8 +104,8 @@ using IfPointerAndCount = std::enable_if_t<std::is_convertible_v<P, Ptr> && std:
 /// @par Threads
 /// Different threads may use different vectors, and may read one vector that no thread changes.
 ///
-/// A literal 0 is an index, a count or an element, never a pointer: that is what the overloads for integers of
-/// any type are for, which do what the overload above them does.
+/// A literal 0 is an index, a count or an element, never a pointer: that is what the overloads for integers
+/// of any type are for, which do what the overload above them does.
 template <class T> class MIREL_API xvector {
 public:
   /// @name Types
@@ -304,7 +308,8 @@ public:
   /// Replaces the whole contents; keeps the storage where it is large enough.
   /// @{
 
-  /// The elements of [r1, r2). Pointers are copied from directly, other iterators through a vector in between.
+  /// The elements of [r1, r2). Pointers are copied from directly, other iterators through a vector in
+  /// between.
   /// @pre "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> void assign(It r1, It r2) {
     MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
@@ -421,7 +426,8 @@ public:
 
   /// @}
   /// @name Inserting
-  /// Inserts before index or iterator i. @pre "0 <= i && i <= size()" of every overload, after those on r and p
+  /// Inserts before index or iterator i. @pre "0 <= i && i <= size()" of every overload, after those on r and
+  /// p
   /// @{
 
   /// The elements of [r1, r2), which may be any iterators as in assign(). @pre "r1 <= r2", last
@@ -478,8 +484,8 @@ public:
 
   /// @}
   /// @name Replacing
-  /// Replaces the n elements from index i on, or those of [i1, i2). @pre "0 <= i && 0 <= n && i+n <= size()" or
-  /// "begin() <= i1 && i1 <= i2 && i2 <= end()", then those on what is put there
+  /// Replaces the n elements from index i on, or those of [i1, i2). @pre "0 <= i && 0 <= n && i+n <= size()"
+  /// or "begin() <= i1 && i1 <= i2 && i2 <= end()", then those on what is put there
   /// @{
 
   void replace(ssize_t i, ssize_t n, const xvector<T>& r) {
@@ -501,8 +507,7 @@ public:
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     ReplaceRun(i, n, p, pn);
   }
-  template <class N, class M, detail::IfIntegers<N, M> = 0>
-  void replace(N i, M n, const T* p, ssize_t pn) {
+  template <class N, class M, detail::IfIntegers<N, M> = 0> void replace(N i, M n, const T* p, ssize_t pn) {
     replace(ssize_t(i), ssize_t(n), p, pn);
   }
   /// count elements equal to x. @pre "0 <= count"
@@ -513,8 +518,7 @@ public:
   }
   template <class N, class M, class K, class X, detail::IfIntegers<N, M, K, X> = 0>
   void replace(N i, M n, K count, X x) {
-    replace(ssize_t(i), ssize_t(n), ssize_t(count),
-            T(x));
+    replace(ssize_t(i), ssize_t(n), ssize_t(count), T(x));
   }
   void replace(iterator i1, iterator i2, const xvector<T>& r) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
@@ -584,8 +588,9 @@ public:
 
   /// @}
   /// @name Comparison
-  /// By the first differing element as an unsigned value; of a vector and its proper prefix, the prefix is first.
-  /// compare() is negative, 0 or positive: for char8 a difference is the value of memcmp, otherwise -1, 0 or 1.
+  /// By the first differing element as an unsigned value; of a vector and its proper prefix, the prefix is
+  /// first. compare() is negative, 0 or positive: for char8 a difference is the value of memcmp, otherwise
+  /// -1, 0 or 1.
   /// @{
 
   int compare(const xvector<T>& r) const {
@@ -596,7 +601,8 @@ public:
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return LexicographicalCompareX(begin(), end(), p, p + pn);
   }
-  /// The n elements from index i on. @pre "0 <= i && 0 <= n && i+n <= size()", here and below, before the others
+  /// The n elements from index i on. @pre "0 <= i && 0 <= n && i+n <= size()", here and below, before the
+  /// others
   int compare(ssize_t i, ssize_t n, const xvector<T>& r) const {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     return LexicographicalCompareX(begin() + i, begin() + i + n, r.begin(), r.end());
@@ -660,7 +666,9 @@ public:
     return Index(FindLast(begin(), After(offset), c), After(offset));
   }
   template <class It, detail::IfIterator<It> = 0> ssize_t rfind(It r1, It r2, ssize_t offset = npos) const;
-  ssize_t rfind(const xvector<T>& r, ssize_t offset = npos) const { return rfind(r.begin(), r.end(), offset); }
+  ssize_t rfind(const xvector<T>& r, ssize_t offset = npos) const {
+    return rfind(r.begin(), r.end(), offset);
+  }
   ssize_t rfind(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return rfind(p, p + pn, offset);
@@ -807,7 +815,11 @@ private:
   VectorOfByte m_buffer;
 };
 
-/// Makes room for newN elements in the place of the n at index i, and returns it; the caller overwrites it all.
+/// Exchanges the contents of two vectors in constant time.
+template <class T> void swap(xvector<T>& a, xvector<T>& b) noexcept { a.swap(b); }
+
+/// Makes room for newN elements in the place of the n at index i, and returns it; the caller overwrites it
+/// all.
 ///
 ///     |  before  |      n      |      behind      |
 ///     |  before  |         newN         |      behind      |
@@ -830,7 +842,8 @@ template <class T> void xvector<T>::ReplaceRun(ssize_t i, ssize_t n, const T* p,
   p_copy(run, p, p + pn);
 }
 
-/// Puts count elements of value x in the place of the n at index i. x is passed by value: it may be one of them.
+/// Puts count elements of value x in the place of the n at index i. x is passed by value: it may be one of
+/// them.
 template <class T> void xvector<T>::FillRun(ssize_t i, ssize_t n, ssize_t count, T x) {
   T* const run = ResizeRun(i, n, count);
   p_create(run, run + count, x);

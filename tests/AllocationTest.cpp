@@ -1,0 +1,155 @@
+#include "Support.h"
+
+#include <cstdlib>
+#include <functional>
+#include <limits>
+#include <new>
+#include <vector>
+
+namespace allocation {
+long count = 0;
+long failAfter = -1;
+} // namespace allocation
+
+extern "C" void* __real_realloc(void* p, std::size_t n);
+extern "C" void* __wrap_realloc(void* p, std::size_t n) {
+  ++allocation::count;
+  if (allocation::failAfter == 0 || n > PTRDIFF_MAX)
+    return nullptr;
+  if (allocation::failAfter > 0)
+    --allocation::failAfter;
+  return __real_realloc(p, n);
+}
+
+namespace {
+
+template <class T> class Allocation : public testing::Test {};
+TYPED_TEST_SUITE(Allocation, CodeUnits);
+
+TYPED_TEST(Allocation, GrowthIsGeometric) {
+  using S = basic_xstring<TypeParam>;
+  const S run = Of<TypeParam>("seventeen units..");
+  const std::vector<std::function<void(S&)>> edits = {
+      [](S& s) { s.push_back('x'); },
+      [](S& s) { s.append(1, 'x'); },
+      [](S& s) { s.resize(s.size() + 1, 'x'); },
+      [&](S& s) { s += run; },
+      [](S& s) { s.push_back('x'), s.c_str(); },
+      [](S& s) { s.append(1, 'x'), s.c_str(); },
+      [&](S& s) { s += run, s.c_str(); },
+  };
+  for (const auto& edit : edits) {
+    S s;
+    EXPECT_LT(allocation::Count([&] {
+                for (int i = 0; i < 100000; ++i)
+                  edit(s);
+              }),
+              40);
+  }
+  S s;
+  EXPECT_LT(allocation::Count([&] {
+              for (int i = 0; i < 2000; ++i)
+                s.insert(s.size() / 2, 'x'), s.push_front('y');
+            }),
+            20);
+}
+
+TYPED_TEST(Allocation, CapacityFollowsTheStatedRules) {
+  using S = basic_xstring<TypeParam>;
+  S s;
+  for (const ssize_t capacity : {1, 3, 3, 7, 7, 7, 7, 15}) {
+    s.push_back('x');
+    EXPECT_EQ(s.capacity(), capacity);
+  }
+  const TypeParam* const data = s.data();
+  s.reserve(15);
+  EXPECT_EQ(s.data(), data);
+  s.reserve(16);
+  EXPECT_EQ(s.capacity(), 16);
+  EXPECT_EQ(S(s, 0, 5).capacity(), 5);
+  EXPECT_EQ(s.substr(1, 6).capacity(), 6);
+  s.assign(9, 'a'), s.erase(0, 8), s.resize(0, 'a'), s.clear();
+  EXPECT_EQ(s.capacity(), 16);
+  EXPECT_EQ(allocation::Count([&] { s + s, s + 'x'; }), 1) << "an empty sum takes none";
+}
+
+TYPED_TEST(Allocation, NoneWhereThereIsRoomAndNothingAliases) {
+  using S = basic_xstring<TypeParam>;
+  S s = Of<TypeParam>("abcdef");
+  s.reserve(40);
+  const S r = Of<TypeParam>("xyz");
+  EXPECT_EQ(allocation::Count([&] {
+              s.append(r), s.insert(2, r.data(), 3), s.replace(1, 2, r, 1, 1),
+                  s.push_back(r.begin(), r.end());
+              s.assign(r), s = r, s.insert(0, 3, s[0]), s.push_front(s.back()), s += s[1], s.c_str(),
+                           s.pop_back();
+              s.FindAndErase(s[0]), s.find(r), s.rfind(r), s.compare(r), s._Eq(r);
+            }),
+            0);
+}
+
+TYPED_TEST(Allocation, AFailureChangesNothing) {
+  using S = basic_xstring<TypeParam>;
+  const S r = Of<TypeParam>("0123456789");
+  constexpr ssize_t kMax = std::numeric_limits<ssize_t>::max();
+  const std::vector<std::function<void(S&)>> edits = {
+      [](S& s) { s.reserve(100); },
+      [](S& s) { s.resize(100, 'x'); },
+      [](S& s) { s.c_str(); },
+      [](S& s) { s.push_back('x'); },
+      [](S& s) { s.push_front('x'); },
+      [](S& s) { s.insert(1, 5, 'x'); },
+      [](S& s) { s.assign(100, 'x'); },
+      [&](S& s) { s.assign(r); },
+      [&](S& s) { s = r; },
+      [&](S& s) { s += r; },
+      [](S& s) { s += s; },
+      [](S& s) { s.assign(s, 1, 2); },
+      [&](S& s) { s.replace(1, 2, r); },
+      [](S& s) { s.replace(0, 3, s.data() + 1, 2); },
+      [](S& s) { s.replace(s.begin(), s.begin() + 1, 9, 'x'); },
+      [](S& s) { s.assign(s.rbegin(), s.rend()); },
+      [](S& s) { s.insert(1, s.begin(), s.end()); },
+      [](S& s) { s *= 3; },
+      [](S& s) { s + s; },
+      [](S& s) { s.substr(); },
+      // What no machine can have.
+      [](S& s) { s.reserve(kMax); },
+      [](S& s) { s.resize(kMax, 'x'); },
+      [](S& s) { s.append(kMax, 'x'); },
+      [](S& s) { s.append(kMax - 2, 'x'); },
+      [](S& s) { s.insert(0, kMax / 2 + 1, 'x'); },
+      [](S& s) { s.assign(kMax, 'x'); },
+      [](S& s) { s *= kMax; },
+      [](S& s) { s *= kMax / 3 + 1; },
+      [](S& s) { s.append(s.data(), kMax); },
+  };
+  for (std::size_t i = 0; i < edits.size(); ++i) {
+    int failures = 0;
+    for (long failAfter = 0;; ++failAfter) {
+      S s(r, 0, 3);
+      const auto contents = Std(s);
+      const TypeParam* const data = s.data();
+      allocation::failAfter = failAfter;
+      try {
+        edits[i](s);
+        allocation::failAfter = -1;
+        break;
+      } catch (const std::bad_alloc&) {
+        allocation::failAfter = -1;
+        ++failures;
+        ASSERT_EQ(Std(s), contents) << i;
+        ASSERT_EQ(s.data(), data) << i;
+        ASSERT_EQ(s.capacity(), 3) << i;
+      }
+      if (failures > 4)
+        break; // it never succeeds
+    }
+    EXPECT_GT(failures, 0) << i;
+  }
+  S empty;
+  empty *= kMax;
+  EXPECT_EQ(empty.capacity(), 0);
+}
+
+} // namespace

@@ -1,0 +1,45 @@
+// What the tests share: strings of either width from literals, and allocations that are counted or refused.
+
+#pragma once
+
+#include <string>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <utils/xstring.h>
+
+using mirel::basic_xstring;
+using mirel::char16;
+using mirel::char8;
+using mirel::ssize_t;
+using mirel::xvector;
+
+constexpr ssize_t kNpos = -1;
+
+/// The units of text, one for each byte.
+template <class T> basic_xstring<T> Of(const std::string& text) {
+  basic_xstring<T> result;
+  for (const char c : text)
+    result.push_back(static_cast<T>(static_cast<unsigned char>(c)));
+  return result;
+}
+
+template <class T> std::basic_string<T> Std(const xvector<T>& v) { return {v.begin(), v.end()}; }
+
+/// Every test of a template runs for both widths.
+using CodeUnits = testing::Types<char8, char16>;
+
+namespace allocation {
+
+extern long count;     ///< how many allocations there were
+extern long failAfter; ///< how many of the next ones succeed before one fails; -1 for all
+
+/// Allocations that an action takes.
+template <class F> long Count(const F& action) {
+  const long before = count;
+  action();
+  return count - before;
+}
+
+} // namespace allocation

@@ -1,0 +1,88 @@
+#include "Support.h"
+
+#include <list>
+
+#include <utils/VectorOfByte.h>
+
+using namespace mirel;
+
+namespace {
+
+template <class T> class RangeAlgorithms : public testing::Test {};
+TYPED_TEST_SUITE(RangeAlgorithms, CodeUnits);
+
+TYPED_TEST(RangeAlgorithms, OrderUnitsAsUnsigned) {
+  const TypeParam low[] = {1, 0x7F};
+  TypeParam high[] = {1, static_cast<TypeParam>(0x80)}; // through non-const pointers, the template
+  const TypeParam* const constHigh = high;
+  EXPECT_LT(LexicographicalCompareX(low, low + 2, constHigh, constHigh + 2), 0);
+  EXPECT_GT(LexicographicalCompareX(high, high + 2, low, low + 2), 0);
+  EXPECT_EQ(LexicographicalCompareX(high, high + 1, low, low + 2), -1);
+  EXPECT_EQ(LexicographicalCompareX(low, low + 2, low, low + 1), 1);
+  const TypeParam* const null = nullptr;
+  EXPECT_EQ(LexicographicalCompareX(null, null, null, null), 0);
+  EXPECT_EQ(LexicographicalCompareX(null, null, low, low + 1), -1);
+  EXPECT_TRUE(IsEqual(null, null, null) && IsEqual(low, low + 1, constHigh) &&
+              !IsEqual(low, low + 2, constHigh));
+}
+
+TEST(RangeAlgorithms16, CompareValuesNotBytes) {
+  const uint16 a[] = {0x0100}, b[] = {0x00FF};
+  EXPECT_EQ(LexicographicalCompareX(a, a + 1, b, b + 1), 1);
+  const uint16 text[] = {0x4100, 0x0041};
+  EXPECT_EQ(Find(text, text + 2, 0x41), text + 1);
+}
+
+TYPED_TEST(RangeAlgorithms, FailedSearchesReturnTheEnd) {
+  const auto text = Of<TypeParam>("abcbc"), bc = Of<TypeParam>("bc");
+  const TypeParam *const x1 = text.begin(), *const x2 = text.end(), *const y1 = bc.begin(),
+                         *const y2 = bc.end();
+  EXPECT_EQ(FindFirstSubSequence(x1, x2, y1, y2), x1 + 1);
+  EXPECT_EQ(FindFirstSubSequence(x1, x1 + 2, y1, y2), x1 + 2);
+  EXPECT_EQ(FindFirstSubSequence(x1, x2, y1, y1), x1);
+  EXPECT_EQ(FindLastSubSequence(x1, x2, y1, y2), x1 + 3);
+  EXPECT_EQ(FindLastSubSequence(x1, x1 + 2, y1, y2), x1 + 2);
+  EXPECT_EQ(FindLast(x1, x1 + 1, 'b'), x1 + 1);
+  EXPECT_EQ(FindLastNotOf(x1, x2, y1, y2), x1);
+  EXPECT_EQ(FindFirstNotOf(y1, y2, y1, y2), y2);
+  EXPECT_EQ(FindFirstOf(x1, x2, y1, y1), x2);
+  EXPECT_TRUE(IsPrefix(x2, x2, y1, y1) && IsPrefix(x1 + 1, x2, y1, y2) && !IsPrefix(x1 + 4, x2, y1, y2));
+  const std::list<TypeParam> list(x1, x2); // forward traversal is enough
+  EXPECT_EQ(std::distance(list.begin(), FindFirstSubSequence(list.begin(), list.end(), y1, y2)), 1);
+}
+
+TEST(VectorOfByteTest, EditsAtAnyPlace) {
+  VectorOfByte b;
+  b.insertbytes(0, 2);
+  b[0] = 1, b[1] = 2;
+  b.insert(1, 3), b.insert(0, 2, 9), b.insert(b.end(), 7), b.push_back(uint8(8)),
+      b.push_back(b.begin(), b.end());
+  EXPECT_EQ(b, (VectorOfByte{9, 9, 1, 3, 2, 7, 8, 9, 9, 1, 3, 2, 7, 8}));
+  b.erase(0, 2), b.move(0, 1, 3), b.erase(b.begin() + 4, b.end()), b.erase_element(0);
+  EXPECT_EQ(b, (VectorOfByte{2, 7, 7}));
+  EXPECT_EQ(*b.insert(b.begin() + 1, 5), 5);
+  EXPECT_EQ(*b.erase(b.begin()), 5);
+  b.insert(1, b.begin(), b.end()), b += b;
+  EXPECT_EQ(b, (VectorOfByte{5, 5, 7, 7, 7, 7, 5, 5, 7, 7, 7, 7}));
+  b.assign(b.begin() + 1, b.begin() + 3), b.insert(b.begin(), 2, b.front()),
+      b.insert(0, b.data(), b.data_end());
+  EXPECT_EQ(b, (VectorOfByte{5, 5, 5, 7, 5, 5, 5, 7}));
+  b.push_back<unsigned short>(0x0102);
+  const VectorOfByte c(b);
+  EXPECT_EQ(c.size(), 10);
+  EXPECT_EQ(c.front() + c.back() + c[9], 5 + 2 * c[9]);
+  EXPECT_TRUE(b.owns(b.data()) && !b.owns(&b) && !VectorOfByte().owns(nullptr));
+}
+
+TEST(VectorOfByteTest, ComparesBytes) {
+  const VectorOfByte a{1, 2}, b{1, 200}, c;
+  EXPECT_TRUE(a < b && a <= b && b > a && b >= a && a != b && !(a == b) && c < a && a >= a && a <= a);
+  EXPECT_EQ(a.compare(0, 1, b, 0, 1) + a.compare(1, 0, c) + a.compare(2, 0, nullptr, 0), 0);
+  EXPECT_EQ(VectorOfByte(3, 7), (VectorOfByte{7, 7, 7}));
+  VectorOfByte d(a.begin(), a.end());
+  d = d;
+  d.swap(const_cast<VectorOfByte&>(static_cast<const VectorOfByte&>(VectorOfByte())));
+  EXPECT_TRUE(d.empty() && d.data() == nullptr);
+}
+
+} // namespace

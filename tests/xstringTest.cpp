@@ -1,0 +1,54 @@
+#include "Support.h"
+
+using namespace mirel;
+
+namespace {
+
+template <class T> class XString : public testing::Test {};
+TYPED_TEST_SUITE(XString, CodeUnits);
+
+TYPED_TEST(XString, CStrWritesBehindTheContents) {
+  using S = basic_xstring<TypeParam>;
+  const S empty;
+  EXPECT_EQ(*empty.c_str(), 0);
+  EXPECT_TRUE(empty.empty() && empty.capacity() >= 1);
+  S s = Of<TypeParam>("abc");
+  const TypeParam* const p = s.c_str();
+  EXPECT_TRUE(s.size() == 3 && p[3] == 0 && s.c_str() == p && GetStringLength(p) == 3);
+  s.push_back('d');
+  EXPECT_TRUE(s.c_str()[3] == 'd' && s.c_str()[4] == 0);
+  s.push_back(0), s.push_back('e');
+  EXPECT_TRUE(s.size() == 6 && GetStringLength(s.c_str()) == 4);
+}
+
+TYPED_TEST(XString, ZeroTerminatedArguments) {
+  using S = basic_xstring<TypeParam>;
+  const S text = Of<TypeParam>("abcabc"), bc = Of<TypeParam>("bc"), none;
+  const TypeParam* const z = bc.c_str();
+  S s = z;
+  EXPECT_TRUE(s._Eq(z) && s._Eq(bc) && !s._Lt(z) && s.compare(z) == 0 && s.compare(0, 1, z) < 0);
+  EXPECT_TRUE(none.compare(none.c_str()) == 0 && bc.compare(none.c_str()) > 0 && none._Lt(z));
+  (s = text.c_str()).append(z) += z;
+  s.insert(0, z).replace(2, 3, z).insert(s.size(), none.c_str());
+  EXPECT_EQ(Std(s), Std(Of<TypeParam>("bcbcabcbcbc")));
+  EXPECT_EQ(text.find(z), 1);
+  EXPECT_EQ(text.find(z, 2), 4);
+  EXPECT_EQ(text.find(none.c_str(), 6), 6);
+  EXPECT_EQ(text.rfind(z), 4);
+  EXPECT_EQ(text.rfind(z, 3), 1);
+  EXPECT_EQ(text.find_first_of(z, 3), 4);
+  EXPECT_EQ(text.find_first_not_of(z, 1), 3);
+  EXPECT_EQ(text.find_last_of(z), 5);
+  EXPECT_EQ(text.find_last_not_of(z, 2), 0);
+  EXPECT_EQ(Std(S(text, 1, 2)) + Std(text.substr(4, 2)) + Std(S(z, z + 1)), Std(Of<TypeParam>("bcbcb")));
+  s = text.c_str(), s = s.c_str() + 1, s.append(s.c_str() + 3), s.replace(0, 1, s.c_str() + 4); // itself
+  EXPECT_EQ(Std(s), Std(Of<TypeParam>("cbccabcbc")));
+  s.insert(1, s.c_str() + 6), s += s.c_str() + 9;
+  EXPECT_EQ(Std(s), Std(Of<TypeParam>("ccbcbccabcbccbc"))) << "as if copied first";
+  HackToForcexstringIntoUtilsDll();
+}
+
+} // namespace
+
+#include <sys/types.h>
+#include <unistd.h>
