@@ -55,7 +55,7 @@ inline int LexicographicalCompareX(const unsigned char* x1, const unsigned char*
   const ssize_t lenY = y2 - y1;
   const ssize_t len = lenX < lenY ? lenX : lenY;
   // Even for no bytes memcmp may not be given the null pointers of an empty range.
-  const int result = len == 0 ? 0 : std::memcmp(x1, y1, static_cast<std::size_t>(len));
+  const int result = len <= 0 ? 0 : std::memcmp(x1, y1, static_cast<std::size_t>(len));
   if (result != 0)
     return result;
   return lenX < lenY ? -1 : lenX > lenY;
