@@ -152,6 +152,35 @@ template <class It1, class It2> It1 FindLastNotOf(It1 x1, It1 x2, It2 y1, It2 y2
 }
 
 /// @}
+/// @name The same for code units
+/// Overload resolution prefers these for pointers to const code units. The results are those of the
+/// templates, which are what they do; they go through the text by blocks and are several times as fast.
+/// @{
+
+MIREL_API const char8* Find(const char8* i1, const char8* i2, const char8& v);
+MIREL_API const char16* Find(const char16* i1, const char16* i2, const char16& v);
+MIREL_API const char8* FindLast(const char8* i1, const char8* i2, const char8& v);
+MIREL_API const char16* FindLast(const char16* i1, const char16* i2, const char16& v);
+MIREL_API const char8* FindFirstSubSequence(const char8* x1, const char8* x2, const char8* y1,
+                                            const char8* y2);
+MIREL_API const char16* FindFirstSubSequence(const char16* x1, const char16* x2, const char16* y1,
+                                             const char16* y2);
+MIREL_API const char8* FindLastSubSequence(const char8* x1, const char8* x2, const char8* y1,
+                                           const char8* y2);
+MIREL_API const char16* FindLastSubSequence(const char16* x1, const char16* x2, const char16* y1,
+                                            const char16* y2);
+MIREL_API const char8* FindFirstOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2);
+MIREL_API const char16* FindFirstOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
+MIREL_API const char8* FindFirstNotOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2);
+MIREL_API const char16* FindFirstNotOf(const char16* x1, const char16* x2, const char16* y1,
+                                       const char16* y2);
+MIREL_API const char8* FindLastOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2);
+MIREL_API const char16* FindLastOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
+MIREL_API const char8* FindLastNotOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2);
+MIREL_API const char16* FindLastNotOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
+MIREL_API int LexicographicalCompareX(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
+
+/// @}
 
 /// An untyped, growable array of bytes: the storage of every vector and string.
 ///

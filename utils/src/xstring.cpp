@@ -1,6 +1,7 @@
 #include <utils/xstring.h>
 
-#include <iterator>
+#include <algorithm>
+#include <type_traits>
 
 #include <boost/locale/utf.hpp>
 
@@ -25,29 +26,198 @@ xostream& operator<<(xostream& os, const string8& v) {
 
 void Utf16FromAscii(string16& dst, const char8* src, ssize_t srcLen) {
   dst.resize(srcLen, 0);
-  char16* pdst = dst.data();
-  for (const char8* const pend = src + srcLen; src != pend; ++src) {
-    const unsigned char byte = static_cast<unsigned char>(*src);
-    *pdst++ = byte < 0x80 ? byte : '?';
+  char16* const pdst = dst.data();
+  for (ssize_t i = 0; i < srcLen; ++i) {
+    const unsigned char byte = static_cast<unsigned char>(src[i]);
+    pdst[i] = byte < 0x80 ? byte : '?';
   }
 }
 
+namespace {
+
+namespace utf = boost::locale::utf;
+
+/// So many units of input are converted on the stack before the result is appended in one go: an append of
+/// its own for each would ask for room and keep the size in memory every time.
+constexpr ssize_t kChunk = 1024;
+/// The most units of output for one of input.
+constexpr ssize_t kExpansion = 3;
+
+/// Units of ASCII that are converted at once: more than compilers unroll, so that they use wide instructions.
+constexpr ssize_t kBlock = 32;
+/// Units of ASCII that are converted one by one before that is tried.
+constexpr ssize_t kNear = 16;
+
+/// No step of a conversion needs to see more units than this to tell what stands at its start.
+constexpr ssize_t kLookahead = 4;
+
+template <class T> std::make_unsigned_t<T> Unit(T x) { return static_cast<std::make_unsigned_t<T>>(x); }
+
+/// Whether n units are ASCII; looks at all of them without leaving early.
+template <ssize_t n, class T> bool IsAscii(const T* p) {
+  constexpr uint64_t kNotAscii = sizeof(T) == 1 ? 0x8080808080808080 : 0xFF80FF80FF80FF80;
+  uint64_t words[std::size_t(n) * sizeof(T) / sizeof(uint64_t)];
+  std::memcpy(words, p, sizeof(words));
+  uint64_t bits = 0;
+  for (const uint64_t word : words)
+    bits |= word;
+  return (bits & kNotAscii) == 0;
+}
+
+/// Converts n units of ASCII. They are copied first, since for all the compiler knows bytes at p are those at
+/// out.
+template <ssize_t n, class CharOut, class CharIn> void CopyAscii(CharOut* out, const CharIn* p) {
+  CharIn units[std::size_t(n)];
+  std::memcpy(units, p, sizeof(units));
+  for (ssize_t k = 0; k < n; ++k)
+    out[k] = static_cast<CharOut>(units[k]);
+}
+
+/// How far a conversion got.
+template <class CharOut, class CharIn> struct Progress {
+  const CharIn* p;
+  CharOut* out;
+};
+
+/// Converts ASCII from p on, where some stands: a few units one by one, since most runs in most texts are
+/// short, then blocks.
+template <class CharOut, class CharIn>
+Progress<CharOut, CharIn> ConvertAscii(const CharIn* p, const CharIn* stop, CharOut* out) {
+  const CharIn* const near = stop - p < kNear ? stop : p + kNear;
+  do
+    *out++ = static_cast<CharOut>(*p++);
+  while (p != near && Unit(*p) < 0x80);
+  if (p == near)
+    for (; stop - p >= kBlock && IsAscii<kBlock>(p); p += kBlock, out += kBlock)
+      CopyAscii<kBlock>(out, p);
+  return {p, out};
+}
+
+/// The bits that the UTF-8 unit adds to a code point, or more than kTailBits if it can't follow another one.
+inline unsigned TailBits(char8 unit) { return Unit(unit) ^ 0x80u; }
+constexpr unsigned kTailBits = 0x3F;
+
+constexpr bool IsSurrogate(unsigned unit) { return (unit & 0xF800) == 0xD800; }
+
+/// Converts sequences of three bytes whose lead leaves nothing else to check: the bulk of most Asian text.
+Progress<char16, char8> ConvertTriples(const char8* p, const char8* stop, char16* out) {
+  for (; p < stop; p += 3) {
+    const unsigned a = Unit(p[0]), b = TailBits(p[1]), c = TailBits(p[2]);
+    if (a < 0xE1 || a > 0xEC || (b | c) > kTailBits)
+      break;
+    *out++ = static_cast<char16>((a & 0x0F) << 12 | b << 6 | c);
+  }
+  return {p, out};
+}
+
+// The next two convert what is plainly well-formed, until something else comes or stop is reached. There are
+// kLookahead units to be read from before stop on. They are not inlined: that leaves their variables in
+// registers, which in the caller have addresses that are taken.
+
+[[gnu::noinline]] Progress<char16, char8> ConvertPlain(const char8* p, const char8* stop, char16* out) {
+  while (p < stop) {
+    const unsigned a = Unit(p[0]);
+    if (a < 0x80) {
+      const auto ascii = ConvertAscii(p, stop, out);
+      p = ascii.p, out = ascii.out;
+    } else if (a < 0xE0) {
+      const unsigned b = TailBits(p[1]);
+      if (a < 0xC2 || b > kTailBits)
+        break;
+      *out++ = static_cast<char16>((a & 0x1F) << 6 | b);
+      p += 2;
+    } else if (a < 0xF0) {
+      const auto triples = ConvertTriples(p, stop, out);
+      if (triples.p == p) {
+        const unsigned b = TailBits(p[1]), c = TailBits(p[2]), unit = (a & 0x0F) << 12 | b << 6 | c;
+        if ((b | c) > kTailBits || unit < 0x800 || IsSurrogate(unit))
+          break;
+        *out++ = static_cast<char16>(unit);
+        p += 3;
+      } else {
+        p = triples.p, out = triples.out;
+      }
+    } else {
+      const unsigned b = TailBits(p[1]), c = TailBits(p[2]), d = TailBits(p[3]);
+      const unsigned codePoint = (a & 0x0F) << 18 | b << 12 | c << 6 | d;
+      if ((b | c | d) > kTailBits || codePoint < 0x10000 || codePoint > 0x10FFFF)
+        break;
+      *out++ = static_cast<char16>(0xD7C0 + (codePoint >> 10));
+      *out++ = static_cast<char16>(0xDC00 + (codePoint & 0x3FF));
+      p += 4;
+    }
+  }
+  return {p, out};
+}
+
+char8 Tail(unsigned bits) { return static_cast<char8>(0x80 | (bits & kTailBits)); }
+
+/// Writes a unit above 0x7FF that isn't a surrogate.
+char8* EncodeTriple(unsigned unit, char8* out) {
+  out[0] = static_cast<char8>(0xE0 | unit >> 12);
+  out[1] = Tail(unit >> 6);
+  out[2] = Tail(unit);
+  return out + 3;
+}
+
+[[gnu::noinline]] Progress<char8, char16> ConvertPlain(const char16* p, const char16* stop, char8* out) {
+  while (p < stop) {
+    const unsigned a = p[0];
+    if (a < 0x80) {
+      const auto ascii = ConvertAscii(p, stop, out);
+      p = ascii.p, out = ascii.out;
+    } else if (a < 0x800) {
+      out[0] = static_cast<char8>(0xC0 | a >> 6);
+      out[1] = Tail(a);
+      out += 2;
+      ++p;
+    } else if (!IsSurrogate(a)) {
+      out = EncodeTriple(a, out);
+      ++p;
+    } else {
+      const unsigned b = p[1];
+      if (a >= 0xDC00 || (b & 0xFC00) != 0xDC00)
+        break;
+      const unsigned codePoint = 0x10000 + ((a & 0x3FF) << 10) + (b & 0x3FF);
+      out[0] = static_cast<char8>(0xF0 | codePoint >> 18);
+      out[1] = Tail(codePoint >> 12);
+      out[2] = Tail(codePoint >> 6);
+      out[3] = Tail(codePoint);
+      out += 4;
+      p += 2;
+    }
+  }
+  return {p, out};
+}
+
+} // namespace
+
 template <class CharOut, class CharIn>
 bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen) {
-  namespace utf = boost::locale::utf;
   MIREL_ASSERT(srcLen >= 0);
-  const CharIn* begin = src;
   const CharIn* const end = src + srcLen;
   result.clear();
-  result.reserve(end - begin);
-  auto inserter = std::back_inserter(result);
-  while (begin != end) {
-    const utf::code_point c = utf::utf_traits<CharIn>::decode(begin, end);
-    if (c == utf::illegal || c == utf::incomplete)
-      return false;
-    inserter = utf::utf_traits<CharOut>::encode(c, inserter);
+  result.reserve(srcLen);
+  bool isWellFormed = true;
+  for (const CharIn* p = src; p != end && isWellFormed;) {
+    CharOut chunk[kExpansion * (kChunk + kLookahead)];
+    CharOut* out = chunk;
+    const CharIn* const chunkEnd = end - p < kChunk ? end : p + kChunk;
+    const CharIn* const stop = end - p < kLookahead ? p : std::min(chunkEnd, end - (kLookahead - 1));
+    while (p < chunkEnd && isWellFormed) {
+      const auto plain = ConvertPlain(p, stop, out);
+      p = plain.p, out = plain.out;
+      if (p >= chunkEnd)
+        break;
+      // The traits are the judges of everything else, and of the last few units.
+      const utf::code_point c = utf::utf_traits<CharIn>::decode(p, end);
+      isWellFormed = c != utf::illegal && c != utf::incomplete;
+      if (isWellFormed)
+        out = utf::utf_traits<CharOut>::encode(c, out);
+    }
+    result.append(chunk, out - chunk);
   }
-  return true;
+  return isWellFormed;
 }
 
 template bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);

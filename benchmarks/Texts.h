@@ -1,0 +1,65 @@
+// Sentences in eight kinds of text, from which the benchmarks make longer ones.
+
+#pragma once
+
+#include <random>
+#include <string>
+#include <vector>
+
+struct Language {
+  const char* name;
+  std::vector<std::string> sentences;
+};
+
+inline const std::vector<Language>& Languages() {
+  static const std::vector<Language> kLanguages = {
+      {"ASCII",
+       {"GET /index.html HTTP/1.1\r\n", "key = \"value\"; // 42\n", "2024-02-29T12:00:00Z INFO ready\n",
+        "for (i = 0; i < n; ++i) sum += a[i];\n", "{\"id\": 1017, \"tags\": [\"a\", \"b\"]}\n"}},
+      {"English",
+       {"The ferry leaves at seven, and nobody waits for those who are late. ",
+        "\u201CWe\u2019ll see,\u201D she said, and closed the window. ",
+        "After the storm the beach was covered with wood and weed. ",
+        "He bought a map of the island, a lamp and two loaves of bread. ",
+        "It rained all afternoon \u2013 not hard, but without a pause. "}},
+      {"German",
+       {"Die Fähre läuft um sieben Uhr früh aus dem Hafen. ",
+        "Über Nacht hat es geschneit, und die Straßen sind glatt. ",
+        "Möchten Sie noch etwas Käse oder lieber ein Stück Kuchen? ",
+        "Großmutter erzählt gern von den Jahren, in denen sie am Fluss lebte. ",
+        "Für morgen ist schönes Wetter angekündigt. "}},
+      {"French",
+       {"Le bac part à sept heures, et personne n’attend les retardataires. ",
+        "Après l’orage, la plage était couverte de bois et d’algues. ",
+        "Il a acheté une carte de l’île, une lampe et deux pains. ",
+        "Où êtes-vous allés l’été dernier ? Ça m’intéresse énormément. ",
+        "La fenêtre s’ouvrit, et le rideau se mit à trembler. "}},
+      {"Russian",
+       {"Паром уходит в семь часов, и опоздавших никто не ждёт. ",
+        "После бури берег был покрыт досками и водорослями. ",
+        "Он купил карту острова, лампу и две буханки хлеба. ",
+        "Весь день шёл дождь, несильный, но без перерыва. ",
+        "Бабушка любит рассказывать о годах у большой реки. "}},
+      {"Japanese",
+       {"フェリーは七時に出ます。遅れた人を待つことはありません。",
+        "嵐の後、浜辺は木と海草でおおわれていました。", "彼は島の地図とランプとパンを二つ買いました。",
+        "午後はずっと雨が降っていた。", "祖母は川のそばで暮らした年月をよく話します。"}},
+      {"Chinese",
+       {"渡轮七点开船,没有人会等迟到的人。", "暴风雨过后,海滩上到处是木头和海草。",
+        "他买了一张岛上的地图、一盏灯和两条面包。", "整个下午都在下雨,雨不大,但一直没有停。",
+        "奶奶喜欢讲她在河边生活的那些年。"}},
+      {"emoji",
+       {"See you at the port ⛵🌊🐟 ", "🎉🎉🎉 happy birthday 🥳🎂🕯️ ", "👍🏽 ok 😀😅 ",
+        "🏠➡️🚲➡️🌅 ", "👩‍🍳🥐☕😋 yes! "}},
+  };
+  return kLanguages;
+}
+
+/// Sentences of the language in random order, at least size bytes of them.
+inline std::string TextIn(const Language& language, std::size_t size) {
+  std::mt19937 random(11);
+  std::string text;
+  while (text.size() < size)
+    text += language.sentences[random() % language.sentences.size()];
+  return text;
+}
