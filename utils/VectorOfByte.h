@@ -152,33 +152,72 @@ template <class It1, class It2> It1 FindLastNotOf(It1 x1, It1 x2, It2 y1, It2 y2
 }
 
 /// @}
+
+namespace detail {
+
+/// The searches above, for code units and by blocks of them, which takes ranges that are longer than a few
+/// units.
+template <class T> struct MIREL_API ByBlock {
+  static const T* Find(const T* i1, const T* i2, T v);
+  static const T* FindLast(const T* i1, const T* i2, T v);
+  static const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2);
+  static const T* FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2);
+  static const T* FindFirstOf(const T* x1, const T* x2, const T* y1, const T* y2);
+  static const T* FindFirstNotOf(const T* x1, const T* x2, const T* y1, const T* y2);
+  static const T* FindLastOf(const T* x1, const T* x2, const T* y1, const T* y2);
+  static const T* FindLastNotOf(const T* x1, const T* x2, const T* y1, const T* y2);
+  static int Compare(const T* x1, const T* x2, const T* y1, const T* y2);
+};
+extern template struct ByBlock<char8>;
+extern template struct ByBlock<char16>;
+
+/// In so short a range the plain loops are done before a call to the others has begun.
+template <class T> bool IsShort(const T* x1, const T* x2) { return x2 - x1 <= 16; }
+
+template <class T>
+using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T, char16>, int>;
+
+} // namespace detail
+
 /// @name The same for code units
-/// Overload resolution prefers these for pointers to const code units. The results are those of the
-/// templates, which are what they do; they go through the text by blocks and are several times as fast.
+/// Overload resolution prefers these for pointers to const code units. The results are those of the templates
+/// above, found several times as fast in longer ranges.
 /// @{
 
-MIREL_API const char8* Find(const char8* i1, const char8* i2, const char8& v);
-MIREL_API const char16* Find(const char16* i1, const char16* i2, const char16& v);
-MIREL_API const char8* FindLast(const char8* i1, const char8* i2, const char8& v);
-MIREL_API const char16* FindLast(const char16* i1, const char16* i2, const char16& v);
-MIREL_API const char8* FindFirstSubSequence(const char8* x1, const char8* x2, const char8* y1,
-                                            const char8* y2);
-MIREL_API const char16* FindFirstSubSequence(const char16* x1, const char16* x2, const char16* y1,
-                                             const char16* y2);
-MIREL_API const char8* FindLastSubSequence(const char8* x1, const char8* x2, const char8* y1,
-                                           const char8* y2);
-MIREL_API const char16* FindLastSubSequence(const char16* x1, const char16* x2, const char16* y1,
-                                            const char16* y2);
-MIREL_API const char8* FindFirstOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2);
-MIREL_API const char16* FindFirstOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
-MIREL_API const char8* FindFirstNotOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2);
-MIREL_API const char16* FindFirstNotOf(const char16* x1, const char16* x2, const char16* y1,
-                                       const char16* y2);
-MIREL_API const char8* FindLastOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2);
-MIREL_API const char16* FindLastOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
-MIREL_API const char8* FindLastNotOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2);
-MIREL_API const char16* FindLastNotOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
-MIREL_API int LexicographicalCompareX(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
+template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T* i2, const T& v) {
+  return detail::ByBlock<T>::Find(i1, i2, v);
+}
+template <class T, detail::IfCodeUnit<T> = 0> const T* FindLast(const T* i1, const T* i2, const T& v) {
+  return detail::IsShort(i1, i2) ? FindLast<const T*, T>(i1, i2, v) : detail::ByBlock<T>::FindLast(i1, i2, v);
+}
+template <class T, detail::IfCodeUnit<T> = 0>
+const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return y1 == y2 ? x1 : detail::ByBlock<T>::FindFirstSubSequence(x1, x2, y1, y2);
+}
+template <class T, detail::IfCodeUnit<T> = 0>
+const T* FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return y1 == y2 ? x2 : detail::ByBlock<T>::FindLastSubSequence(x1, x2, y1, y2);
+}
+template <class T, detail::IfCodeUnit<T> = 0>
+const T* FindFirstOf(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return detail::ByBlock<T>::FindFirstOf(x1, x2, y1, y2);
+}
+template <class T, detail::IfCodeUnit<T> = 0>
+const T* FindFirstNotOf(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return detail::ByBlock<T>::FindFirstNotOf(x1, x2, y1, y2);
+}
+template <class T, detail::IfCodeUnit<T> = 0>
+const T* FindLastOf(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return detail::ByBlock<T>::FindLastOf(x1, x2, y1, y2);
+}
+template <class T, detail::IfCodeUnit<T> = 0>
+const T* FindLastNotOf(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return detail::ByBlock<T>::FindLastNotOf(x1, x2, y1, y2);
+}
+inline int LexicographicalCompareX(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
+  return detail::IsShort(x1, x2) ? LexicographicalCompareX<const char16*, const char16*>(x1, x2, y1, y2)
+                                 : detail::ByBlock<char16>::Compare(x1, x2, y1, y2);
+}
 
 /// @}
 
@@ -231,7 +270,12 @@ public:
   /// Makes the size n bytes; new bytes have no particular value. @pre "0 <= n"
   void resize(ssize_t n);
   /// Appends count bytes of no particular value. @pre "0 <= n"
-  void growbytes(ssize_t count) { insertbytes(size(), count); }
+  void growbytes(ssize_t count) {
+    if (0 <= count && count <= m_capacity - size_) // what insertbytes() comes to where there is room
+      size_ += count;
+    else
+      insertbytes(size(), count);
+  }
   /// Makes the size 0 and keeps the storage.
   void clear() noexcept;
 
@@ -297,7 +341,7 @@ public:
     const ssize_t n = size_ + ssize_t(sizeof(T));
     if (m_capacity < n)
       reserve(n + m_capacity);
-    std::memcpy(m_buffer + size_, &value, sizeof(T));
+    *reinterpret_cast<T*>(m_buffer + size_) = value;
     size_ = n;
   }
 

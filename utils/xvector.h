@@ -824,7 +824,9 @@ template <class T> void swap(xvector<T>& a, xvector<T>& b) noexcept { a.swap(b);
 ///     |  before  |      n      |      behind      |
 ///     |  before  |         newN         |      behind      |
 template <class T> T* xvector<T>::ResizeRun(ssize_t i, ssize_t n, ssize_t newN) {
-  if (newN > n)
+  if (i + n == size() && newN > n)
+    m_buffer.growbytes(Bytes(newN - n));
+  else if (newN > n)
     m_buffer.insertbytes((i + n) * S, Bytes(newN - n));
   else
     erase(begin() + i + newN, begin() + i + n);

@@ -3,7 +3,10 @@
 // A loop that leaves at the first hit isn't vectorised by compilers. These look at a block of fixed size at a
 // time and only ask whether there is a hit in it, without leaving early; that every compiler turns into a few
 // wide instructions. What is near the start of a range, and the block that has the hit, are left to the plain
-// templates: they say where it is, and are quicker where it is close.
+// loops: they say where it is, and are quicker where it is close.
+//
+// Where a loop over a block isn't inlined, that is because one compiler otherwise merges it with the loop
+// around it and then doesn't use wide instructions, which makes it five times as slow.
 
 #include <utils/VectorOfByte.h>
 
@@ -13,14 +16,14 @@ namespace mirel {
 
 namespace {
 
-/// Bytes in a block. Large ones go through the bulk of a text, small ones through what is left at its end.
-constexpr ssize_t kLarge = 128;
-constexpr ssize_t kSmall = 16;
+/// Units in a block. Large ones go through the bulk of a text, small ones through what is left at its end.
+/// Loops of fewer rounds than these are unrolled by compilers before they see that wide instructions would
+/// do.
+constexpr ssize_t kSmall = 32;
+template <class T> constexpr ssize_t kLarge = 128 / ssize_t(sizeof(T));
 
 /// So many units are looked at one by one before the first block: most hits in practice are that close.
 constexpr ssize_t kNear = 16;
-
-template <ssize_t Bytes, class T> constexpr ssize_t kUnits = Bytes / ssize_t(sizeof(T));
 
 /// All bits where a unit equals v, as wide as the unit: what a wide comparison yields, without a conversion.
 template <class T> T Mask(bool equal) { return equal ? T(-1) : T(0); }
@@ -33,11 +36,11 @@ template <ssize_t n, class T> bool Has(const T* p, T v) {
   return any != 0;
 }
 
-/// Whether one of n places holds the first unit of a pattern, and the place last units behind it the last.
-template <ssize_t n, class T> bool HasEnds(const T* p, T first, ssize_t last, T v) {
+/// Whether there is a k below n with first at p[k] and last at q[k].
+template <ssize_t n, class T> [[gnu::noinline]] bool HasBoth(const T* p, T first, const T* q, T last) {
   T any = 0;
   for (ssize_t k = 0; k < n; ++k)
-    any = T(any | (Mask<T>(p[k] == first) & Mask<T>(p[k + last] == v)));
+    any = T(any | T(Mask<T>(p[k] == first) & Mask<T>(q[k] == last)));
   return any != 0;
 }
 
@@ -49,8 +52,7 @@ template <ssize_t n, class T> bool HasAny(const T* p, const T* y1, const T* y2) 
   return false;
 }
 
-/// Marks the places among n that hold v. Not inlined: merged with the loop over a set, one compiler turns the
-/// two inside out, and is five times slower.
+/// Marks the places among n that hold v.
 template <ssize_t n, class T> [[gnu::noinline]] void Mark(T* marks, const T* p, T v) {
   for (ssize_t k = 0; k < n; ++k)
     marks[k] = T(marks[k] | Mask<T>(p[k] == v));
@@ -69,8 +71,8 @@ template <ssize_t n, class T> bool HasOther(const T* p, const T* y1, const T* y2
 
 /// Goes forward over blocks in which hasHit says there is none.
 template <class T, class F> const T* Skip(const T* p, const T* end, const F& hasHit) {
-  constexpr std::integral_constant<ssize_t, kUnits<kLarge, T>> large;
-  constexpr std::integral_constant<ssize_t, kUnits<kSmall, T>> small;
+  constexpr std::integral_constant<ssize_t, kLarge<T>> large;
+  constexpr std::integral_constant<ssize_t, kSmall> small;
   while (end - p >= large && !hasHit(p, large))
     p += large;
   while (end - p >= small && !hasHit(p, small))
@@ -80,8 +82,8 @@ template <class T, class F> const T* Skip(const T* p, const T* end, const F& has
 
 /// Goes back over blocks in which hasHit says there is none.
 template <class T, class F> const T* SkipBack(const T* begin, const T* p, const F& hasHit) {
-  constexpr std::integral_constant<ssize_t, kUnits<kLarge, T>> large;
-  constexpr std::integral_constant<ssize_t, kUnits<kSmall, T>> small;
+  constexpr std::integral_constant<ssize_t, kLarge<T>> large;
+  constexpr std::integral_constant<ssize_t, kSmall> small;
   while (p - begin >= large && !hasHit(p - large, large))
     p -= large;
   while (p - begin >= small && !hasHit(p - small, small))
@@ -111,40 +113,33 @@ const T* Backward(const T* x1, const T* x2, const Plain& plain, const F& hasHit)
   return q == end ? x2 : q;
 }
 
-template <class T> const T* FindUnit(const T* i1, const T* i2, T v) {
-  return Forward(
-      i1, i2, [=](const T* p, const T* end) { return Find<const T*, T>(p, end, v); },
-      [=](const T* p, auto n) { return Has<n>(p, v); });
+/// Find() one by one, with the end of the range asked for at every fourth unit only.
+template <class T> const T* FindByFour(const T* p, const T* end, T v) {
+  for (; end - p >= 4; p += 4)
+    for (ssize_t k = 0; k < 4; ++k)
+      if (p[k] == v)
+        return p + k;
+  return mirel::Find<const T*, T>(p, end, v);
 }
 
-template <class T> const T* FindLastUnit(const T* i1, const T* i2, T v) {
-  return Backward(
-      i1, i2, [=](const T* p, const T* end) { return FindLast<const T*, T>(p, end, v); },
-      [=](const T* p, auto n) { return Has<n>(p, v); });
+/// Whether the set has v in it. For bytes the C library is quicker, unless the set is tiny.
+template <class T> bool IsIn(const T* y1, const T* y2, T v) {
+  if (sizeof(T) == 1 && y2 - y1 > 4)
+    return std::memchr(y1, v, std::size_t(y2 - y1)) != nullptr;
+  return mirel::Find<const T*, T>(y1, y2, v) != y2;
 }
 
-template <class T> const T* FindFirstInSet(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return Forward(
-      x1, x2, [=](const T* p, const T* end) { return FindFirstOf<const T*, const T*>(p, end, y1, y2); },
-      [=](const T* p, auto n) { return HasAny<n>(p, y1, y2); });
+/// The first or the last unit of [p, end) that is in the set, or isn't, one by one; end if there is none.
+template <class T> const T* First(const T* p, const T* end, const T* y1, const T* y2, bool isMember) {
+  while (p != end && IsIn(y1, y2, *p) != isMember)
+    ++p;
+  return p;
 }
-
-template <class T> const T* FindFirstNotInSet(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return Forward(
-      x1, x2, [=](const T* p, const T* end) { return FindFirstNotOf<const T*, const T*>(p, end, y1, y2); },
-      [=](const T* p, auto n) { return HasOther<n>(p, y1, y2); });
-}
-
-template <class T> const T* FindLastInSet(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return Backward(
-      x1, x2, [=](const T* p, const T* end) { return FindLastOf<const T*, const T*>(p, end, y1, y2); },
-      [=](const T* p, auto n) { return HasAny<n>(p, y1, y2); });
-}
-
-template <class T> const T* FindLastNotInSet(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return Backward(
-      x1, x2, [=](const T* p, const T* end) { return FindLastNotOf<const T*, const T*>(p, end, y1, y2); },
-      [=](const T* p, auto n) { return HasOther<n>(p, y1, y2); });
+template <class T> const T* Last(const T* p, const T* end, const T* y1, const T* y2, bool isMember) {
+  for (const T* q = end; q != p;)
+    if (IsIn(y1, y2, *--q) == isMember)
+      return q;
+  return end;
 }
 
 /// A pattern of at least one unit.
@@ -169,132 +164,139 @@ template <class T> struct Pattern {
     return end;
   }
   /// Whether a block of n places has one at which it may stand.
-  template <class N> bool MayBeIn(const T* p, N n) const { return HasEnds<n>(p, *begin, last, begin[last]); }
+  template <ssize_t n> bool MayBeIn(const T* p) const { return HasBoth<n>(p, *begin, p + last, begin[last]); }
 };
-
-template <class T> const T* FindFirstRun(const T* x1, const T* x2, const T* y1, const T* y2) {
-  const Pattern<T> pattern{y1, y2 - y1 - 1};
-  if (x2 - x1 <= pattern.last)
-    return x2;
-  const T* const end = x2 - pattern.last; // the places where it has room
-  const T* p = x1;
-  do { // a block may have a place that fits in its ends only
-    p = Skip(p, end, [&](const T* q, auto n) { return pattern.MayBeIn(q, n); });
-    const T* const blockEnd = end - p < kUnits<kSmall, T> ? end : p + kUnits<kSmall, T>;
-    const T* const q = pattern.First(p, blockEnd);
-    if (q != blockEnd)
-      return q;
-    p = blockEnd;
-  } while (p != end);
-  return x2;
-}
-
-template <class T> const T* FindLastRun(const T* x1, const T* x2, const T* y1, const T* y2) {
-  const Pattern<T> pattern{y1, y2 - y1 - 1};
-  if (x2 - x1 <= pattern.last)
-    return x2;
-  const T* p = x2 - pattern.last;
-  do {
-    p = SkipBack(x1, p, [&](const T* q, auto n) { return pattern.MayBeIn(q, n); });
-    const T* const blockBegin = p - x1 < kUnits<kSmall, T> ? x1 : p - kUnits<kSmall, T>;
-    const T* const q = pattern.Last(blockBegin, p);
-    if (q != p)
-      return q;
-    p = blockBegin;
-  } while (p != x1);
-  return x2;
-}
 
 } // namespace
 
-const char8* Find(const char8* i1, const char8* i2, const char8& v) {
-  const void* const p =
-      i1 == i2 ? nullptr : std::memchr(i1, static_cast<unsigned char>(v), std::size_t(i2 - i1));
-  return p ? static_cast<const char8*>(p) : i2;
-}
-const char16* Find(const char16* i1, const char16* i2, const char16& v) { return FindUnit(i1, i2, v); }
+namespace detail {
 
-const char8* FindLast(const char8* i1, const char8* i2, const char8& v) { return FindLastUnit(i1, i2, v); }
-const char16* FindLast(const char16* i1, const char16* i2, const char16& v) {
-  return FindLastUnit(i1, i2, v);
-}
-
-const char8* FindFirstSubSequence(const char8* x1, const char8* x2, const char8* y1, const char8* y2) {
-  if (y1 == y2)
-    return x1;
-  // The C library looks for one byte faster than anything here, as long as it doesn't find it too often.
-  const Pattern<char8> pattern{y1, y2 - y1 - 1};
-  const char8* p = x1;
-  for (ssize_t hits = 0; hits < 8 || p - x1 > 128 * hits; ++hits) {
-    if (x2 - p <= pattern.last)
-      return x2;
-    const char8* const end = x2 - pattern.last;
-    p = Find(p, end, *y1);
-    if (p == end)
-      return x2;
-    if (pattern.IsAt(p))
-      return p;
-    ++p;
+template <class T> const T* ByBlock<T>::Find(const T* i1, const T* i2, T v) {
+  if constexpr (sizeof(T) == 1) {
+    const void* const p = i1 == i2 ? nullptr : std::memchr(i1, v, std::size_t(i2 - i1));
+    return p ? static_cast<const T*>(p) : i2;
   }
-  return FindFirstRun(p, x2, y1, y2);
-}
-const char16* FindFirstSubSequence(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
-  return y1 == y2 ? x1 : FindFirstRun(x1, x2, y1, y2);
-}
-
-const char8* FindLastSubSequence(const char8* x1, const char8* x2, const char8* y1, const char8* y2) {
-  return y1 == y2 ? x2 : FindLastRun(x1, x2, y1, y2);
-}
-const char16* FindLastSubSequence(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
-  return y1 == y2 ? x2 : FindLastRun(x1, x2, y1, y2);
+  return Forward(
+      i1, i2, [=](const T* p, const T* end) { return FindByFour(p, end, v); },
+      [=](const T* p, auto n) { return Has<n>(p, v); });
 }
 
-const char8* FindFirstOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2) {
-  return FindFirstInSet(x1, x2, y1, y2);
-}
-const char16* FindFirstOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
-  return FindFirstInSet(x1, x2, y1, y2);
-}
-
-const char8* FindFirstNotOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2) {
-  return FindFirstNotInSet(x1, x2, y1, y2);
-}
-const char16* FindFirstNotOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
-  return FindFirstNotInSet(x1, x2, y1, y2);
+template <class T> const T* ByBlock<T>::FindLast(const T* i1, const T* i2, T v) {
+  return Backward(
+      i1, i2, [=](const T* p, const T* end) { return mirel::FindLast<const T*, T>(p, end, v); },
+      [=](const T* p, auto n) { return Has<n>(p, v); });
 }
 
-const char8* FindLastOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2) {
-  return FindLastInSet(x1, x2, y1, y2);
-}
-const char16* FindLastOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
-  return FindLastInSet(x1, x2, y1, y2);
-}
-
-const char8* FindLastNotOf(const char8* x1, const char8* x2, const char8* y1, const char8* y2) {
-  return FindLastNotInSet(x1, x2, y1, y2);
-}
-const char16* FindLastNotOf(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
-  return FindLastNotInSet(x1, x2, y1, y2);
+template <class T> const T* ByBlock<T>::FindFirstOf(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return Forward(
+      x1, x2, [=](const T* p, const T* end) { return First(p, end, y1, y2, true); },
+      [=](const T* p, auto n) { return HasAny<n>(p, y1, y2); });
 }
 
-int LexicographicalCompareX(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
+template <class T> const T* ByBlock<T>::FindFirstNotOf(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return Forward(
+      x1, x2, [=](const T* p, const T* end) { return First(p, end, y1, y2, false); },
+      [=](const T* p, auto n) { return HasOther<n>(p, y1, y2); });
+}
+
+template <class T> const T* ByBlock<T>::FindLastOf(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return Backward(
+      x1, x2, [=](const T* p, const T* end) { return Last(p, end, y1, y2, true); },
+      [=](const T* p, auto n) { return HasAny<n>(p, y1, y2); });
+}
+
+template <class T> const T* ByBlock<T>::FindLastNotOf(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return Backward(
+      x1, x2, [=](const T* p, const T* end) { return Last(p, end, y1, y2, false); },
+      [=](const T* p, auto n) { return HasOther<n>(p, y1, y2); });
+}
+
+template <class T>
+const T* ByBlock<T>::FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
+  const Pattern<T> pattern{y1, y2 - y1 - 1};
+  if (x2 - x1 <= pattern.last)
+    return x2;
+  constexpr ssize_t large = kLarge<T>, small = kSmall;
+  const T* const end = x2 - pattern.last; // behind the places where it has room
+  const T* p = x1;
+  if constexpr (sizeof(T) == 1) {
+    // The C library looks for one byte faster than anything here, as long as it doesn't find it too often.
+    for (ssize_t hits = 0; hits < 8 || p - x1 > 128 * hits; ++hits) {
+      p = Find(p, end, *y1);
+      if (p == end)
+        return x2;
+      if (pattern.IsAt(p))
+        return p;
+      ++p;
+    }
+  }
+  for (;;) {
+    const T* blockEnd = end;
+    if (end - p >= large) {
+      blockEnd = p + large;
+      if (!pattern.template MayBeIn<large>(p)) {
+        p = blockEnd;
+        continue;
+      }
+    }
+    for (; blockEnd - p >= small; p += small)
+      if (pattern.template MayBeIn<small>(p))
+        if (const T* const q = pattern.First(p, p + small); q != p + small)
+          return q;
+    if (blockEnd == end) {
+      const T* const q = pattern.First(p, end);
+      return q == end ? x2 : q;
+    }
+  }
+}
+
+template <class T>
+const T* ByBlock<T>::FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
+  const Pattern<T> pattern{y1, y2 - y1 - 1};
+  if (x2 - x1 <= pattern.last)
+    return x2;
+  constexpr ssize_t large = kLarge<T>, small = kSmall;
+  for (const T* p = x2 - pattern.last;;) {
+    const T* blockBegin = x1;
+    if (p - x1 >= large) {
+      blockBegin = p - large;
+      if (!pattern.template MayBeIn<large>(blockBegin)) {
+        p = blockBegin;
+        continue;
+      }
+    }
+    for (; p - blockBegin >= small; p -= small)
+      if (pattern.template MayBeIn<small>(p - small))
+        if (const T* const q = pattern.Last(p - small, p); q != p)
+          return q;
+    if (blockBegin == x1) {
+      const T* const q = pattern.Last(x1, p);
+      return q == p ? x2 : q;
+    }
+  }
+}
+
+template <class T> int ByBlock<T>::Compare(const T* x1, const T* x2, const T* y1, const T* y2) {
   // Equal stretches are told by their bytes, a stretch with a difference by its units. Most differences are
   // near.
   const ssize_t len = x2 - x1 < y2 - y1 ? x2 - x1 : y2 - y1;
-  const char16* const end = x1 + len;
-  const char16* p = x1;
-  const char16* q = y1;
+  const T* const end = x1 + len;
+  const T* p = x1;
+  const T* q = y1;
   const auto skip = [&](ssize_t n) {
     while (end - p >= n && IsEqual(p, p + n, q))
       p += n, q += n;
   };
-  for (const char16* const near = end - p < 8 ? end : p + 8; p != near && *p == *q;)
-    ++p, ++q;
-  if (p - x1 == 8) {
+  if (len > 0 && *p == *q) {
     skip(256);
     skip(16);
   }
-  return LexicographicalCompareX<const char16*, const char16*>(p, x2, q, y2);
+  return LexicographicalCompareX<const T*, const T*>(p, x2, q, y2);
 }
+
+template struct ByBlock<char8>;
+template struct ByBlock<char16>;
+
+} // namespace detail
 
 } // namespace mirel
