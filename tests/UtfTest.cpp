@@ -98,12 +98,27 @@ TEST(Utf, EverySequenceOfUpToThreeBytes) {
   for (unsigned bytes = 0; bytes < 1u << 24; ++bytes) {
     const std::string text = {static_cast<char>(bytes >> 16), static_cast<char>(bytes >> 8),
                               static_cast<char>(bytes)};
-    const std::size_t length = bytes < 0x100 ? 1 : bytes < 0x10000 ? 2 : 3; // leading zeros were seen before
-    ASSERT_NO_FATAL_FAILURE(check(bytes < 0x10000 ? text.substr(3 - length) : text)) << bytes;
+    if (bytes < 0x10000) // leading zeros were seen before
+      ASSERT_NO_FATAL_FAILURE(check(text.substr(bytes < 0x100 ? 2 : 1))) << bytes;
+    else if (bytes % 8 == 0)
+      ASSERT_NO_FATAL_FAILURE(check(text)) << bytes;
+    ASSERT_NO_FATAL_FAILURE(check(text + "more"))
+        << bytes; // what is near the end is converted in another way
   }
-  for (const char* text : {"\xF0\x8F\xBF\xBF", "\xF4\x90\x80\x80", "\xF0\x9F\x98", "\xF0\x9F\x98\x80",
-                           "\xF4\x8F\xBF\xBF", "ab\xF8", "\xF1\x80\x80z"})
-    check(text);
+  const unsigned tails[] = {0x7F, 0x80, 0x9A, 0xBF, 0xC0};
+  for (unsigned lead = 0xF0; lead < 0x100; ++lead)
+    for (unsigned second = 0; second < 0x100; ++second)
+      for (const unsigned c : tails)
+        for (const unsigned d : tails)
+          for (const char* more : {"", "more"}) {
+            const std::string text = {static_cast<char>(lead), static_cast<char>(second),
+                                      static_cast<char>(c), static_cast<char>(d)};
+            ASSERT_NO_FATAL_FAILURE(check(text + more));
+          }
+  for (const std::size_t before : {15, 16, 47, 48, 1023, 1024, 5000})
+    for (const char* text :
+         {"\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xFF", "\xE2\x82", "\xED\xA0\x80"})
+      check(std::string(before, 'a') + text + std::string(before, 'b'));
 }
 
 TEST(Utf, SurrogatesMustPair) {
@@ -124,7 +139,9 @@ TEST(Utf, SurrogatesMustPair) {
           else
             break;
         }
-        ExpectUtf8({static_cast<char16>(a), static_cast<char16>(b), static_cast<char16>(c)}, i == 3, text);
+        Units input = {static_cast<char16>(a), static_cast<char16>(b), static_cast<char16>(c)};
+        ExpectUtf8(input, i == 3, text);
+        ExpectUtf8(input += Units(40, 'z'), i == 3, i == 3 ? text + std::string(40, 'z') : text);
       }
 }
 

@@ -1,6 +1,8 @@
 #include "Support.h"
 
 #include <list>
+#include <random>
+#include <vector>
 
 #include <utils/VectorOfByte.h>
 
@@ -49,6 +51,52 @@ TYPED_TEST(RangeAlgorithms, FailedSearchesReturnTheEnd) {
   EXPECT_TRUE(IsPrefix(x2, x2, y1, y1) && IsPrefix(x1 + 1, x2, y1, y2) && !IsPrefix(x1 + 4, x2, y1, y2));
   const std::list<TypeParam> list(x1, x2); // forward traversal is enough
   EXPECT_EQ(std::distance(list.begin(), FindFirstSubSequence(list.begin(), list.end(), y1, y2)), 1);
+}
+
+/// Whether all searches for a pattern or set, or its first unit, come to what the plain templates come to.
+template <class T> bool Agree(const T* x1, const T* x2, const T* y1, const T* y2) {
+  using P = const T*;
+  return Find(x1, x2, *y1) == Find<P, T>(x1, x2, *y1) &&
+         FindLast(x1, x2, *y1) == FindLast<P, T>(x1, x2, *y1) &&
+         FindFirstSubSequence(x1, x2, y1, y2) == FindFirstSubSequence<P, P>(x1, x2, y1, y2) &&
+         FindLastSubSequence(x1, x2, y1, y2) == FindLastSubSequence<P, P>(x1, x2, y1, y2) &&
+         FindFirstOf(x1, x2, y1, y2) == FindFirstOf<P, P>(x1, x2, y1, y2) &&
+         FindFirstNotOf(x1, x2, y1, y2) == FindFirstNotOf<P, P>(x1, x2, y1, y2) &&
+         FindLastOf(x1, x2, y1, y2) == FindLastOf<P, P>(x1, x2, y1, y2) &&
+         FindLastNotOf(x1, x2, y1, y2) == FindLastNotOf<P, P>(x1, x2, y1, y2);
+}
+
+TYPED_TEST(RangeAlgorithms, AgreeWithThePlainTemplates) {
+  using T = TypeParam;
+  const T high = static_cast<T>(0x80E9);
+  std::mt19937 random(3);
+  for (std::size_t size = 0; size < 420; size += size < 150 ? 1 : 7) {
+    // A vector of exactly that size, and so its end is the end of what may be read.
+    std::vector<T> text(size, 'a'), other(size, 'a');
+    const auto agree = [&](std::initializer_list<T> what) {
+      return Agree<T>(text.data(), text.data() + size, what.begin(), what.end());
+    };
+    for (std::size_t at = 0; at < size; ++at) { // one hit, or one unit that isn't a member, at every place
+      text[at] = high;
+      ASSERT_TRUE(agree({high}) && agree({high, 'a'}) && agree({'b', high}) && agree({'a', high, 'a'}))
+          << size << at;
+      ASSERT_TRUE(agree({'a', 'b'}) && agree({'b', 'c', 'd', 'a', 'e', 'f'}) && agree({'a', 'a', high}))
+          << size << at;
+      const T* const x = text.data();
+      ASSERT_EQ(LexicographicalCompareX(x, x + size, other.data(), other.data() + size) > 0, true)
+          << size << at;
+      ASSERT_LT(LexicographicalCompareX(x, x + at, other.data(), other.data() + size), 0) << size << at;
+      text[at] = 'a';
+    }
+    ASSERT_TRUE(agree({high}) && agree({high, 'b'}) && agree({'a', 'b', 'c', 'd', 'e'}) &&
+                agree({'a', 'a', 'b'}));
+    for (int round = 0; round < 20; ++round) {
+      for (T& unit : text)
+        unit = static_cast<T>(random() % 16 == 0 ? high : 'a' + random() % 3);
+      ASSERT_TRUE(agree({'a', 'b', 'c', 'a'}) && agree({high, 'b', 'c'}) && agree({'a', 'b', 'c'}) &&
+                  agree({'c', high}));
+    }
+  }
 }
 
 TEST(VectorOfByteTest, EditsAtAnyPlace) {
