@@ -98,12 +98,9 @@ TEST(Utf, EverySequenceOfUpToThreeBytes) {
   for (unsigned bytes = 0; bytes < 1u << 24; ++bytes) {
     const std::string text = {static_cast<char>(bytes >> 16), static_cast<char>(bytes >> 8),
                               static_cast<char>(bytes)};
-    if (bytes < 0x10000) // leading zeros were seen before
-      ASSERT_NO_FATAL_FAILURE(check(text.substr(bytes < 0x100 ? 2 : 1))) << bytes;
-    else if (bytes % 8 == 0)
-      ASSERT_NO_FATAL_FAILURE(check(text)) << bytes;
-    ASSERT_NO_FATAL_FAILURE(check(text + "more"))
-        << bytes; // what is near the end is converted in another way
+    ASSERT_NO_FATAL_FAILURE(
+        check(text.substr(bytes < 0x100 ? 2 : bytes < 0x10000))); // zeros were seen before
+    ASSERT_NO_FATAL_FAILURE(check(text + "more")); // what is near the end is converted in another way
   }
   const unsigned tails[] = {0x7F, 0x80, 0x9A, 0xBF, 0xC0};
   for (unsigned lead = 0xF0; lead < 0x100; ++lead)
@@ -115,7 +112,7 @@ TEST(Utf, EverySequenceOfUpToThreeBytes) {
                                       static_cast<char>(c), static_cast<char>(d)};
             ASSERT_NO_FATAL_FAILURE(check(text + more));
           }
-  for (const std::size_t before : {15, 16, 47, 48, 1023, 1024, 5000})
+  for (const std::size_t before : {15u, 16u, 47u, 48u, 1023u, 1024u, 5000u})
     for (const char* text :
          {"\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xFF", "\xE2\x82", "\xED\xA0\x80"})
       check(std::string(before, 'a') + text + std::string(before, 'b'));

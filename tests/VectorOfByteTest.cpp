@@ -92,7 +92,7 @@ TYPED_TEST(RangeAlgorithms, AgreeWithThePlainTemplates) {
                 agree({'a', 'a', 'b'}));
     for (int round = 0; round < 20; ++round) {
       for (T& unit : text)
-        unit = static_cast<T>(random() % 16 == 0 ? high : 'a' + random() % 3);
+        unit = random() % 16 == 0 ? high : static_cast<T>('a' + random() % 3);
       ASSERT_TRUE(agree({'a', 'b', 'c', 'a'}) && agree({high, 'b', 'c'}) && agree({'a', 'b', 'c'}) &&
                   agree({'c', high}));
     }

@@ -240,7 +240,7 @@ public:
   /// @{
 
   /// An empty buffer without storage.
-  VectorOfByte() noexcept;
+  VectorOfByte() noexcept : m_buffer(nullptr), size_(0), m_capacity(0) {}
   /// A copy of the bytes of [r1, r2). @pre "r1 <= r2"
   VectorOfByte(const value_type* r1, const value_type* r2);
   /// count bytes of value x. @pre "0 <= count"
@@ -249,7 +249,7 @@ public:
   explicit VectorOfByte(N count, X x) : VectorOfByte(ssize_t(count), value_type(x)) {}
   VectorOfByte(std::initializer_list<uint8> r);
   VectorOfByte(const VectorOfByte& r);
-  ~VectorOfByte();
+  ~VectorOfByte() { Release(m_buffer); }
 
   /// Becomes a copy of r; keeps the storage where it is large enough.
   VectorOfByte& operator=(const VectorOfByte& r);
@@ -339,8 +339,10 @@ public:
   template <class T> void push_back(const T& x) {
     const T value = x; // x may lie in the storage that reserve() is about to give up
     const ssize_t n = size_ + ssize_t(sizeof(T));
-    if (m_capacity < n)
-      reserve(n + m_capacity);
+    if (m_capacity < n) {
+      m_buffer = Reallocate(m_buffer, n + m_capacity);
+      m_capacity += n;
+    }
     *reinterpret_cast<T*>(m_buffer + size_) = value;
     size_ = n;
   }
@@ -421,6 +423,12 @@ public:
 
   /// @}
 
+private:
+  // By value, so that a buffer whose address nobody takes can live in registers through a loop of appends.
+  static value_type* Reallocate(value_type* buffer, ssize_t n);
+  static void Release(value_type* buffer) noexcept;
+
+public:
   mutable value_type* m_buffer; ///< The storage, or null while there is none.
   ssize_t size_; ///< Bytes in use, 0 <= size_ <= m_capacity; the rest is spare and may be written.
   mutable ssize_t m_capacity; ///< Bytes of storage.

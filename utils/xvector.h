@@ -352,7 +352,7 @@ public:
   template <class It, detail::IfIterator<It> = 0> void push_back(It r1, It r2) {
     MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     const auto source = Source(r1, r2);
-    ReplaceRun(size(), 0, source.begin(), source.size());
+    Append(source.begin(), source.size());
   }
   /// Appends the elements of [r1, r2) count times. @pre "0 <= count", then "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> void push_back(ssize_t count, It r1, It r2);
@@ -386,19 +386,19 @@ public:
     return *this;
   }
   xvector<T>& append(const xvector<T>& r) {
-    ReplaceRun(size(), 0, r.begin(), r.size());
+    Append(r.begin(), r.size());
     return *this;
   }
   /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   xvector<T>& append(const xvector<T>& r, ssize_t ri, ssize_t rn) {
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
-    ReplaceRun(size(), 0, r.begin() + ri, rn);
+    Append(r.begin() + ri, rn);
     return *this;
   }
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   xvector<T>& append(const T* p, ssize_t pn) {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
-    ReplaceRun(size(), 0, p, pn);
+    Append(p, pn);
     return *this;
   }
   /// Appends count elements equal to x. @pre "0 <= count"
@@ -802,6 +802,15 @@ private:
   T* ResizeRun(ssize_t i, ssize_t n, ssize_t newN);
   void ReplaceRun(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRun(ssize_t i, ssize_t n, ssize_t count, T x);
+
+  /// Appends the pn elements at p: the most frequent edit, with nothing to call where there is room.
+  void Append(const T* p, ssize_t pn) {
+    const ssize_t oldSize = size();
+    if (pn > capacity() - oldSize || m_buffer.owns(p))
+      return ReplaceRun(oldSize, 0, p, pn);
+    m_buffer.growbytes(pn * S);
+    p_copy(begin() + oldSize, p, p + pn);
+  }
 
   /// The end of the part that a reverse search from offset goes through.
   const T* After(ssize_t offset) const { return offset == npos ? end() : begin() + offset + 1; }

@@ -144,13 +144,14 @@ template <class T> const T* Last(const T* p, const T* end, const T* y1, const T*
 
 /// A pattern of at least one unit.
 template <class T> struct Pattern {
+  Pattern(const T* y1, const T* y2) : begin(y1), last(y2 - y1 - 1), first(*y1), final(y1[last]) {}
+
   const T* begin;
   ssize_t last; ///< the index of the last unit
+  T first, final;
 
   /// Whether the pattern stands at p, where there is room for it.
-  bool IsAt(const T* p) const {
-    return *p == *begin && p[last] == begin[last] && IsEqual(begin, begin + last, p);
-  }
+  bool IsAt(const T* p) const { return *p == first && p[last] == final && IsEqual(begin, begin + last, p); }
   /// The first or the last place of [p, end) at which the pattern stands, or end.
   const T* First(const T* p, const T* end) const {
     while (p != end && !IsAt(p))
@@ -164,7 +165,7 @@ template <class T> struct Pattern {
     return end;
   }
   /// Whether a block of n places has one at which it may stand.
-  template <ssize_t n> bool MayBeIn(const T* p) const { return HasBoth<n>(p, *begin, p + last, begin[last]); }
+  template <ssize_t n> bool MayBeIn(const T* p) const { return HasBoth<n>(p, first, p + last, final); }
 };
 
 } // namespace
@@ -213,16 +214,16 @@ template <class T> const T* ByBlock<T>::FindLastNotOf(const T* x1, const T* x2, 
 
 template <class T>
 const T* ByBlock<T>::FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
-  const Pattern<T> pattern{y1, y2 - y1 - 1};
-  if (x2 - x1 <= pattern.last)
+  if (x2 - x1 < y2 - y1)
     return x2;
+  const Pattern<T> pattern(y1, y2);
   constexpr ssize_t large = kLarge<T>, small = kSmall;
   const T* const end = x2 - pattern.last; // behind the places where it has room
   const T* p = x1;
   if constexpr (sizeof(T) == 1) {
     // The C library looks for one byte faster than anything here, as long as it doesn't find it too often.
     for (ssize_t hits = 0; hits < 8 || p - x1 > 128 * hits; ++hits) {
-      p = Find(p, end, *y1);
+      p = Find(p, end, pattern.first);
       if (p == end)
         return x2;
       if (pattern.IsAt(p))
@@ -252,9 +253,9 @@ const T* ByBlock<T>::FindFirstSubSequence(const T* x1, const T* x2, const T* y1,
 
 template <class T>
 const T* ByBlock<T>::FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
-  const Pattern<T> pattern{y1, y2 - y1 - 1};
-  if (x2 - x1 <= pattern.last)
+  if (x2 - x1 < y2 - y1)
     return x2;
+  const Pattern<T> pattern(y1, y2);
   constexpr ssize_t large = kLarge<T>, small = kSmall;
   for (const T* p = x2 - pattern.last;;) {
     const T* blockBegin = x1;

@@ -40,8 +40,6 @@ void GrowTo(const VectorOfByte& buffer, ssize_t n) {
 
 } // namespace
 
-VectorOfByte::VectorOfByte() noexcept : m_buffer(nullptr), size_(0), m_capacity(0) {}
-
 VectorOfByte::VectorOfByte(const value_type* r1, const value_type* r2) : VectorOfByte() { assign(r1, r2); }
 
 VectorOfByte::VectorOfByte(ssize_t count, value_type x) : VectorOfByte() { insert(0, count, x); }
@@ -49,8 +47,6 @@ VectorOfByte::VectorOfByte(ssize_t count, value_type x) : VectorOfByte() { inser
 VectorOfByte::VectorOfByte(std::initializer_list<uint8> r) : VectorOfByte() { assign(r.begin(), r.end()); }
 
 VectorOfByte::VectorOfByte(const VectorOfByte& r) : VectorOfByte() { assign(r.begin(), r.end()); }
-
-VectorOfByte::~VectorOfByte() { std::free(m_buffer); }
 
 VectorOfByte& VectorOfByte::operator=(const VectorOfByte& r) {
   if (this != &r)
@@ -64,13 +60,20 @@ void VectorOfByte::swap(VectorOfByte& r) noexcept {
   std::swap(m_capacity, r.m_capacity);
 }
 
+/// Makes a buffer n bytes large and returns where it is now; it is untouched when that throws.
+uint8* VectorOfByte::Reallocate(value_type* buffer, ssize_t n) {
+  void* const moved = std::realloc(buffer, static_cast<std::size_t>(n));
+  if (moved == nullptr)
+    throw std::bad_alloc();
+  return static_cast<value_type*>(moved);
+}
+
+void VectorOfByte::Release(value_type* buffer) noexcept { std::free(buffer); }
+
 void VectorOfByte::reserve(ssize_t n) const {
   if (n <= m_capacity)
     return;
-  void* const buffer = std::realloc(m_buffer, static_cast<std::size_t>(n));
-  if (buffer == nullptr)
-    throw std::bad_alloc(); // the old storage is still ours, untouched
-  m_buffer = static_cast<value_type*>(buffer);
+  m_buffer = Reallocate(m_buffer, n);
   m_capacity = n;
 }
 
