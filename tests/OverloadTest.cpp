@@ -76,7 +76,12 @@ TYPED_TEST(Overload, LiteralZeroIsANumber) {
   EXPECT_TRUE(S(nullptr, 0).empty() && S(nullptr, nullptr).empty() && xvector<TypeParam>(nullptr, 0).empty());
   EXPECT_EQ(xvector<TypeParam>(r.data(), 0).size(), 0);
   s = {};
-  EXPECT_TRUE(s.empty());
+  enum { kZero };
+  s.replace(s.begin(), s.end(), 0, 0x41), s.insert(0, kZero, x), s.insert(s.begin(), 0, 0x41),
+      s.replace(0, 0, kZero, x);
+  VectorOfByte().insert(nullptr, 0, 0);
+  EXPECT_TRUE(s.empty() && S({r.data(), 0}).empty() && S({r, 0, 0}).empty());
+  static_assert(!std::is_constructible_v<S, std::nullptr_t> && !std::is_assignable_v<S&, std::nullptr_t>);
 }
 
 TYPED_TEST(Overload, AnyIteratorIsASource) {

@@ -139,6 +139,9 @@ TYPED_TEST(Precondition, CallsThatStop) {
       {kRange, [&](S& s) { s.assign(p + 1, p); }},
       {kRange, [&](S& s) { s.push_back(p + 1, p); }},
       {kRange, [&](S& s) { s.insert(0, p + 1, p); }},
+      {kRange, [&](S& s) { s.find(p + 1, p); }},
+      {kRange, [&](S& s) { s.rfind(p + 1, p); }},
+      {kRange, [&](S& s) { s.find_last_not_of(p + 1, p); }},
       {kCount, [&](S&) { S(-1, x); }},
       {kCount, [&](S&) { xvector<T>(-1, x); }},
       {kCount, [&](S& s) { s.assign(-1, x); }},
@@ -198,7 +201,7 @@ TEST(Precondition, OfBuffersConversionsAndStreams) {
   ExpectStop(
       b, [](VectorOfByte& v) { v.insertbytes(4, 1); }, kIndex);
   ExpectStop(
-      b, [](VectorOfByte& v) { v.growbytes(-1); }, "0 <= n");
+      b, [](VectorOfByte& v) { v.growbytes(-1); }, kCount);
   ExpectStop(
       b, [](VectorOfByte& v) { v.resize(-1); }, "0 <= n");
   ExpectStop(

@@ -68,6 +68,10 @@ TEST(XOStream, IndentsAndCloses) {
   EXPECT_EQ(sink.flushes, 1);
   sink.broken = true;
   EXPECT_THROW(os << "x", std::runtime_error);
+  EXPECT_THROW(os.put(1), std::runtime_error);
+  sink.broken = false;
+  os.put(2);
+  EXPECT_EQ(sink.text.back(), '2');
   Sink other;
   xostream closed(other);
   closed.close();

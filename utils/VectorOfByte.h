@@ -24,7 +24,9 @@ template <class T> const T& UnitValue(const T& x) { return x; }
 
 /// Lets an overload take part only for integers. An integer argument of any type matches such an overload
 /// exactly, which is how a literal 0 stays an index or a count where a pointer could be meant too.
-template <class... N> using IfIntegers = std::enable_if_t<(std::is_integral_v<N> && ...), int>;
+template <class N>
+constexpr bool kIsInteger = std::is_integral_v<N> || (std::is_enum_v<N> && std::is_convertible_v<N, int>);
+template <class... N> using IfIntegers = std::enable_if_t<(kIsInteger<N> && ...), int>;
 
 } // namespace detail
 
@@ -55,7 +57,7 @@ inline int LexicographicalCompareX(const unsigned char* x1, const unsigned char*
   const ssize_t lenY = y2 - y1;
   const ssize_t len = lenX < lenY ? lenX : lenY;
   // Even for no bytes memcmp may not be given the null pointers of an empty range.
-  const int result = len <= 0 ? 0 : std::memcmp(x1, y1, static_cast<std::size_t>(len));
+  const int result = lenX > 0 && lenY > 0 ? std::memcmp(x1, y1, static_cast<std::size_t>(len)) : 0;
   if (result != 0)
     return result;
   return lenX < lenY ? -1 : lenX > lenY;
@@ -269,9 +271,10 @@ public:
   void reserve(ssize_t n) const;
   /// Makes the size n bytes; new bytes have no particular value. @pre "0 <= n"
   void resize(ssize_t n);
-  /// Appends count bytes of no particular value. @pre "0 <= n"
+  /// Appends count bytes of no particular value. @pre "0 <= count"
   void growbytes(ssize_t count) {
-    if (0 <= count && count <= m_capacity - size_) // what insertbytes() comes to where there is room
+    MIREL_ASSERT(0 <= count);
+    if (count <= m_capacity - size_) // what insertbytes() comes to where there is room
       size_ += count;
     else
       insertbytes(size(), count);
@@ -343,7 +346,7 @@ public:
       m_buffer = Reallocate(m_buffer, n + m_capacity);
       m_capacity += n;
     }
-    *reinterpret_cast<T*>(m_buffer + size_) = value;
+    std::memcpy(m_buffer + size_, &value, sizeof(T));
     size_ = n;
   }
 
@@ -377,6 +380,9 @@ public:
   }
   template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
     insert(ssize_t(i), ssize_t(count), value_type(x));
+  }
+  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(iterator i, N count, X x) {
+    insert(i - begin(), ssize_t(count), value_type(x));
   }
   template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) {
     insert(ssize_t(i), value_type(x));

@@ -6,6 +6,8 @@
 
 #pragma once
 
+#include <cstddef>
+
 #include <utils/StreamInterfaces.h>
 #include <utils/xchar.h>
 
@@ -16,7 +18,8 @@ typedef int64 streamsize;
 
 class IndentingOutputStreamToOStream;
 
-/// Writes text to an IOutputStream, which must outlive it.
+/// Writes text to an IOutputStream, which must outlive it. What the sink throws leaves the member that was
+/// called; the next one tries again.
 class MIREL_API xostream {
 public:
   /// A function that does something to a stream, for use with <<.
@@ -73,6 +76,7 @@ public:
   /// A counted run, padded to the given width in place of width().
   void put_internal(const xchar* p, ssize_t pn, ssize_t width);
   xostream& operator<<(Manipulator manipulator) { return manipulator(*this); }
+  xostream& operator<<(std::nullptr_t) = delete; // a literal 0 is no manipulator
 
   /// @}
   /// @name Line ends, flushing

@@ -7,6 +7,7 @@
 
 #pragma once
 
+#include <cstddef>
 #include <cstring>
 
 #include <utils/xvector.h>
@@ -48,6 +49,7 @@ public:
   basic_xstring(P r, N rn) : Base(static_cast<const T*>(r), ssize_t(rn)) {}
   /// A zero-terminated run.
   basic_xstring(const T* r) : Base(r, r + GetStringLength(r)) {}
+  basic_xstring(std::nullptr_t) = delete;
   /// count units x. @pre "0 <= count"
   explicit basic_xstring(ssize_t count, T x) : Base(count, x) {}
   template <class N, class X, detail::IfIntegers<N, X> = 0>
@@ -55,8 +57,10 @@ public:
   /// @pre "r1 <= r2"
   basic_xstring(const T* r1, const T* r2) : Base(r1, r2) {}
   basic_xstring(const basic_xstring<T>& r) : Base(r) {}
-  /// The units of a vector, such as the result of operator+.
-  basic_xstring(const Base& r) : Base(r) {}
+  /// The units of a vector, such as the result of operator+. A template, so that braces are never taken for
+  /// one.
+  template <class V, std::enable_if_t<std::is_same_v<V, xvector<T>>, int> = 0>
+  basic_xstring(const V& r) : Base(r) {}
   ~basic_xstring() {}
 
   /// @}
@@ -65,6 +69,7 @@ public:
 
   basic_xstring<T>& operator=(const basic_xstring<T>& r) = default;
   basic_xstring<T>& operator=(const T* rhs) { return assign(rhs); }
+  basic_xstring<T>& operator=(std::nullptr_t) = delete;
   /// The listed units. Without it `s = {}` would be a null pointer.
   basic_xstring<T>& operator=(std::initializer_list<T> r) {
     assign(r.begin(), r.end());
@@ -75,6 +80,7 @@ public:
     assign(s, GetStringLength(s));
     return *this;
   }
+  basic_xstring<T>& assign(std::nullptr_t) = delete;
 
   /// @}
   /// @name Zero termination
@@ -103,15 +109,13 @@ public:
 
   using Base::operator+=;
   basic_xstring<T>& operator+=(const T* s) { return append(s); }
-  template <class X, detail::IfIntegers<X> = 0> basic_xstring<T>& operator+=(X x) {
-    this->push_back(T(x));
-    return *this;
-  }
+  template <class X, detail::IfIntegers<X> = 0> xvector<T>& operator+=(X x) { return Base::operator+=(T(x)); }
   using Base::append;
   basic_xstring<T>& append(const T* s) {
     this->push_back(s, s + GetStringLength(s));
     return *this;
   }
+  basic_xstring<T>& append(std::nullptr_t) = delete;
   using Base::insert;
   /// @pre "0 <= i && i <= size()"
   basic_xstring<T>& insert(ssize_t i, const T* s) {
@@ -131,12 +135,15 @@ public:
 
   using Base::compare;
   int compare(const T* p) const { return compare(p, GetStringLength(p)); }
+  int compare(std::nullptr_t) const = delete;
   /// @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const T* p) const { return compare(i, n, p, GetStringLength(p)); }
   using Base::_Eq;
   bool _Eq(const T* rhs) const { return compare(rhs) == 0; }
+  bool _Eq(std::nullptr_t) const = delete;
   using Base::_Lt;
   bool _Lt(const T* rhs) const { return compare(rhs) < 0; }
+  bool _Lt(std::nullptr_t) const = delete;
 
   /// @}
   /// @name Search

@@ -77,7 +77,8 @@ using IfIterator = std::enable_if_t<
 
 /// Lets a template take part only for (pointer, integer), where a literal 0 counts as an integer.
 template <class P, class Ptr, class N>
-using IfPointerAndCount = std::enable_if_t<std::is_convertible_v<P, Ptr> && std::is_integral_v<N>, int>;
+using IfPointerAndCount = std::enable_if_t<
+    (std::is_pointer_v<P> || std::is_null_pointer_v<P>)&&std::is_convertible_v<P, Ptr> && kIsInteger<N>, int>;
 
 } // namespace detail
 
@@ -534,6 +535,10 @@ public:
     MIREL_ASSERT(0 <= count);
     FillRun(i1 - begin(), i2 - i1, count, x);
   }
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  void replace(iterator i1, iterator i2, N count, X x) {
+    replace(i1, i2, ssize_t(count), T(x));
+  }
 
   /// @}
   /// @name Erasing
@@ -553,6 +558,7 @@ public:
     erase(i, i + 1);
     return begin() + n;
   }
+  iterator erase(std::nullptr_t) = delete; // erase(0) would be a null iterator
   /// n elements from index i on. @pre "0 <= i && 0 <= n && i+n <= size()"
   void erase(ssize_t i, ssize_t n) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
@@ -623,9 +629,10 @@ public:
   bool _Eq(const xvector<T>& r) const { return size() == r.size() && IsEqual(begin(), end(), r.begin()); }
   /// Whether this one orders before r.
   bool _Lt(const xvector<T>& r) const { return compare(r) < 0; }
-  /// Whether [r1, r2) stands at index offset. @pre "0 <= offset && offset <= size()"
+  /// Whether [r1, r2) stands at index offset. @pre "0 <= offset && offset <= size()", then "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> bool contains(It r1, It r2, ssize_t offset) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
+    MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return IsPrefix(begin() + offset, end(), AsConst(r1), AsConst(r2));
   }
 
@@ -639,7 +646,8 @@ public:
   /// Reverse searches go from index offset, npos being that of the last element, down to 0.
   /// @pre "offset == npos || (0 <= offset && offset < size())"
   ///
-  /// A pointer and count is checked first. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// A pointer and count is checked first, a range last. @pre "pn == 0 || (pn > 0 && p != nullptr)", "r1 <=
+  /// r2"
   /// @{
 
   /// The first occurrence. An empty range is found at offset.
@@ -649,6 +657,7 @@ public:
   }
   template <class It, detail::IfIterator<It> = 0> ssize_t find(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
+    MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     if (r1 == r2)
       return offset;
     return Index(FindFirstSubSequence(begin() + offset, end(), AsConst(r1), AsConst(r2)), end());
@@ -679,6 +688,7 @@ public:
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_first_of(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
+    MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return Index(FindFirstOf(begin() + offset, end(), AsConst(r1), AsConst(r2)), end());
   }
   ssize_t find_first_of(const xvector<T>& r, ssize_t offset = 0) {
@@ -696,6 +706,7 @@ public:
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_first_not_of(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
+    MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return Index(FindFirstNotOf(begin() + offset, end(), AsConst(r1), AsConst(r2)), end());
   }
   ssize_t find_first_not_of(const xvector<T>& r, ssize_t offset = 0) {
@@ -711,6 +722,7 @@ public:
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_last_of(It r1, It r2, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
+    MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return Index(FindLastOf(begin(), After(offset), AsConst(r1), AsConst(r2)), After(offset));
   }
   ssize_t find_last_of(const xvector<T>& r, ssize_t offset = npos) const {
@@ -728,6 +740,7 @@ public:
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_last_not_of(It r1, It r2, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
+    MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return Index(FindLastNotOf(begin(), After(offset), AsConst(r1), AsConst(r2)), After(offset));
   }
   ssize_t find_last_not_of(const xvector<T>& r, ssize_t offset = npos) const {
@@ -920,6 +933,7 @@ template <class T>
 template <class It, detail::IfIterator<It>>
 ssize_t xvector<T>::rfind(It r1, It r2, ssize_t offset) const {
   MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
+  MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
   if (r1 == r2)
     return offset == npos ? size() : offset;
   const ssize_t pn = std::distance(r1, r2);

@@ -82,6 +82,12 @@ public:
 
   void PutText(const char* p, ssize_t pn) { *this << std::string_view(p, static_cast<std::size_t>(pn)); }
 
+  /// Forgets that the sink has failed: it has been told, and may have recovered.
+  IndentingOutputStreamToOStream& Ready() {
+    clear();
+    return *this;
+  }
+
   IndentingBuffer buffer;
 };
 
@@ -97,46 +103,46 @@ void xostream::close() {
 
 void xostream::write(const xchar* p, ssize_t pn) {
   MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
-  m_os->write(p, pn);
+  m_os->Ready().write(p, pn);
 }
 void xostream::writebytes(const uint8* p, ssize_t pn) { write(reinterpret_cast<const xchar*>(p), pn); }
 
-void xostream::put(bool x) { *m_os << x; }
-void xostream::put(char x) { *m_os << x; }
-void xostream::put(signed char x) { *m_os << x; }
-void xostream::put(unsigned char x) { *m_os << x; }
-void xostream::put(wchar_t x) { m_os->PutCodePoint(static_cast<char32_t>(x)); }
-void xostream::put(char16_t x) { m_os->PutCodePoint(x); }
-void xostream::put(char32_t x) { m_os->PutCodePoint(x); }
-void xostream::put(short x) { *m_os << x; }
-void xostream::put(unsigned short x) { *m_os << x; }
-void xostream::put(int x) { *m_os << x; }
-void xostream::put(unsigned int x) { *m_os << x; }
-void xostream::put(long x) { *m_os << x; }
-void xostream::put(unsigned long x) { *m_os << x; }
-void xostream::put(long long x) { *m_os << x; }
-void xostream::put(unsigned long long x) { *m_os << x; }
-void xostream::put(float x) { *m_os << x; }
-void xostream::put(double x) { *m_os << x; }
-void xostream::put(long double x) { *m_os << x; }
-void xostream::put(const void* x) { *m_os << x; }
+void xostream::put(bool x) { m_os->Ready() << x; }
+void xostream::put(char x) { m_os->Ready() << x; }
+void xostream::put(signed char x) { m_os->Ready() << x; }
+void xostream::put(unsigned char x) { m_os->Ready() << x; }
+void xostream::put(wchar_t x) { m_os->Ready().PutCodePoint(static_cast<char32_t>(x)); }
+void xostream::put(char16_t x) { m_os->Ready().PutCodePoint(x); }
+void xostream::put(char32_t x) { m_os->Ready().PutCodePoint(x); }
+void xostream::put(short x) { m_os->Ready() << x; }
+void xostream::put(unsigned short x) { m_os->Ready() << x; }
+void xostream::put(int x) { m_os->Ready() << x; }
+void xostream::put(unsigned int x) { m_os->Ready() << x; }
+void xostream::put(long x) { m_os->Ready() << x; }
+void xostream::put(unsigned long x) { m_os->Ready() << x; }
+void xostream::put(long long x) { m_os->Ready() << x; }
+void xostream::put(unsigned long long x) { m_os->Ready() << x; }
+void xostream::put(float x) { m_os->Ready() << x; }
+void xostream::put(double x) { m_os->Ready() << x; }
+void xostream::put(long double x) { m_os->Ready() << x; }
+void xostream::put(const void* x) { m_os->Ready() << x; }
 void xostream::put(ConstString8Z x) {
   MIREL_ASSERT(x);
-  *m_os << x;
+  m_os->Ready() << x;
 }
 void xostream::put(const char8* p, ssize_t pn) { put_internal(p, pn, width()); }
 void xostream::put_internal(const xchar* p, ssize_t pn, ssize_t width) {
   MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
   m_os->width(width);
-  m_os->PutText(p, pn);
+  m_os->Ready().PutText(p, pn);
 }
 
-void xostream::flush() { m_os->flush(); }
+void xostream::flush() { m_os->Ready().flush(); }
 void xostream::endl() {
-  m_os->put('\n');
+  m_os->Ready().put('\n');
   flush();
 }
-void xostream::ends() { m_os->put('\0'); }
+void xostream::ends() { m_os->Ready().put('\0'); }
 
 streamsize xostream::precision() const { return m_os->precision(); }
 streamsize xostream::precision(streamsize x) { return m_os->precision(x); }
