@@ -6,6 +6,7 @@
 
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstring>
 #include <initializer_list>
@@ -247,11 +248,11 @@ public:
     MIREL_ASSERT(size >= 0);
     m_buffer.reserve(Bytes(size));
   }
-  ssize_t capacity() const { return m_buffer.capacity() / S; }
+  ssize_t capacity() const { return Elements(m_buffer.capacity()); }
   /// Drops elements at the end, or adds elements equal to x there. @pre "newSize >= 0"
   void resize(ssize_t newSize, const T& x);
   bool empty() const { return m_buffer.empty(); }
-  ssize_t size() const { return m_buffer.size() / S; }
+  ssize_t size() const { return Elements(m_buffer.size()); }
   ssize_t length() const { return size(); }
 
   /// @}
@@ -784,6 +785,8 @@ private:
       throw std::bad_alloc();
     return count * S;
   }
+  /// And back. Without a sign it is a shift, and compilers see that it is never negative.
+  static ssize_t Elements(ssize_t bytes) { return ssize_t(static_cast<std::size_t>(bytes) / sizeof(T)); }
   /// False for a reversed range of pointers; of other iterators nothing is known.
   template <class It> static bool IsRange(It r1, It r2) {
     if constexpr (std::is_pointer_v<It>)
@@ -911,13 +914,9 @@ void xvector<T>::push_back(ssize_t count, It r1, It r2) {
 
 template <class T> ssize_t xvector<T>::FindAndErase(const T& x) {
   const T value = x; // x may be an element that is overwritten on the way
-  T* kept = begin();
-  T* const last = end();
-  for (const T* p = kept; p != last; ++p)
-    if (*p != value)
-      *kept++ = *p;
-  const ssize_t count = last - kept;
-  erase(kept, last);
+  T* const kept = std::remove(begin(), end(), value);
+  const ssize_t count = end() - kept;
+  erase(kept, end());
   return count;
 }
 
