@@ -194,11 +194,21 @@ template <class T, detail::IfCodeUnit<T> = 0> const T* FindLast(const T* i1, con
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return y1 == y2 ? x1 : detail::ByBlock<T>::FindFirstSubSequence(x1, x2, y1, y2);
+  if (y1 != y2 && !detail::IsShort(x1, x2))
+    return detail::ByBlock<T>::FindFirstSubSequence(x1, x2, y1, y2);
+  for (const T* p = x1; x2 - p >= y2 - y1; ++p)
+    if (IsPrefix(p, x2, y1, y2))
+      return p;
+  return x2;
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return y1 == y2 ? x2 : detail::ByBlock<T>::FindLastSubSequence(x1, x2, y1, y2);
+  if (y1 != y2 && !detail::IsShort(x1, x2))
+    return detail::ByBlock<T>::FindLastSubSequence(x1, x2, y1, y2);
+  for (ssize_t i = (x2 - x1) - (y2 - y1); i >= 0; --i)
+    if (IsPrefix(x1 + i, x2, y1, y2))
+      return x1 + i;
+  return x2;
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindFirstOf(const T* x1, const T* x2, const T* y1, const T* y2) {

@@ -64,8 +64,7 @@ template <ssize_t n, class T> bool IsAscii(const T* p) {
   return (bits & kNotAscii) == 0;
 }
 
-/// Converts n units of ASCII. They are copied first, since for all the compiler knows bytes at p are those at
-/// out.
+/// Converts n units of ASCII, through a copy: for all the compiler knows, bytes at p are those at out.
 template <ssize_t n, class CharOut, class CharIn> void CopyAscii(CharOut* out, const CharIn* p) {
   CharIn units[std::size_t(n)];
   std::memcpy(units, p, sizeof(units));
@@ -195,9 +194,9 @@ char8* EncodeTriple(unsigned unit, char8* out) {
 template <class CharOut, class CharIn>
 bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen) {
   MIREL_ASSERT(srcLen >= 0);
-  const CharIn* const end = src + srcLen;
   result.clear();
   result.reserve(srcLen);
+  const CharIn* const end = src + srcLen;
   bool isWellFormed = true;
   for (const CharIn* p = src; p != end && isWellFormed;) {
     CharOut chunk[kExpansion * (kChunk + kLookahead)];
