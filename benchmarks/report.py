@@ -20,6 +20,7 @@ matplotlib.use("Agg")
 import matplotlib.pyplot as plt
 
 GOALS = pathlib.Path(__file__).with_name("goals.csv")
+NOTES = pathlib.Path(__file__).with_name("notes.md")
 LISTED_SIZES = {"12", "65536", "1000", "200000"}
 
 
@@ -122,7 +123,7 @@ def main():
              f"- command: `./dev bench`, {repetitions} repetitions of each party, interleaved at random",
              f"- rows with a goal: {total}, of which below it in at least one column: {below}", "",
              "![ratios](benchmarks.png)", "", "## Work that has goals, and its kin", "", *listed, "",
-             "## Other sizes", "", *others, ""]
+             NOTES.read_text(), "## Other sizes", "", *others, ""]
     (output / "benchmarks.md").write_text("\n".join(lines))
     plot(runs, output / "benchmarks.png")
     print(f"{total} rows with a goal, {below} below it; see {output}/benchmarks.md")
