@@ -20,9 +20,9 @@ printf '%s' "$text" >in
 for encoding in utf-16le utf-16be; do
   iconv -f utf-8 -t $encoding in >wanted
   check "to $encoding" 0 "$transcode" --to $encoding in
-  expect "to $encoding" "$(xxd -p out)" "$(xxd -p wanted)"
+  expect "to $encoding" "$(od -An -tx1 out)" "$(od -An -tx1 wanted)"
   check "from $encoding" 0 "$transcode" --from $encoding -o back wanted
-  expect "from $encoding" "$(xxd -p back)" "$(xxd -p in)"
+  expect "from $encoding" "$(od -An -tx1 back)" "$(od -An -tx1 in)"
 done
 check "a stream" 0 "$transcode" - <in
 expect "a stream" "$(cat out)" "$(cat in)"
