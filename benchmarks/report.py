@@ -69,7 +69,7 @@ def table(runs, goals, keep):
             ratios = [ratio(runs[n][case]["ours"], runs[n][case][peer]) for n in names]
             goal, reason = goal_of(goals, case, peer)
             cells = [f"{r:.2f} ({low:.2f} to {high:.2f})" for r, low, high in ratios]
-            missed = goal is not None and min(r for r, _, _ in ratios) < goal
+            missed = goal is not None and min(round(r, 2) for r, _, _ in ratios) < goal
             total += goal is not None
             below += missed
             note = (reason or "below") if missed else ""
@@ -116,7 +116,7 @@ def main():
     lines = ["# Benchmarks", "",
              "Each number is a peer's time divided by ours on the same data in the same run: above 1 we are ahead.",
              "In brackets is the spread of the ratio over single repetitions. Absolute times on a shared machine mean",
-             "little, so there are none. A row that is below its goal in any column says why.", "",
+             "little, so the tables have none. A row that is below its goal in any column says why.", "",
              f"- machine: {cpu}, {context['num_cpus']} cores at about {context['mhz_per_cpu']} MHz",
              "- columns: the compiler and optimisation of the program; the library is a release build (-O3) by the "
              "same compiler",

@@ -151,9 +151,10 @@ string8 ReadInput(const std::string& name) {
 
 /// Writes a regular file under another name first, so that the old content is lost only to the whole new one.
 void ReplaceFile(const std::string& name, const string8& bytes) {
-  struct stat old;
+  struct stat old, link;
   const bool exists = stat(name.c_str(), &old) == 0;
-  if (exists && !S_ISREG(old.st_mode))
+  const bool isDangling = !exists && lstat(name.c_str(), &link) == 0;
+  if (isDangling || (exists && !S_ISREG(old.st_mode)))
     return File(std::fopen(name.c_str(), "wb"), name).WriteAll(bytes);
 
   std::string target = name;

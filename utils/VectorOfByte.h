@@ -157,8 +157,7 @@ template <class It1, class It2> It1 FindLastNotOf(It1 x1, It1 x2, It2 y1, It2 y2
 
 namespace detail {
 
-/// The searches above, for code units and by blocks of them, which takes ranges that are longer than a few
-/// units.
+/// The searches and the order above for code units, by blocks of them.
 template <class T> struct MIREL_API ByBlock {
   static const T* Find(const T* i1, const T* i2, T v);
   static const T* FindLast(const T* i1, const T* i2, T v);

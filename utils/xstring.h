@@ -109,6 +109,7 @@ public:
 
   using Base::operator+=;
   basic_xstring<T>& operator+=(const T* s) { return append(s); }
+  basic_xstring<T>& operator+=(std::nullptr_t) = delete;
   template <class X, detail::IfIntegers<X> = 0> xvector<T>& operator+=(X x) { return Base::operator+=(T(x)); }
   using Base::append;
   basic_xstring<T>& append(const T* s) {

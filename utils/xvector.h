@@ -814,7 +814,7 @@ private:
       return it;
   }
 
-  // Every edit but push_back of one element resizes a run of elements and overwrites it.
+  // Whatever inserts, assigns or replaces more than one element resizes a run of elements and overwrites it.
   T* ResizeRun(ssize_t i, ssize_t n, ssize_t newN);
   void ReplaceRun(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRun(ssize_t i, ssize_t n, ssize_t count, T x);

@@ -1,14 +1,14 @@
 // The searches and comparisons for pointers to code units.
 //
-// A loop that leaves at the first hit isn't vectorised by compilers. These look at a block of fixed size at a
-// time and only ask whether there is a hit in it, without leaving early; that every compiler turns into a few
-// wide instructions. What is near the start of a range, and the block that has the hit, are left to the plain
-// loops: they say where it is, and are quicker where it is close.
+// A loop that leaves at the first hit isn't vectorised by most compilers. These look at a block of fixed size
+// at a time and only ask whether there is a hit in it, without leaving early; that every compiler turns into
+// a few wide instructions. What is near the start of a range, and the block that has the hit, are left to the
+// plain loops: they say where it is, and are quicker where it is close.
 //
-// Two things here look as if they could be simplified, and are measured. Where a loop over a block isn't
-// inlined, one compiler would merge it with the loop around it and then not use wide instructions. Where bits
-// that were collected become a bool by a cast, comparing them with 0 would make another collect them as ints.
-// Either costs a factor of five.
+// Two things here look as if they could be simplified, and are measured: either costs a factor of five. The
+// loops marked noinline one compiler would otherwise merge with the loop around them, and then not use wide
+// instructions. Collected bits become a bool by a cast, because for a comparison with 0 another would collect
+// them as ints.
 
 #include <utils/VectorOfByte.h>
 

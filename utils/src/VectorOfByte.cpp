@@ -30,8 +30,9 @@ void FillBytes(uint8* dst, ssize_t n, uint8 x) {
 }
 
 /// Makes room for n bytes in all. This is where growth is decided, for all edits but push_back of an element,
-/// which follows the same rule inline: the new size plus the old capacity. The capacity at least doubles, so
-/// a run of edits moves each byte a constant number of times on average; a first request is granted exactly.
+/// which follows the same rule inline (where no sum of two sizes can overflow): the new size plus the old
+/// capacity. The capacity at least doubles, so a run of edits moves each byte a constant number of times on
+/// average; a first request is granted exactly.
 void GrowTo(const VectorOfByte& buffer, ssize_t n) {
   const ssize_t capacity = buffer.capacity();
   if (capacity < n)

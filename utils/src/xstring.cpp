@@ -166,10 +166,13 @@ char8* EncodeTriple(unsigned unit, char8* out) {
       const auto ascii = ConvertAscii(p, stop, out);
       p = ascii.p, out = ascii.out;
     } else if (a < 0x800) {
-      out[0] = static_cast<char8>(0xC0 | a >> 6);
-      out[1] = Tail(a);
-      out += 2;
-      ++p;
+      unsigned unit = a;
+      do { // letters of most scripts with two bytes come in words
+        out[0] = static_cast<char8>(0xC0 | unit >> 6);
+        out[1] = Tail(unit);
+        out += 2;
+        unit = *++p;
+      } while (p < stop && unit >= 0x80 && unit < 0x800);
     } else if (!IsSurrogate(a)) {
       out = EncodeTriple(a, out);
       ++p;
