@@ -26,7 +26,8 @@ template <class T> basic_xstring<T> Of(const std::string& text) {
 }
 
 template <class T> std::basic_string<T> Std(const xvector<T>& v) {
-  return v.empty() ? std::basic_string<T>() : std::basic_string<T>(v.begin(), v.end()); // null pointers won't do
+  return v.empty() ? std::basic_string<T>()
+                   : std::basic_string<T>(v.begin(), v.end()); // null pointers won't do
 }
 
 /// Every test of a template runs for both widths.
