@@ -9,7 +9,6 @@ ratio is taken of the medians, and the spread is that of the ratios of single re
 
 import csv
 import json
-import math
 import pathlib
 import statistics
 import sys
@@ -42,9 +41,9 @@ def ratio(ours, theirs):
 
 
 def read_goals():
-    """{(work, size, width, peer): (goal, reason)}; an empty field stands for any."""
+    """The rows of the goals, of which the first that fits holds; a field is part of a name, an empty one of any."""
     with GOALS.open(newline="") as file:
-        return [row for row in csv.DictReader(file)]
+        return list(csv.DictReader(file))
 
 
 def goal_of(goals, case, peer):

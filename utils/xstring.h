@@ -32,7 +32,8 @@ inline ssize_t GetStringLength(const char16* s) {
 /// arguments, memory, invalidation and aliasing holds.
 ///
 /// A zero-terminated argument (`const T*` without a count) must not be null, and ends before its first zero;
-/// it is measured once, before anything is checked or changed, and then treated as a pointer and count.
+/// it is measured once, before anything is checked or changed, and then treated as a pointer and count. The
+/// deleted overloads keep a literal null from being one.
 template <class T> class MIREL_API basic_xstring : public xvector<T> {
   typedef xvector<T> Base;
 
@@ -57,8 +58,7 @@ public:
   /// @pre "r1 <= r2"
   basic_xstring(const T* r1, const T* r2) : Base(r1, r2) {}
   basic_xstring(const basic_xstring<T>& r) : Base(r) {}
-  /// The units of a vector, such as the result of operator+. A template, so that braces are never taken for
-  /// one.
+  /// The units of a vector, as operator+ returns it. A template, so that braces are never taken for one.
   template <class V, std::enable_if_t<std::is_same_v<V, xvector<T>>, int> = 0>
   basic_xstring(const V& r) : Base(r) {}
   ~basic_xstring() {}

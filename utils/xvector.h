@@ -218,9 +218,7 @@ public:
   /// count elements equal to x. @pre "0 <= count"
   explicit xvector(ssize_t count, const T& x) {
     MIREL_ASSERT(0 <= count);
-    const T value = x;
-    m_buffer.growbytes(Bytes(count));
-    p_create(data(), data_end(), value);
+    FillRun(0, 0, count, x);
   }
   xvector(int count, const T& x) : xvector(ssize_t(count), x) {}
   template <class N, class X, detail::IfIntegers<N, X> = 0>
@@ -814,7 +812,8 @@ private:
       return it;
   }
 
-  // Whatever inserts, assigns or replaces more than one element resizes a run of elements and overwrites it.
+  // Whatever inserts, assigns or replaces resizes a run of elements and overwrites it. Only push_back of one
+  // element is the buffer's own.
   T* ResizeRun(ssize_t i, ssize_t n, ssize_t newN);
   void ReplaceRun(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRun(ssize_t i, ssize_t n, ssize_t count, T x);
@@ -869,8 +868,7 @@ template <class T> void xvector<T>::ReplaceRun(ssize_t i, ssize_t n, const T* p,
   p_copy(run, p, p + pn);
 }
 
-/// Puts count elements of value x in the place of the n at index i. x is passed by value: it may be one of
-/// them.
+/// Puts count elements of value x in the place of the n at index i. x comes by value: it may be one of them.
 template <class T> void xvector<T>::FillRun(ssize_t i, ssize_t n, ssize_t count, T x) {
   T* const run = ResizeRun(i, n, count);
   p_create(run, run + count, x);
