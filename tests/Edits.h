@@ -1,0 +1,163 @@
+// Edits of a string and, beside it, of a standard one. What is edited, and how, is decided by numbers: random
+// ones in the suite, an input's bytes under a fuzzer.
+
+#pragma once
+
+#include <algorithm>
+
+#include "Support.h"
+
+/// Makes text of a few different units, so that they meet often.
+template <class T, class Numbers> class TextMaker {
+public:
+  using S = basic_xstring<T>;
+  using Model = std::basic_string<T>;
+
+  explicit TextMaker(Numbers& numbers) : m_numbers(numbers) {}
+
+  /// From 0 to max.
+  ssize_t Number(ssize_t max) { return m_numbers(max); }
+  T Unit() { return static_cast<T>(kAlphabet[Number(3)]); }
+  Model Text(ssize_t max) {
+    Model text;
+    for (ssize_t n = Number(max); n > 0; --n)
+      text.push_back(Unit());
+    return text;
+  }
+
+private:
+  static constexpr unsigned kAlphabet[] = {'a', 'b', 0,
+                                           sizeof(T) == 1 ? 0xE9 : 0x61E9}; // both bytes of one are units too
+  Numbers& m_numbers;
+};
+
+template <class T, class Numbers> class Edits : TextMaker<T, Numbers> {
+public:
+  using typename TextMaker<T, Numbers>::S;
+  using M = typename TextMaker<T, Numbers>::Model;
+  using TextMaker<T, Numbers>::TextMaker;
+
+  /// Makes one edit of both, and compares them.
+  void Step() {
+    if (v.size() > 80)
+      S().swap(v), m.clear();
+    const ssize_t size = v.size(), i = this->Number(size), n = this->Number(size - i),
+                  count = this->Number(4);
+    const ssize_t ri = this->Number(size), rn = this->Number(size - ri);
+    const M text = this->Text(9), own = m.substr(size_t(ri), size_t(rn));
+    const S r(text.data(), static_cast<ssize_t>(text.size()));
+    const M zeroTerminated = m.substr(size_t(ri), std::min(m.find(T(0), size_t(ri)), m.size()) - size_t(ri));
+    const T x = this->Unit(), own1 = n > 0 ? m[size_t(i)] : x;
+    const T& x1 = n > 0 ? v[i] : x; // own and own1 are copies of what p and x1 stand for in the vector
+    const T* const p = v.data() + ri;
+    const auto at = v.begin() + i;
+    // Every edit replaces len elements at pos with some text.
+    const auto becomes = [&](ssize_t pos, ssize_t len, const M& with) {
+      m.replace(size_t(pos), size_t(len), with);
+    };
+    const auto without = [&](T c) { return M(m.begin(), std::remove(m.begin(), m.end(), c)); };
+    const auto times = [](ssize_t k, T c) { return M(size_t(k), c); };
+    const ssize_t what = this->Number(35);
+    switch (what) {
+    case 0: v.push_back(x1), becomes(size, 0, {own1}); break;
+    case 1: v.append(r), becomes(size, 0, text); break;
+    case 2: v.append(count, x), becomes(size, 0, times(count, x)); break;
+    case 3: v.insert(i, r), becomes(i, 0, text); break;
+    case 4: v.insert(i, x1), becomes(i, 0, {own1}); break;
+    case 5: v.insert(i, count, x1), becomes(i, 0, times(count, own1)); break;
+    case 6: becomes(v.insert(at, x1) - v.begin(), 0, {own1}); break;
+    case 7: v.replace(i, n, r), becomes(i, n, text); break;
+    case 8: v.replace(i, n, count, x1), becomes(i, n, times(count, own1)); break;
+    case 9: v.replace(at, at + n, r), becomes(i, n, text); break;
+    case 10: v.replace(at, at + n, count, x), becomes(i, n, times(count, x)); break;
+    case 11: v.replace(at, at + n, p, rn), becomes(i, n, own); break;
+    case 12: v.erase(i, n), becomes(i, n, {}); break;
+    case 13: v.erase_range(i, i + n), becomes(i, n, {}); break;
+    case 14: v.resize(i, x), becomes(i, size - i, {}); break;
+    case 15: v.resize(size + count, x1), becomes(size, 0, times(count, own1)); break;
+    case 16: v.assign(count, x1), becomes(0, size, times(count, own1)); break;
+    case 17: v.assign(v, ri, rn), becomes(0, size, own); break;
+    case 18: v = v + r, becomes(size, 0, text); break;
+    case 19: v.append(p, rn), becomes(size, 0, own); break;
+    case 20: v.append(v, ri, rn), becomes(size, 0, own); break;
+    case 21: v.insert(i, p, rn), becomes(i, 0, own); break;
+    case 22: v.insert(i, v, ri, rn), becomes(i, 0, own); break;
+    case 23: v.replace(i, n, p, rn), becomes(i, n, own); break;
+    case 24: v.replace(i, n, v, ri, rn), becomes(i, n, own); break;
+    case 25: v.push_back(2, p, p + rn), becomes(size, 0, own + own); break;
+    case 26: v += v, becomes(size, 0, M(m)); break;
+    case 27: v.insert(i, v.begin(), v.end()), becomes(i, 0, M(m)); break;
+    case 28:
+      ASSERT_EQ(v.FindAndErase(x1), std::count(m.begin(), m.end(), own1));
+      becomes(0, size, without(own1));
+      break;
+    case 29: v.resize(i, x), m.resize(size_t(i)), v *= 2, becomes(i, 0, M(m)); break;
+    case 30:
+      if (n > 0)
+        becomes(v.erase(at) - v.begin(), 1, {}), v.push_front(x), v.pop_front();
+      break;
+    case 31:
+      EXPECT_EQ(v.FindAndEraseFirst(x), m.rfind(x) != m.npos);
+      m.erase(std::min(m.rfind(x), m.size()), 1);
+      break;
+    case 32: v.append(v.c_str() + ri), becomes(size, 0, zeroTerminated); break;
+    case 33: v.assign(v.c_str() + ri), becomes(0, size, zeroTerminated); break;
+    case 34: v.insert(i, v.c_str() + ri), becomes(i, 0, zeroTerminated); break;
+    case 35: v.replace(i, n, v.c_str() + ri), becomes(i, n, zeroTerminated); break;
+    }
+    ASSERT_EQ(Std(v), m) << "edit " << what;
+    ASSERT_TRUE(v.size() <= v.capacity() && v.empty() == m.empty() && v.end() - v.begin() == v.size());
+    if (this->Number(3) == 0)
+      return S(v).swap(v); // without spare storage, so that the next edit has to move it
+    const T* const z = v.c_str();
+    ASSERT_TRUE(z == v.data() && z[v.size()] == 0 && v.capacity() > v.size() && Std(v) == m);
+  }
+
+private:
+  S v;
+  M m;
+};
+
+template <class T, class Numbers> class Searches : TextMaker<T, Numbers> {
+public:
+  using typename TextMaker<T, Numbers>::S;
+  using TextMaker<T, Numbers>::TextMaker;
+
+  /// Searches text of up to so many units for some other.
+  void Step(ssize_t longest) {
+    const auto sign = [](int x) { return (x > 0) - (x < 0); };
+    const auto text = this->Text(longest);
+    const auto pattern = this->Text(3);
+    S v(text.data(), static_cast<ssize_t>(text.size()));
+    S r(pattern.data(), static_cast<ssize_t>(pattern.size()));
+    const ssize_t forward = this->Number(v.size());
+    const ssize_t reverse = v.empty() ? kNpos : this->Number(v.size()) - 1;
+    const auto uf = static_cast<std::size_t>(forward), ur = static_cast<std::size_t>(reverse);
+    const T c = this->Unit();
+    const auto is = [](ssize_t ours, std::size_t theirs) { return ours == static_cast<ssize_t>(theirs); };
+    ASSERT_PRED2(is, v.find(c, forward), text.find(c, uf));
+    ASSERT_PRED2(is, v.find(r, forward), text.find(pattern, uf));
+    ASSERT_PRED2(is, v.rfind(c, reverse), text.rfind(c, ur));
+    ASSERT_PRED2(is, v.rfind(r, reverse), text.rfind(pattern, ur));
+    ASSERT_PRED2(is, v.find_first_of(r, forward), text.find_first_of(pattern, uf));
+    ASSERT_PRED2(is, v.find_first_not_of(r, forward), text.find_first_not_of(pattern, uf));
+    ASSERT_PRED2(is, v.find_first_not_of(c, forward), text.find_first_not_of(c, uf));
+    ASSERT_PRED2(is, v.find_last_of(r, reverse), text.find_last_of(pattern, ur));
+    ASSERT_PRED2(is, v.find_last_not_of(r, reverse), text.find_last_not_of(pattern, ur));
+    ASSERT_PRED2(is, v.find_last_not_of(c, reverse), text.find_last_not_of(c, ur));
+    ASSERT_EQ(v.contains(r.begin(), r.end(), forward), text.compare(uf, pattern.size(), pattern) == 0);
+    ASSERT_EQ(Std(v.substr(forward, kNpos)), text.substr(uf));
+    const auto other = std::basic_string<T>(this->Text(12));
+    const S o(other.data(), static_cast<ssize_t>(other.size()));
+    const auto u = [](T x) { return static_cast<std::make_unsigned_t<T>>(x); };
+    const auto less = [&](T a, T b) { return u(a) < u(b); };
+    const bool before =
+        std::lexicographical_compare(text.begin(), text.end(), other.begin(), other.end(), less);
+    const int expected = before ? -1 : text != other;
+    ASSERT_EQ(sign(v.compare(o)), expected);
+    ASSERT_EQ(sign(v.compare(0, v.size(), o, 0, o.size())), expected);
+    ASSERT_EQ(sign(v.compare(o.data(), o.size())), expected);
+    ASSERT_TRUE(v._Eq(o) == (expected == 0) && v._Lt(o) == (expected < 0));
+    ASSERT_TRUE(sizeof(T) == 1 || v.compare(o) == expected);
+  }
+};

@@ -1,0 +1,99 @@
+// The conversions' oracle, written from the Unicode Standard: table 3-7 lists the well-formed UTF-8 sequences
+// by their first two bytes, definition D91 the surrogate pairs. It decodes one code point at a time.
+
+#pragma once
+
+#include <string_view>
+
+#include "Support.h"
+
+namespace oracle {
+
+template <class T> using View = std::basic_string_view<T>;
+template <class T> using Text = std::basic_string<T>;
+
+struct Row {
+  int first, last, secondFirst, secondLast;
+  std::size_t length;
+};
+constexpr Row kTable[] = {
+    {0x00, 0x7F, 0, 0, 1},       {0xC2, 0xDF, 0x80, 0xBF, 2}, {0xE0, 0xE0, 0xA0, 0xBF, 3},
+    {0xE1, 0xEC, 0x80, 0xBF, 3}, {0xED, 0xED, 0x80, 0x9F, 3}, {0xEE, 0xEF, 0x80, 0xBF, 3},
+    {0xF0, 0xF0, 0x90, 0xBF, 4}, {0xF1, 0xF3, 0x80, 0xBF, 4}, {0xF4, 0xF4, 0x80, 0x8F, 4}};
+
+/// The length of the well-formed sequence that text begins with, 0 if there is none.
+inline std::size_t SequenceLength(View<char8> text) {
+  const auto byte = [&](std::size_t i) { return i < text.size() ? static_cast<unsigned char>(text[i]) : -1; };
+  for (const Row& row : kTable) {
+    if (byte(0) < row.first || byte(0) > row.last)
+      continue;
+    bool ok = row.length == 1 || (byte(1) >= row.secondFirst && byte(1) <= row.secondLast);
+    for (std::size_t i = 2; i < row.length; ++i)
+      ok = ok && byte(i) >= 0x80 && byte(i) <= 0xBF;
+    return ok ? row.length : 0;
+  }
+  return 0;
+}
+
+inline void Put(Text<char8>& text, char32_t c) {
+  const auto tail = [&](int shift) { text += static_cast<char8>(0x80 | (c >> shift & 0x3F)); };
+  if (c < 0x80)
+    text += static_cast<char8>(c);
+  else if (c < 0x800)
+    text += static_cast<char8>(0xC0 | c >> 6), tail(0);
+  else if (c < 0x10000)
+    text += static_cast<char8>(0xE0 | c >> 12), tail(6), tail(0);
+  else
+    text += static_cast<char8>(0xF0 | c >> 18), tail(12), tail(6), tail(0);
+}
+
+inline void Put(Text<char16>& units, char32_t c) {
+  if (c >= 0x10000)
+    units += static_cast<char16>(0xD800 + ((c - 0x10000) >> 10)), c = 0xDC00 + ((c - 0x10000) & 0x3FF);
+  units += static_cast<char16>(c);
+}
+
+constexpr bool IsLead(char32_t c) { return c >= 0xD800 && c <= 0xDBFF; }
+constexpr bool IsTrail(char32_t c) { return c >= 0xDC00 && c <= 0xDFFF; }
+
+/// Makes out what the conversion of source comes to; whether it is well-formed.
+inline bool Convert(Text<char16>& out, View<char8> source) {
+  out.clear();
+  for (std::size_t n; !source.empty(); source.remove_prefix(n)) {
+    if ((n = SequenceLength(source)) == 0)
+      return false;
+    char32_t c = static_cast<unsigned char>(source[0]) & (n == 1 ? 0x7Fu : 0xFFu >> (n + 1));
+    for (std::size_t i = 1; i < n; ++i)
+      c = c << 6 | (static_cast<unsigned char>(source[i]) & 0x3F);
+    Put(out, c);
+  }
+  return true;
+}
+inline bool Convert(Text<char8>& out, View<char16> source) {
+  out.clear();
+  for (std::size_t i = 0; i < source.size(); ++i) {
+    const char32_t a = source[i], b = i + 1 < source.size() ? source[i + 1] : 0u;
+    if (IsTrail(a) || (IsLead(a) && !IsTrail(b)))
+      return false;
+    Put(out, IsLead(a) ? 0x10000 + ((a - 0xD800) << 10) + (b - 0xDC00) : a);
+    i += IsLead(a);
+  }
+  return true;
+}
+
+/// Converts source, from a destination that held text, and expects what the oracle says.
+template <class CharOut, class CharIn> void Check(View<CharIn> source) {
+  static thread_local basic_xstring<CharOut> dst;
+  static thread_local Text<CharOut> expected;
+  dst.assign(3, 'x');
+  const bool isWellFormed = Convert(expected, source);
+  const bool ok = mirel::UtfToUtf(dst, source.data(), static_cast<ssize_t>(source.size()));
+  const View<CharOut> units(dst.data(), static_cast<std::size_t>(dst.size()));
+  if (ok != isWellFormed || units != expected) // a macro for each would take too long for billions of them
+    FAIL() << testing::PrintToString(source) << (ok ? " is " : " is not ")
+           << "converted: " << testing::PrintToString(units);
+}
+inline void CheckUtf8(View<char8> source) { Check<char16>(source); }
+inline void CheckUtf16(View<char16> source) { Check<char8>(source); }
+
+} // namespace oracle

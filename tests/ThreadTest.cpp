@@ -1,0 +1,46 @@
+// Different objects may be used, and one that nobody changes be read, by different threads at the same time.
+#include "Support.h"
+
+#include <thread>
+#include <vector>
+
+namespace {
+
+template <class F> void InFourThreads(const F& work) {
+  std::vector<std::thread> threads;
+  for (int i = 0; i < 4; ++i)
+    threads.emplace_back(work);
+  for (std::thread& thread : threads)
+    thread.join();
+}
+
+TEST(Thread, UsesItsOwnObjects) {
+  InFourThreads([] {
+    mirel::string16 wide;
+    mirel::string8 text;
+    for (int i = 0; i < 2000; ++i) {
+      text.append("a\u20AC\U0001F600").c_str();
+      ASSERT_TRUE(mirel::Utf16FromUtf8(wide, text.data(), text.size()));
+      wide.insert(0, 3, u'b');
+      ASSERT_TRUE(mirel::Utf8FromUtf16(text, wide.data(), wide.size()));
+      if (text.FindAndErase('b') == 3 && i % 50 == 0)
+        text.erase();
+    }
+  });
+}
+
+TEST(Thread, ReadsWhatOthersRead) {
+  const mirel::string8 text = "never \u20AC changed";
+  const mirel::string16 wide = Of<char16>("never changed");
+  InFourThreads([&] {
+    for (int i = 0; i < 2000; ++i) {
+      mirel::string16 converted;
+      ASSERT_TRUE(mirel::Utf16FromUtf8(converted, text.data(), text.size()));
+      ASSERT_TRUE(text.find("chan") == 10 && text.rfind('n') == 13 && text.compare(text) == 0);
+      ASSERT_TRUE(wide.find_first_of(wide.begin() + 3, wide.end()) == 0 && wide._Eq(mirel::string16(wide)) &&
+                  wide.substr(2, 5).size() == 5 && wide[0] == 'n' && *wide.rbegin() == 'd');
+    }
+  });
+}
+
+} // namespace

@@ -1,0 +1,30 @@
+// Fuzzes the conversions: the first byte is how much ASCII stands before the text, the others are the text.
+#include "../Oracle.h"
+
+namespace {
+
+/// Checks text whole and cut at every place where that can make a difference.
+template <class CharOut, class CharIn> void CheckCuts(std::size_t before, const oracle::Text<CharIn>& text) {
+  const oracle::Text<CharIn> all = oracle::Text<CharIn>(before, 'a') + text;
+  for (std::size_t size = before; size <= all.size(); ++size)
+    oracle::Check<CharOut>(oracle::View<CharIn>(all).substr(0, size));
+}
+
+} // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const unsigned char* data, std::size_t size) {
+  GTEST_FLAG_SET(throw_on_failure, true);
+  if (size == 0 || size > 128)
+    return 0;
+  // Up to where blocks are tried, up to the end of one, and seldom, since that takes long, up to that of a
+  // chunk.
+  static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 3, 12, 15, 30, 40, 44, 1000};
+  const std::size_t before = kBefore[data[0] % std::size(kBefore)];
+  ++data, --size;
+  CheckCuts<char16>(before, oracle::Text<char8>(data, data + size));
+  oracle::Text<char16> units(size / 2, 0);
+  for (std::size_t i = 0; i < units.size(); ++i)
+    units[i] = static_cast<char16>(data[2 * i] | data[2 * i + 1] << 8);
+  CheckCuts<char8>(before, units);
+  return 0;
+}
