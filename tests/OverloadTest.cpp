@@ -16,7 +16,7 @@ using namespace mirel;
 
 namespace {
 
-const ssize_t kIsStillAType = int64{1} + uint16{1} + uint8{1};
+[[maybe_unused]] const ssize_t kIsStillAType = int64{1} + uint16{1} + uint8{1};
 static_assert(std::is_same_v<ssize_t, ::ssize_t> && std::is_same_v<char16, uint16>);
 
 template <class T> class Overload : public testing::Test {};

@@ -15,7 +15,7 @@ TYPED_TEST_SUITE(RangeAlgorithms, CodeUnits);
 
 TYPED_TEST(RangeAlgorithms, OrderUnitsAsUnsigned) {
   const TypeParam low[] = {1, 0x7F};
-  TypeParam high[] = {1, static_cast<TypeParam>(0x80)}; // through non-const pointers, the template
+  static TypeParam high[] = {1, static_cast<TypeParam>(0x80)}; // through non-const pointers, the template
   const TypeParam* const constHigh = high;
   EXPECT_LT(LexicographicalCompareX(low, low + 2, constHigh, constHigh + 2), 0);
   EXPECT_GT(LexicographicalCompareX(high, high + 2, low, low + 2), 0);
@@ -128,7 +128,8 @@ TEST(VectorOfByteTest, ComparesBytes) {
   EXPECT_EQ(a.compare(0, 1, b, 0, 1) + a.compare(1, 0, c) + a.compare(2, 0, nullptr, 0), 0);
   EXPECT_EQ(VectorOfByte(3, 7), (VectorOfByte{7, 7, 7}));
   VectorOfByte d(a.begin(), a.end());
-  d = d;
+  const VectorOfByte& same = d;
+  d = same;
   d.swap(const_cast<VectorOfByte&>(static_cast<const VectorOfByte&>(VectorOfByte())));
   EXPECT_TRUE(d.empty() && d.data() == nullptr);
 }

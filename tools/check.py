@@ -1,0 +1,217 @@
+#!/usr/bin/python3
+"""Builds and tests the library in every way that is promised to work, and prints one table of the results.
+
+usage: check.py [--long] [--list] [WORD...]
+
+With words, only the rows whose names have one of them. --long adds the rows that take many minutes or most of the
+machine's memory. The output of each row is kept in build/check.
+"""
+
+import argparse
+import concurrent.futures
+import json
+import os
+import pathlib
+import re
+import shlex
+import shutil
+import subprocess
+import sys
+import time
+
+ROOT = pathlib.Path(__file__).resolve().parent.parent
+OUT = ROOT / "build" / "check"
+WARNINGS = "-Wall -Wextra -Wpedantic -Wconversion -Wsign-conversion -Wshadow -Werror"
+GTEST_SOURCE = "/usr/src/googletest"
+FUZZERS = ("edits", "conversions")
+FUZZ_SECONDS = 20
+
+
+class Failed(Exception):
+    """A row's command didn't end as it should."""
+
+
+class Row:
+    """A row of the table: its name, what it does, and its log."""
+
+    def __init__(self, name, work):
+        self.name, self.work = name, work
+        self.slug = re.sub(r"[^A-Za-z0-9+]+", "-", name).strip("-")
+        self.dir = OUT / self.slug
+        self.log = OUT / f"{self.slug}.log"
+
+    def run(self, *command, **env):
+        """Runs a command; what it prints goes to the log."""
+        with self.log.open("a") as log:
+            log.write(f"$ {shlex.join(map(str, command))}\n")
+            log.flush()
+            code = subprocess.run(list(map(str, command)), cwd=ROOT, stdin=subprocess.DEVNULL, stdout=log,
+                                  stderr=subprocess.STDOUT, env={**os.environ, **env}).returncode
+        if code != 0:
+            raise Failed(f"exit code {code}: {shlex.join(map(str, command))[:200]}")
+
+    def build(self, *targets, cxx="g++", std=17, flags="", program="", options=()):
+        """Configures and builds a tree of its own, with warnings as errors; program is what only the tests get."""
+        self.run("cmake", "-S", ROOT, "-B", self.dir, "-G", "Ninja", "-DCMAKE_BUILD_TYPE=None",
+                 f"-DCMAKE_CXX_COMPILER={cxx}", f"-DCMAKE_CXX_STANDARD={std}", "-DCMAKE_CXX_EXTENSIONS=OFF",
+                 f"-DCMAKE_CXX_FLAGS={flags}", f"-DMIREL_TEST_FLAGS={program}", "-DMIREL_BUILD_TESTS=ON",
+                 "-DCMAKE_COMPILE_WARNING_AS_ERROR=ON", *options)
+        self.run("cmake", "--build", self.dir, "-j", "1", *(("--target", *targets) if targets else ()))
+
+    def attempt(self):
+        start = time.monotonic()
+        self.log.write_text("")
+        try:
+            note = self.work(self) or ""
+            ok = True
+        except Failed as failure:
+            ok, note = False, str(failure)
+        return self, ok, note, time.monotonic() - start
+
+
+def suite(**how):
+    """A row that builds everything in one way and runs all tests of code."""
+    def work(row):
+        row.build(**how)
+        row.run("ctest", "--test-dir", row.dir, "--output-on-failure", "--no-tests=error", "-LE", "package",
+                ASAN_OPTIONS="allocator_may_return_null=1", UBSAN_OPTIONS="print_stacktrace=1")
+    return work
+
+
+def headers(row):
+    """Every public header alone."""
+    for cxx in ("g++", "clang++", "clang++ -stdlib=libc++"):
+        for std in ("17", "20", "2b"):
+            for header in sorted((ROOT / "utils").glob("*.h")):
+                row.run(*cxx.split(), f"-std=c++{std}", *WARNINGS.split(), "-I.", "-x", "c++", "-include", header,
+                        "-fsyntax-only", "/dev/null")
+
+
+def aarch64(row):
+    """The reference target, under emulation. Boost's headers are shown to the cross compiler without the host's."""
+    boost = OUT / "boost"
+    boost.mkdir(exist_ok=True)
+    if not (boost / "boost").exists():
+        (boost / "boost").symlink_to("/usr/include/boost")
+    suite(cxx="aarch64-linux-gnu-g++", flags="-O2", options=(
+        "-DCMAKE_SYSTEM_NAME=Linux", "-DCMAKE_SYSTEM_PROCESSOR=aarch64", f"-DBoost_INCLUDE_DIR={boost}",
+        "-DCMAKE_CROSSCOMPILING_EMULATOR=qemu-aarch64;-L;/usr/aarch64-linux-gnu",
+        f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}"))(row)
+
+
+def threads(row):
+    row.build("mirel_tests", cxx="clang++", flags="-O1 -g -fsanitize=thread")
+    row.run(row.dir / "tests" / "mirel_tests", "--gtest_filter=Thread*")
+
+
+def valgrind(row):
+    """All but the three-byte sequences, which would take half an hour and do nothing that the others don't."""
+    row.build("mirel_tests", flags="-O1 -g")
+    row.run("valgrind", "-q", "--error-exitcode=9", "--leak-check=full", "--child-silent-after-fork=yes",
+            row.dir / "tests" / "mirel_tests", "--gtest_filter=-Utf.EverySequenceOfUpToThreeBytes", "--gtest_brief=1")
+
+
+def fuzz(row):
+    """Each fuzzer for a short time, from the seeds."""
+    row.run("tools/fuzz.sh", FUZZ_SECONDS)
+
+
+def long_tests(row):
+    """Everything that can be tried, and more than 4 GiB. The rows before it are done: it takes all the memory."""
+    row.build("mirel_long_tests", flags="-O2")
+    row.run(row.dir / "tests" / "mirel_long_tests", "--gtest_brief=1")
+
+
+def mutants(row):
+    row.run("tools/mutants.py")
+    return row.log.read_text().splitlines()[-1]
+
+
+HARDENING = ("-O2 -D_FORTIFY_SOURCE=2 -D_GLIBCXX_ASSERTIONS -fstack-protector-strong -fstack-clash-protection "
+             "-fcf-protection -Wformat -Werror=format-security -fPIE")
+SHARED = "-DBUILD_SHARED_LIBS=ON"
+LIBCXX = {"flags": "-stdlib=libc++", "options": (f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}",)}
+
+
+def libcxx(std, flags, *options):
+    return suite(cxx="clang++", std=std, flags=f"-stdlib=libc++ {flags}",
+                 options=(f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", *options))
+
+
+ROWS = [
+    Row("AArch64 under emulation", aarch64),
+    Row("valgrind", valgrind),
+    Row("headers alone", headers),
+    Row("g++ C++17 -O2", suite(flags="-O2")),
+    Row("g++ C++20 -O3 NDEBUG unsigned char", suite(std=20, flags="-O3 -DNDEBUG -funsigned-char")),
+    Row("g++ C++23 -O0 signed char", suite(std=23, flags="-O0 -fsigned-char")),
+    Row("g++ C++17 shared hardened", suite(flags=HARDENING, options=(
+        SHARED, "-DCMAKE_SHARED_LINKER_FLAGS=-Wl,-z,relro,-z,now", "-DCMAKE_EXE_LINKER_FLAGS=-Wl,-z,relro,-z,now -pie"))),
+    Row("g++ C++20 -O2 NDEBUG in the program only", suite(std=20, flags="-O2", program="-DNDEBUG")),
+    Row("clang++ C++17 -O2 unsigned char", suite(cxx="clang++", flags="-O2 -funsigned-char")),
+    Row("clang++ C++20 -O3 shared, NDEBUG in the library only", suite(
+        cxx="clang++", std=20, flags="-O3 -DNDEBUG", program="-UNDEBUG", options=(SHARED,))),
+    Row("clang++ C++23 -O0", suite(cxx="clang++", std=23, flags="-O0")),
+    Row("clang++ libc++ C++17 -O3 shared", libcxx(17, "-O3", SHARED)),
+    Row("clang++ libc++ C++20 -O2 unsigned char", libcxx(20, "-O2 -funsigned-char")),
+    Row("clang++ libc++ C++23 -O0 NDEBUG", libcxx(23, "-O0 -DNDEBUG")),
+    Row("g++ address, leak, undefined", suite(
+        flags="-O1 -g -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer")),
+    Row("clang++ address, leak, undefined, conversions", suite(
+        cxx="clang++", flags="-O1 -g -fsanitize=address,undefined,implicit-conversion,nullability,local-bounds,"
+        "float-divide-by-zero -fno-sanitize-recover=all -fno-omit-frame-pointer")),
+    Row("clang++ thread", threads),
+    Row("fuzzers", fuzz),
+]
+LONG_ROWS = [
+    Row("mutants", mutants),
+    Row("exhaustive and large", long_tests),
+]
+
+
+def print_row(name, result, seconds, note=""):
+    print(f"{name:<54} {result:<7} {seconds:>6} {note}", flush=True)
+
+
+def run_rows(rows, workers):
+    """Runs the rows, prints each as it ends, and gives the results in the order of the rows."""
+    with concurrent.futures.ThreadPoolExecutor(workers) as pool:
+        pending = [pool.submit(row.attempt) for row in rows]
+        for done in concurrent.futures.as_completed(pending):
+            row, ok, note, seconds = done.result()
+            print_row(row.name, "ok" if ok else "FAILED", f"{seconds:.0f} s", note)
+            if not ok:
+                print("".join(row.log.read_text(errors="replace").splitlines(True)[-40:]), flush=True)
+        return [future.result() for future in pending]
+
+
+def main():
+    parser = argparse.ArgumentParser()
+    parser.add_argument("--long", action="store_true")
+    parser.add_argument("--list", action="store_true")
+    parser.add_argument("words", nargs="*")
+    arguments = parser.parse_args()
+
+    def wanted(row):
+        return not arguments.words or any(word in row.name for word in arguments.words)
+
+    rows = [row for row in ROWS if wanted(row)]
+    long_rows = [row for row in LONG_ROWS if arguments.long and wanted(row)]
+    if arguments.list or not rows + long_rows:
+        print("\n".join(row.name for row in rows + long_rows))
+        return 0 if arguments.list else 2
+    OUT.mkdir(parents=True, exist_ok=True)
+    start = time.monotonic()
+    results = run_rows(rows, os.cpu_count() or 1)
+    results += run_rows(long_rows, 1)
+    failed = sum(not ok for _, ok, _, _ in results)
+    print()
+    print_row("row", "result", "time")
+    for row, ok, note, seconds in results:
+        print_row(row.name, "ok" if ok else "FAILED", f"{seconds:.0f} s", note)
+    print(f"{len(results) - failed} passed, {failed} failed in {time.monotonic() - start:.0f} s; logs in build/check")
+    return failed > 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
