@@ -11,14 +11,24 @@ long count = 0;
 long failAfter = -1;
 } // namespace allocation
 
-extern "C" void* __real_realloc(void* p, std::size_t n);
-extern "C" void* __wrap_realloc(void* p, std::size_t n) {
+// The linker puts the wrapper in the place of realloc in a static library; a shared one finds it in the
+// program.
+#ifdef MIREL_SHARED
+#define REAL_REALLOC __libc_realloc
+#define WRAPPED_REALLOC realloc
+#else
+#define REAL_REALLOC __real_realloc
+#define WRAPPED_REALLOC __wrap_realloc
+#endif
+
+extern "C" void* REAL_REALLOC(void* p, std::size_t n) noexcept;
+extern "C" void* WRAPPED_REALLOC(void* p, std::size_t n) noexcept {
   ++allocation::count;
   if (allocation::failAfter == 0 || n > PTRDIFF_MAX)
     return nullptr;
   if (allocation::failAfter > 0)
     --allocation::failAfter;
-  return __real_realloc(p, n);
+  return REAL_REALLOC(p, n);
 }
 
 namespace {

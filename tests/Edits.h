@@ -57,7 +57,7 @@ public:
     };
     const auto without = [&](T c) { return M(m.begin(), std::remove(m.begin(), m.end(), c)); };
     const auto times = [](ssize_t k, T c) { return M(size_t(k), c); };
-    const ssize_t what = this->Number(35);
+    const ssize_t what = this->Number(36);
     switch (what) {
     case 0: v.push_back(x1), becomes(size, 0, {own1}); break;
     case 1: v.append(r), becomes(size, 0, text); break;
@@ -103,10 +103,16 @@ public:
     case 32: v.append(v.c_str() + ri), becomes(size, 0, zeroTerminated); break;
     case 33: v.assign(v.c_str() + ri), becomes(0, size, zeroTerminated); break;
     case 34: v.insert(i, v.c_str() + ri), becomes(i, 0, zeroTerminated); break;
+    case 36: {
+      const ssize_t k = std::min(n, rn);
+      v.move(i, ri, k), becomes(i, k, m.substr(size_t(ri), size_t(k)));
+      break;
+    }
     case 35: v.replace(i, n, v.c_str() + ri), becomes(i, n, zeroTerminated); break;
     }
     ASSERT_EQ(Std(v), m) << "edit " << what;
     ASSERT_TRUE(v.size() <= v.capacity() && v.empty() == m.empty() && v.end() - v.begin() == v.size());
+    ASSERT_TRUE(v.empty() || (v.front() == m.front() && std::as_const(v).back() == m.back()));
     if (this->Number(3) == 0)
       return S(v).swap(v); // without spare storage, so that the next edit has to move it
     const T* const z = v.c_str();
@@ -134,6 +140,8 @@ public:
     const ssize_t reverse = v.empty() ? kNpos : this->Number(v.size()) - 1;
     const auto uf = static_cast<std::size_t>(forward), ur = static_cast<std::size_t>(reverse);
     const T c = this->Unit();
+    const T* const p = r.data();
+    const ssize_t pn = r.size();
     const auto is = [](ssize_t ours, std::size_t theirs) { return ours == static_cast<ssize_t>(theirs); };
     ASSERT_PRED2(is, v.find(c, forward), text.find(c, uf));
     ASSERT_PRED2(is, v.find(r, forward), text.find(pattern, uf));
@@ -145,6 +153,10 @@ public:
     ASSERT_PRED2(is, v.find_last_of(r, reverse), text.find_last_of(pattern, ur));
     ASSERT_PRED2(is, v.find_last_not_of(r, reverse), text.find_last_not_of(pattern, ur));
     ASSERT_PRED2(is, v.find_last_not_of(c, reverse), text.find_last_not_of(c, ur));
+    ASSERT_PRED2(is, v.find_first_of(p, forward, pn), text.find_first_of(pattern, uf));
+    ASSERT_PRED2(is, v.find_first_not_of(p, forward, pn), text.find_first_not_of(pattern, uf));
+    ASSERT_PRED2(is, v.find_last_of(p, reverse, pn), text.find_last_of(pattern, ur));
+    ASSERT_PRED2(is, v.find_last_not_of(p, reverse, pn), text.find_last_not_of(pattern, ur));
     ASSERT_EQ(v.contains(r.begin(), r.end(), forward), text.compare(uf, pattern.size(), pattern) == 0);
     ASSERT_EQ(Std(v.substr(forward, kNpos)), text.substr(uf));
     const auto other = std::basic_string<T>(this->Text(12));

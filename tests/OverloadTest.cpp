@@ -42,7 +42,11 @@ template <class T, class N> void CallWithIntegers() {
   EXPECT_EQ(s.size(), 3);
   EXPECT_EQ(s.find(x, zero) + s.substr(i, i).size() + s.compare(zero, n, s), 2);
   s *= n;
-  EXPECT_EQ(s[i], s.operator[](i));
+  EXPECT_TRUE(s[i] == x && std::as_const(s).front() == 'a');
+  s = std::as_const(s);
+  EXPECT_EQ(s.length(), 9);
+  s.insert(ssize_t(i), 2, x);
+  EXPECT_EQ(s.size(), 11);
 }
 
 TYPED_TEST(Overload, IntegersOfEveryType) {

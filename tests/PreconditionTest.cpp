@@ -149,6 +149,7 @@ TYPED_TEST(Precondition, CallsThatStop) {
       {kCount, [&](S& s) { s.push_back(-1, p + 1, p); }},
       {kCount, [&](S& s) { s *= -1; }},
       {kIndex, [&](S& s) { s.insert(4, x); }},
+      {kIndex, [&](S& s) { s.insert(-1, r); }},
       {kIndex, [&](S& s) { s.insert(4, -1, x); }},
       {kIndex, [&](S& s) { s.insert(4, p + 1, p); }},
       {kIndex, [&](S& s) { s.insert(kMax, r, 0, 1); }},
@@ -166,6 +167,8 @@ TYPED_TEST(Precondition, CallsThatStop) {
       {kElement, [&](S& s) { s[3] = x; }},
       {kElement, [&](S& s) { std::as_const(s)[-1]; }},
       {"size() > 0", [&](S&) { S().front(); }},
+      {"size() > 0", [&](S&) { S().back(); }},
+      {"size() > 0", [&](S&) { std::as_const(*std::make_unique<S>()).front(); }},
       {"size() > 0", [&](S&) { std::as_const(*std::make_unique<S>()).back(); }},
       {"size() > 0", [&](S&) { S().pop_front(); }},
       {"size() > 0", [&](S&) { S().pop_back(); }},
@@ -186,45 +189,40 @@ TYPED_TEST(Precondition, CallsThatStop) {
 }
 
 TEST(Precondition, OfBuffersConversionsAndStreams) {
-  const auto at = [](ssize_t i) { return [i](VectorOfByte& b) { std::as_const(b)[i]; }; };
+  using Call = std::function<void(VectorOfByte&)>;
+  const uint8_t byte = 1;
   VectorOfByte b{1, 2, 3};
-  ExpectStop(b, at(3), kElement);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.pop_back(4); }, "size_ >= 0");
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.pop_back(-1); }, kCount);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.insertbytes(4, 1); }, kIndex);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.growbytes(-1); }, kCount);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.resize(-1); }, "0 <= n");
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.insert(1, -1, 'x'); }, kCount);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.insert(0, v.end(), v.begin()); }, kRange);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.assign(v.end(), v.begin()); }, kRange);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.move(1, 0, kMax); }, "0 <= d && 0 <= n && d+n <= size()");
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.erase(1, kMax); }, kIndexCount);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.erase(v.end(), v.begin()); }, kIterators);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.erase(v.end()); }, "begin() <= i && i < end()");
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.erase_element(-1); }, kElement);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.compare(2, 2, v); }, kIndexCount);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.compare(0, 1, v, 2, 2); }, kSubrange);
-  ExpectStop(
-      b, [](VectorOfByte& v) { v.compare(0, 1, nullptr, 1); }, kPointer);
-  ExpectStop(
-      b, [](VectorOfByte&) { VectorOfByte().front(); }, "size() > 0");
-  ExpectStop(
-      b, [](VectorOfByte&) { std::as_const(*std::make_unique<VectorOfByte>()).back(); }, "size() > 0");
+  const std::vector<std::pair<const char*, Call>> calls = {
+      {kElement, [](VectorOfByte& v) { std::as_const(v)[3]; }},
+      {kElement, [](VectorOfByte& v) { v.erase_element(-1); }},
+      {"size_ >= 0", [](VectorOfByte& v) { v.pop_back(4); }},
+      {kCount, [](VectorOfByte& v) { v.pop_back(-1); }},
+      {kCount, [](VectorOfByte& v) { v.growbytes(-1); }},
+      {kCount, [](VectorOfByte& v) { v.insert(1, -1, 'x'); }},
+      {"0 <= n", [](VectorOfByte& v) { v.resize(-1); }},
+      {"0 <= n", [](VectorOfByte& v) { v.insertbytes(3, kMin); }},
+      {kIndex, [](VectorOfByte& v) { v.insertbytes(4, 1); }},
+      {kIndex, [](VectorOfByte& v) { v.insert(kMax, -1, 'x'); }},
+      {kIndex, [&](VectorOfByte& v) { v.insert(-1, &byte, &byte); }},
+      {kRange, [](VectorOfByte& v) { v.insert(0, v.end(), v.begin()); }},
+      {kRange, [](VectorOfByte& v) { v.assign(v.end(), v.begin()); }},
+      {"0 <= d && 0 <= n && d+n <= size()", [](VectorOfByte& v) { v.move(1, 0, kMax); }},
+      {"0 <= s && 0 <= n && s+n <= size()", [](VectorOfByte& v) { v.move(1, kMax, 1); }},
+      {kIterators, [](VectorOfByte& v) { v.erase(v.end(), v.begin()); }},
+      {"begin() <= i && i < end()", [](VectorOfByte& v) { v.erase(v.end()); }},
+      {kIndexCount, [](VectorOfByte& v) { v.erase(1, kMax); }},
+      {kIndexCount, [](VectorOfByte& v) { v.compare(2, 2, v); }},
+      {kIndexCount, [](VectorOfByte& v) { v.compare(2, 2, v, 9, 9); }},
+      {kIndexCount, [](VectorOfByte& v) { v.compare(2, 2, nullptr, 1); }},
+      {kSubrange, [](VectorOfByte& v) { v.compare(0, 1, v, 2, 2); }},
+      {kPointer, [](VectorOfByte& v) { v.compare(0, 1, nullptr, 1); }},
+      {"size() > 0", [](VectorOfByte&) { VectorOfByte().front(); }},
+      {"size() > 0", [](VectorOfByte&) { VectorOfByte().back(); }},
+      {"size() > 0", [](VectorOfByte&) { std::as_const(*std::make_unique<VectorOfByte>()).front(); }},
+      {"size() > 0", [](VectorOfByte&) { std::as_const(*std::make_unique<VectorOfByte>()).back(); }},
+  };
+  for (const auto& [text, call] : calls)
+    ExpectStop(b, call, text);
 
   string16 wide = Of<char16>("abc");
   string8 narrow = Of<char8>("abc");
@@ -238,6 +236,20 @@ TEST(Precondition, OfBuffersConversionsAndStreams) {
       narrow, [&](string8& s) { mirel::Utf8FromUtf16(s, wide.data(), kMin); }, "srcLen >= 0");
   ExpectStop(
       narrow, [](string8& s) { mirel::Utf8FromUtf16(s, nullptr); }, "src");
+
+  struct : mirel::IOutputStream {
+    void WriteStream(const void*, ssize_t) override {}
+    void FlushStream() override {}
+  } sink;
+  mirel::xostream os(sink);
+  ExpectStop(
+      narrow, [&](string8&) { os.put(static_cast<const char*>(nullptr)); }, "x");
+  ExpectStop(
+      narrow, [&](string8&) { os.put(nullptr, 1); }, kPointer);
+  ExpectStop(
+      narrow, [&](string8&) { os.write("a", -1); }, kPointer);
+  ExpectStop(
+      narrow, [&](string8&) { os.Indent(-1); }, "0 <= indent");
 }
 
 } // namespace

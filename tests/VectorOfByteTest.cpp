@@ -44,6 +44,7 @@ TYPED_TEST(RangeAlgorithms, FailedSearchesReturnTheEnd) {
   EXPECT_EQ(FindFirstSubSequence(x1, x2, y1, y1), x1);
   EXPECT_EQ(FindLastSubSequence(x1, x2, y1, y2), x1 + 3);
   EXPECT_EQ(FindLastSubSequence(x1, x1 + 2, y1, y2), x1 + 2);
+  EXPECT_EQ(FindLastSubSequence(x1, x2, y1, y1), x2);
   EXPECT_EQ(FindLast(x1, x1 + 1, 'b'), x1 + 1);
   EXPECT_EQ(FindLastNotOf(x1, x2, y1, y2), x1);
   EXPECT_EQ(FindFirstNotOf(y1, y2, y1, y2), y2);
@@ -72,7 +73,8 @@ TYPED_TEST(RangeAlgorithms, AgreeWithThePlainTemplates) {
   std::mt19937 random(3);
   for (std::size_t size = 0; size < 420; size += size < 150 ? 1 : 7) {
     // A vector of exactly that size, and so its end is the end of what may be read.
-    std::vector<T> text(size, 'a'), other(size, 'a');
+    std::vector<T> text(size, 'a');
+    const std::vector<T> other = text;
     const auto agree = [&](std::initializer_list<T> what) {
       return Agree<T>(text.data(), text.data() + size, what.begin(), what.end());
     };
@@ -99,6 +101,20 @@ TYPED_TEST(RangeAlgorithms, AgreeWithThePlainTemplates) {
   }
 }
 
+TYPED_TEST(RangeAlgorithms, AgreeOnLongPatternsAndOnFirstUnitsThatAreRare) {
+  using T = TypeParam;
+  std::vector<T> text(4000, 'a');
+  const std::vector<T> pattern(40, 'a');
+  for (const std::size_t size : {20u, 39u, 40u, 41u, 200u})
+    ASSERT_TRUE(Agree<T>(text.data(), text.data() + size, pattern.data(), pattern.data() + 40)) << size;
+  for (std::size_t at = 5; at < text.size(); at += 190)
+    text[at] = 'b', text[at + 1] = at == 3805 ? 'c' : 'd';
+  for (const char* what : {"bc", "be", "ba", "bda"}) {
+    const auto y = Of<T>(what);
+    ASSERT_TRUE(Agree<T>(text.data(), text.data() + text.size(), y.begin(), y.end())) << what;
+  }
+}
+
 TEST(VectorOfByteTest, EditsAtAnyPlace) {
   VectorOfByte b;
   b.insertbytes(0, 2);
@@ -115,11 +131,14 @@ TEST(VectorOfByteTest, EditsAtAnyPlace) {
   b.assign(b.begin() + 1, b.begin() + 3), b.insert(b.begin(), 2, b.front()),
       b.insert(0, b.data(), b.data_end());
   EXPECT_EQ(b, (VectorOfByte{5, 5, 5, 7, 5, 5, 5, 7}));
-  b.push_back<unsigned short>(0x0102);
+  b.insert(b.begin() + 1, b.begin(), b.end()), b.insert(b.end(), ssize_t(2), b.back());
+  EXPECT_EQ(b.size(), 18);
+  b.erase(8, 10), b.push_back<unsigned short>(0x0102);
   const VectorOfByte c(b);
   EXPECT_EQ(c.size(), 10);
   EXPECT_EQ(c.front() + c.back() + c[9], 5 + 2 * c[9]);
-  EXPECT_TRUE(b.owns(b.data()) && !b.owns(&b) && !VectorOfByte().owns(nullptr));
+  EXPECT_TRUE(c.data_end() - c.data() == 10 && b.owns(b.data()) && !b.owns(&b) &&
+              !VectorOfByte().owns(nullptr));
 }
 
 TEST(VectorOfByteTest, ComparesBytes) {
@@ -130,6 +149,12 @@ TEST(VectorOfByteTest, ComparesBytes) {
   VectorOfByte d(a.begin(), a.end());
   const VectorOfByte& same = d;
   d = same;
+  EXPECT_EQ(d, a);
+  EXPECT_FALSE(d == b || VectorOfByte(c) == a);
+  d = b;
+  EXPECT_EQ(d, b);
+  d = c;
+  EXPECT_EQ(d, VectorOfByte(c));
   d.swap(const_cast<VectorOfByte&>(static_cast<const VectorOfByte&>(VectorOfByte())));
   EXPECT_TRUE(d.empty() && d.data() == nullptr);
 }

@@ -42,9 +42,10 @@ TEST(XOStream, FormatsValues) {
   os.width(4);
   EXPECT_EQ(put(42), "  42");
   EXPECT_EQ(put(true) + put('c') + put(-7L) + put(8ULL) + put(short(9)) + put(int8_t('d')), "1c-789d");
-  EXPECT_EQ(os.precision(3), 6);
+  EXPECT_EQ(put(uint8_t('e')) + put(uint16_t(1)) + put(2u) + put(3ul) + put(-4ll), "e123-4");
+  EXPECT_EQ(os.precision(3) + os.precision(), 9);
   EXPECT_EQ(put(3.14159) + put(2.5f) + put(1e30L), "3.142.51e+30");
-  EXPECT_EQ(put("text") + put("text", 2) + put(static_cast<const void*>(nullptr)), "textte0");
+  EXPECT_EQ(put("text") + put("text", 2) + put(reinterpret_cast<const void*>(0x1A)), "textte0x1a");
   EXPECT_EQ(put(L'\u00E9') + put(u'\u20AC') + put(U'\U0001F600'), "\u00E9\u20AC\U0001F600");
   EXPECT_EQ(put(char16_t(0xD800)) + put(char32_t(0x110000)) + put(static_cast<wchar_t>(-1)),
             "\uFFFD\uFFFD\uFFFD");

@@ -34,6 +34,8 @@ TYPED_TEST(XVector, ReverseIteratorsHoldThePlaceBehind) {
   const auto& cv = v;
   EXPECT_EQ(std::basic_string<TypeParam>(cv.rbegin(), cv.rend()), Std(Of<TypeParam>("cba")));
   auto it = v.rbegin();
+  auto constIt = cv.rbegin();
+  EXPECT_TRUE(*constIt++ == 'c' && static_cast<const TypeParam*>(constIt) == v.begin() + 2);
   EXPECT_TRUE(it == cv.rbegin() && static_cast<TypeParam*>(it) == v.end() &&
               static_cast<TypeParam*>(v.rend()) == v.begin());
   EXPECT_EQ(*it++, 'c');

@@ -99,6 +99,13 @@ def aarch64(row):
         f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}"))(row)
 
 
+def coverage(row):
+    """Every piece of code in utils/ run, every branch taken both ways."""
+    row.build("mirel_tests", cxx="clang++", flags="-O0 -g -fprofile-instr-generate -fcoverage-mapping "
+              "-mllvm -runtime-counter-relocation")
+    row.run("tools/coverage.py", row.dir)
+
+
 def threads(row):
     row.build("mirel_tests", cxx="clang++", flags="-O1 -g -fsanitize=thread")
     row.run(row.dir / "tests" / "mirel_tests", "--gtest_filter=Thread*")
@@ -130,7 +137,6 @@ def mutants(row):
 HARDENING = ("-O2 -D_FORTIFY_SOURCE=2 -D_GLIBCXX_ASSERTIONS -fstack-protector-strong -fstack-clash-protection "
              "-fcf-protection -Wformat -Werror=format-security -fPIE")
 SHARED = "-DBUILD_SHARED_LIBS=ON"
-LIBCXX = {"flags": "-stdlib=libc++", "options": (f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}",)}
 
 
 def libcxx(std, flags, *options):
@@ -156,11 +162,12 @@ ROWS = [
     Row("clang++ libc++ C++20 -O2 unsigned char", libcxx(20, "-O2 -funsigned-char")),
     Row("clang++ libc++ C++23 -O0 NDEBUG", libcxx(23, "-O0 -DNDEBUG")),
     Row("g++ address, leak, undefined", suite(
-        flags="-O1 -g -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer")),
+        flags="-O2 -g -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer")),
     Row("clang++ address, leak, undefined, conversions", suite(
-        cxx="clang++", flags="-O1 -g -fsanitize=address,undefined,implicit-conversion,nullability,local-bounds,"
+        cxx="clang++", flags="-O2 -g -fsanitize=address,undefined,implicit-conversion,nullability,local-bounds,"
         "float-divide-by-zero -fno-sanitize-recover=all -fno-omit-frame-pointer")),
     Row("clang++ thread", threads),
+    Row("coverage", coverage),
     Row("fuzzers", fuzz),
 ]
 LONG_ROWS = [

@@ -157,7 +157,7 @@ template <class It1, class It2> It1 FindLastNotOf(It1 x1, It1 x2, It2 y1, It2 y2
 
 namespace detail {
 
-/// The searches and the order above for code units, by blocks of them.
+/// The searches above for code units, by blocks of them.
 template <class T> struct MIREL_API ByBlock {
   static const T* Find(const T* i1, const T* i2, T v);
   static const T* FindLast(const T* i1, const T* i2, T v);
@@ -167,10 +167,12 @@ template <class T> struct MIREL_API ByBlock {
   static const T* FindFirstNotOf(const T* x1, const T* x2, const T* y1, const T* y2);
   static const T* FindLastOf(const T* x1, const T* x2, const T* y1, const T* y2);
   static const T* FindLastNotOf(const T* x1, const T* x2, const T* y1, const T* y2);
-  static int Compare(const T* x1, const T* x2, const T* y1, const T* y2);
 };
 extern template struct ByBlock<char8>;
 extern template struct ByBlock<char16>;
+
+/// The order above, by blocks.
+MIREL_API int CompareByBlock(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
 
 /// In so short a range the plain loops are done before a call to the others has begun.
 template <class T> bool IsShort(const T* x1, const T* x2) { return x2 - x1 <= 16; }
@@ -227,7 +229,7 @@ const T* FindLastNotOf(const T* x1, const T* x2, const T* y1, const T* y2) {
 }
 inline int LexicographicalCompareX(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
   return detail::IsShort(x1, x2) ? LexicographicalCompareX<const char16*, const char16*>(x1, x2, y1, y2)
-                                 : detail::ByBlock<char16>::Compare(x1, x2, y1, y2);
+                                 : detail::CompareByBlock(x1, x2, y1, y2);
 }
 
 /// @}

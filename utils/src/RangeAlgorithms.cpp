@@ -177,10 +177,11 @@ template <class T> const T* ByBlock<T>::Find(const T* i1, const T* i2, T v) {
   if constexpr (sizeof(T) == 1) {
     const void* const p = i1 == i2 ? nullptr : std::memchr(i1, v, std::size_t(i2 - i1));
     return p ? static_cast<const T*>(p) : i2;
+  } else {
+    return Forward(
+        i1, i2, [=](const T* p, const T* end) { return FindByFour(p, end, v); },
+        [=](const T* p, auto n) { return Has<n>(p, v); });
   }
-  return Forward(
-      i1, i2, [=](const T* p, const T* end) { return FindByFour(p, end, v); },
-      [=](const T* p, auto n) { return Has<n>(p, v); });
 }
 
 template <class T> const T* ByBlock<T>::FindLast(const T* i1, const T* i2, T v) {
@@ -278,12 +279,15 @@ const T* ByBlock<T>::FindLastSubSequence(const T* x1, const T* x2, const T* y1, 
   }
 }
 
-template <class T> int ByBlock<T>::Compare(const T* x1, const T* x2, const T* y1, const T* y2) {
+template struct ByBlock<char8>;
+template struct ByBlock<char16>;
+
+int CompareByBlock(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
   // Equal stretches are told by their bytes, the one with the difference by its units.
   const ssize_t len = x2 - x1 < y2 - y1 ? x2 - x1 : y2 - y1;
-  const T* const end = x1 + len;
-  const T* p = x1;
-  const T* q = y1;
+  const char16* const end = x1 + len;
+  const char16* p = x1;
+  const char16* q = y1;
   const auto skip = [&](ssize_t n) {
     while (end - p >= n && IsEqual(p, p + n, q))
       p += n, q += n;
@@ -292,11 +296,8 @@ template <class T> int ByBlock<T>::Compare(const T* x1, const T* x2, const T* y1
     skip(256);
     skip(16);
   }
-  return LexicographicalCompareX<const T*, const T*>(p, x2, q, y2);
+  return LexicographicalCompareX<const char16*, const char16*>(p, x2, q, y2);
 }
-
-template struct ByBlock<char8>;
-template struct ByBlock<char16>;
 
 } // namespace detail
 

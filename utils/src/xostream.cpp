@@ -23,11 +23,9 @@ public:
 
 protected:
   int_type overflow(int_type c) override {
-    if (!traits_type::eq_int_type(c, traits_type::eof())) {
-      const char byte = traits_type::to_char_type(c);
-      xsputn(&byte, 1);
-    }
-    return traits_type::not_eof(c);
+    const char byte = traits_type::to_char_type(c);
+    xsputn(&byte, 1);
+    return c;
   }
 
   std::streamsize xsputn(const char* p, std::streamsize n) override {

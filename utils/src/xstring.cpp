@@ -53,15 +53,17 @@ constexpr ssize_t kLookahead = 4;
 
 template <class T> std::make_unsigned_t<T> Unit(T x) { return static_cast<std::make_unsigned_t<T>>(x); }
 
+/// The bits that no unit of ASCII has, for a word of units.
+template <class T> constexpr uint64_t kNotAscii = sizeof(T) == 1 ? 0x8080808080808080 : 0xFF80FF80FF80FF80;
+
 /// Whether n units are ASCII; looks at all of them without leaving early.
 template <ssize_t n, class T> bool IsAscii(const T* p) {
-  constexpr uint64_t kNotAscii = sizeof(T) == 1 ? 0x8080808080808080 : 0xFF80FF80FF80FF80;
   uint64_t words[std::size_t(n) * sizeof(T) / sizeof(uint64_t)];
   std::memcpy(words, p, sizeof(words));
   uint64_t bits = 0;
   for (const uint64_t word : words)
     bits |= word;
-  return (bits & kNotAscii) == 0;
+  return (bits & kNotAscii<T>) == 0;
 }
 
 /// Converts n units of ASCII, through a copy: for all the compiler knows, bytes at p are those at out.
@@ -192,6 +194,16 @@ char8* EncodeTriple(unsigned unit, char8* out) {
   return {p, out};
 }
 
+/// The code point at p, which goes behind it, or what Boost has for malformed and for cut off ones.
+template <class CharIn> utf::code_point Decode(const CharIn*& p, const CharIn* end) {
+  // As unsigned units: with char the traits convert negative values without saying so.
+  using Unsigned = std::make_unsigned_t<CharIn>;
+  const Unsigned* q = reinterpret_cast<const Unsigned*>(p);
+  const utf::code_point c = utf::utf_traits<Unsigned>::decode(q, reinterpret_cast<const Unsigned*>(end));
+  p = reinterpret_cast<const CharIn*>(q);
+  return c;
+}
+
 } // namespace
 
 template <class CharOut, class CharIn>
@@ -212,7 +224,7 @@ bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen)
       if (p >= chunkEnd)
         break;
       // The traits are the judges of everything else, and of the last few units.
-      const utf::code_point c = utf::utf_traits<CharIn>::decode(p, end);
+      const utf::code_point c = Decode(p, end);
       isWellFormed = c != utf::illegal && c != utf::incomplete;
       if (isWellFormed)
         out = utf::utf_traits<CharOut>::encode(c, out);

@@ -1,0 +1,83 @@
+#!/usr/bin/python3
+"""Tells which code of utils/ the suite doesn't run, and which branches it takes one way only.
+
+usage: coverage.py BUILD-DIRECTORY
+
+Runs the suite, built there with clang's -fprofile-instr-generate -fcoverage-mapping and -mllvm
+-runtime-counter-relocation. The last keeps the counters in a file that the children write too, so that a violated
+precondition, which ends a process, is seen. What a template does counts for all its instances together. Ends with 1
+if anything is missed.
+"""
+
+import collections
+import json
+import os
+import pathlib
+import subprocess
+import sys
+
+ROOT = pathlib.Path(__file__).resolve().parent.parent
+
+
+def run_suite(build):
+    raw, profile = build / "suite.profraw", build / "suite.profdata"
+    raw.unlink(missing_ok=True)
+    subprocess.run([build / "tests" / "mirel_tests", "--gtest_brief=1"], check=True,
+                   env={**os.environ, "LLVM_PROFILE_FILE": f"{raw}%c"})
+    subprocess.run(["llvm-profdata-14", "merge", "-o", profile, raw], check=True)
+    exported = subprocess.run(["llvm-cov-14", "export", build / "tests" / "mirel_tests", f"-instr-profile={profile}",
+                               ROOT / "utils"], check=True, stdout=subprocess.PIPE).stdout
+    return json.loads(exported)["data"][0]
+
+
+def region_counts(functions):
+    """{file: {(line, column) where a piece of code begins: how often it was run}}"""
+    counts = collections.defaultdict(lambda: collections.defaultdict(int))
+    for function in functions:
+        for line, column, _, _, count, file, _, kind in function["regions"]:
+            if kind == 0:  # code, not a gap or the place of a macro
+                counts[function["filenames"][file]][line, column] += count
+    return counts
+
+
+def branch_counts(file):
+    """{(line, column, line and column in a macro): [times true, times false]}"""
+    counts = collections.defaultdict(lambda: [0, 0])
+
+    def add(place, branches):
+        for line, column, _, _, true, false, *_ in branches:
+            total = counts[place or (line, column), line, column]
+            total[0] += true
+            total[1] += false
+
+    add(None, file["branches"])
+    for expansion in file.get("expansions", []):
+        add(tuple(expansion["source_region"][:2]), expansion["branches"])
+    return counts
+
+
+def main():
+    build = pathlib.Path(sys.argv[1]).resolve()
+    missed = 0
+    data = run_suite(build)
+    regions = region_counts(data["functions"])
+    for file in data["files"]:
+        path = pathlib.Path(file["filename"])
+        source = path.read_text().splitlines()
+        # Where neither way was taken the condition is a constant in all instances, or its code is in the other list.
+        branches = {at: count for at, count in branch_counts(file).items() if any(count)}
+        for (line, _), count in sorted(regions[file["filename"]].items()):
+            if count == 0:
+                missed += 1
+                print(f"{path.name}:{line}: never run: {source[line - 1].strip()}")
+        for (at, *_), (true, false) in sorted(branches.items()):
+            if not true or not false:
+                missed += 1
+                print(f"{path.name}:{at[0]}: never {'true' if not true else 'false'}: {source[at[0] - 1].strip()}")
+        print(f"{path.name}: {len(regions[file['filename']])} pieces of code, {len(branches)} branches")
+    print(f"{missed} missed")
+    return missed > 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())
