@@ -1,7 +1,6 @@
 // What debugger_test.py looks at: whole objects, broken ones, and a place to stop.
 
 #include <cstdlib>
-#include <cstring>
 
 #include <utils/xstring.h>
 
@@ -26,8 +25,7 @@ int main() {
   mirel::xvector<char> malformed{'a', '\xff', '\xed', '\xa0', '\x80', 'z', '\xe2', '\x82'};
   const mirel::xvector<mirel::char16> lone{'a', 0xdc00, 'b', 0xd83d};
   const mirel::VectorOfByte bytes{0, '1', 27};
-  typedef const mirel::string8& Alias;
-  Alias alias = text;
+  const mirel::xstring& alias = text;
   mirel::string8 empty;
   mirel::string16 long_text(1000, 0x20ac);
   long_text.reserve(5000);

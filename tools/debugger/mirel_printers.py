@@ -5,7 +5,6 @@ GDB runs all such files in one namespace, its own __main__, hence the prefix on 
 """
 
 import codecs
-import re
 
 MIREL_TYPES = r"^mirel::(VectorOfByte|(xvector|basic_xstring)<(char|unsigned short|short unsigned int)>)$"
 
@@ -39,6 +38,14 @@ def mirel_literal(units, width, order, charset, is_cut):
 
 class MirelFault(Exception):
     """Why an object can't be shown, in words."""
+
+    kind = "corrupt or uninitialised"
+
+
+class MirelUnavailable(MirelFault):
+    """The debugger doesn't know the object's fields."""
+
+    kind = "unavailable"
 
 
 class MirelObject:
@@ -75,7 +82,7 @@ class MirelObject:
             shown = min(size // self.width, limit or MIREL_MOST, MIREL_MOST) * self.width
             units = self.read(address, shown) if shown else b""
         except MirelFault as fault:
-            return f"<corrupt or uninitialised: {fault}>"
+            return f"<{fault.kind}: {fault}>"
         literal = mirel_literal(units, self.width, self.order, self.charset, shown < size)
         return f"{literal} (size {size // self.width}, capacity {capacity // self.width})"
 
@@ -101,7 +108,7 @@ class MirelInGdb(MirelObject):
             self.order = "le" if self.width == 1 or int(gdb.Value(b"\1\0", unit.target())) == 1 else "be"
             return int(self.elements), int(buffer["size_"]), int(buffer["m_capacity"])
         except (RuntimeError, OverflowError) as error:
-            raise MirelFault(str(error)) from error
+            raise MirelUnavailable(str(error)) from error
 
     def read(self, address, count):
         try:
@@ -122,6 +129,10 @@ class MirelInGdb(MirelObject):
         if hasattr(gdb, "print_options"):
             return self.summary(gdb.print_options()["max_elements"])
         return self.summary(gdb.parameter("print elements"))
+
+
+class MirelWithElements(MirelInGdb):
+    """The same with elements, which front ends show in place of the text."""
 
     def children(self):
         try:
@@ -155,7 +166,7 @@ class MirelInLldb(MirelObject):
             field = buffer.GetChildMemberWithName(name)
             fields.append(field.GetValueAsSigned(error))
             if not field.IsValid() or error.Fail():
-                raise MirelFault(f"{name} is not available")
+                raise MirelUnavailable(f"{name} can't be read")
         return fields[0] & 0xFFFFFFFFFFFFFFFF, *fields[1:]
 
     def read(self, address, count):
@@ -182,6 +193,25 @@ try:
 except ImportError:
     import lldb
 else:
+    try:
+        gdb.parameter("print mirel-elements")
+    except RuntimeError:  # the first of the program's files that runs this
+        class MirelElements(gdb.Parameter):
+            """Whether the elements of mirel's vectors and strings are shown beside their text."""
+
+            set_doc = show_doc = __doc__
+
+            def get_set_string(self):
+                return ""
+
+            def get_show_string(self, value):
+                return f"Elements of mirel's vectors and strings: {value}."
+
+        MirelElements("print mirel-elements", gdb.COMMAND_DATA, gdb.PARAM_BOOLEAN).value = True
+
+    def mirel_printer(value):
+        return (MirelWithElements if gdb.parameter("print mirel-elements") else MirelInGdb)(value)
+
     mirel_printers = gdb.printing.RegexpCollectionPrettyPrinter("mirel")
-    mirel_printers.add_printer("text", MIREL_TYPES, MirelInGdb)
+    mirel_printers.add_printer("text", MIREL_TYPES, mirel_printer)
     gdb.printing.register_pretty_printer(gdb.current_objfile(), mirel_printers, replace=True)
