@@ -8,7 +8,7 @@ import codecs
 
 MIREL_TYPES = r"^mirel::(VectorOfByte|(xvector|basic_xstring)<(char|unsigned short|short unsigned int)>)$"
 
-# So many elements are shown at most, whatever limit is set: a corrupt size must not keep the debugger busy for hours.
+# So many elements are shown at most, whatever limit is set: a corrupt size must not keep the debugger busy.
 MIREL_MOST = 1 << 20
 
 MIREL_ESCAPES = {'"': '\\"', "\\": "\\\\", "\n": "\\n", "\r": "\\r", "\t": "\\t"}
