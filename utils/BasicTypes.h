@@ -1,5 +1,6 @@
 /// @file
-/// Scalar types of fixed width that every other header uses, and the mark of what the library exports.
+/// Scalar types of fixed width that every other header uses, and the marks of what the library exports and of
+/// what a debugger knows.
 
 #pragma once
 
@@ -7,6 +8,14 @@
 
 /// Marks a class or function that a program may use from the shared library; everything else stays hidden.
 #define MIREL_API __attribute__((visibility("default")))
+
+/// Marks a class that a program describes in its own debug information. Clang leaves out a class whose code
+/// is in the library, and a debugger then has nothing to show where the library has no debug information.
+#if __has_cpp_attribute(clang::standalone_debug)
+#define MIREL_DESCRIBED [[clang::standalone_debug]]
+#else
+#define MIREL_DESCRIBED
+#endif
 
 namespace mirel {
 

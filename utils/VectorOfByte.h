@@ -244,7 +244,7 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 /// anything has changed. Whatever may grow the buffer may move its storage and so invalidates pointers into
 /// it; erasing keeps the storage and moves down the bytes behind. A run of edits costs amortised constant
 /// time per byte added, plus the bytes that it moves.
-class MIREL_API VectorOfByte {
+class MIREL_DESCRIBED MIREL_API VectorOfByte {
 public:
   typedef uint8 value_type;
   typedef value_type* iterator;

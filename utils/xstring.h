@@ -34,7 +34,7 @@ inline ssize_t GetStringLength(const char16* s) {
 /// A zero-terminated argument (`const T*` without a count) must not be null, and ends before its first zero;
 /// it is measured once, before anything is checked or changed, and then treated as a pointer and count. The
 /// deleted overloads keep a literal null from being one.
-template <class T> class MIREL_API basic_xstring : public xvector<T> {
+template <class T> class MIREL_DESCRIBED MIREL_API basic_xstring : public xvector<T> {
   typedef xvector<T> Base;
 
 public:

@@ -108,7 +108,7 @@ using IfPointerAndCount = std::enable_if_t<
 ///
 /// A literal 0 is an index, a count or an element, never a pointer: that is what the overloads for integers
 /// of any type are for, which do what the overload above them does.
-template <class T> class MIREL_API xvector {
+template <class T> class MIREL_DESCRIBED MIREL_API xvector {
 public:
   /// @name Types
   /// @{
