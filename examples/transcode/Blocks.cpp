@@ -9,9 +9,9 @@ namespace {
 
 using mirel::char16;
 
-/// Large enough that calls cost nothing beside the work, small enough that a block stays in the cache while
-/// it is decoded, counted and written.
-constexpr ssize_t kBlock = 1 << 17;
+/// What a pipe holds. A block stays in the cache while it is decoded, counted and written; from half to four
+/// times the size was no faster.
+constexpr ssize_t kBlock = 1 << 16;
 /// The most bytes of a sequence that isn't whole.
 constexpr ssize_t kMaxUnfinished = 3;
 
