@@ -5,7 +5,7 @@ transcode=$1
 sources=$(cd "$(dirname "$0")/../examples/transcode" && pwd)
 dir=$(mktemp -d)
 trap 'rm -rf "$dir"' EXIT
-cd "$dir"
+cd "$dir" || exit 1
 failures=0
 fail() { echo "$*"; failures=$((failures + 1)); }
 # check NAME EXIT-CODE COMMAND...: runs the command, leaves its output in out and err
@@ -28,7 +28,8 @@ for from in $encodings; do
   for to in $encodings; do
     check "$from to $to" 0 "$transcode" --from $from --to $to long.$from
     same "$from to $to" out long.$to
-    check "$from to $to, a stream" 0 "$transcode" -f $from -t $to < <(head -c 1 long.$from; sleep 0.05; tail -c +2 long.$from)
+    check "$from to $to, a stream" 0 "$transcode" -f $from -t $to - \
+      < <(head -c 1 long.$from; sleep 0.05; tail -c +2 long.$from)
     same "$from to $to, a stream" out long.$to
   done
   check "report" 0 "$transcode" --report -f $from long.$from
@@ -97,7 +98,7 @@ while read -r name wanted command; do
 done <<'ROWS'
 percent (\|\|transcode:[0-9]+%)+\|\| $transcode long | { sleep 1; cat >copy; }
 bytes (\|\|transcode:[0-9.]+MB)+\|\| { cat in; sleep 1; cat long; } | $transcode -o copy
-fault (\|\|transcode:[0-9.]+MB)+\|\|transcode:-:not.*\| { cat in; sleep 1; cat long; printf '\377'; } | $transcode -o copy
+fault (\|\|transcode:[0-9.]+MB)+\|\|transcode:-:not.*\| { cat in; sleep 1; cat long bad; } | $transcode -o copy
 text G\|G\| { echo G; sleep 1; echo G; } | $transcode
 short () $transcode -o copy in
 quiet G\|G\| { echo G; sleep 1; echo G; } | $transcode -q -o copy; cat copy

@@ -113,9 +113,10 @@ Output::Output(const std::string& name) : m_name(name), m_fd(STDOUT_FILENO) {
 Output::~Output() {
   if (m_fd != STDOUT_FILENO && m_fd != -1)
     close(m_fd);
-  if (!m_temporary.empty())
+  if (!m_temporary.empty()) {
     unlink(m_temporary.c_str());
-  unfinished = nullptr;
+    unfinished = nullptr;
+  }
 }
 
 void Output::Write(std::string_view bytes) {

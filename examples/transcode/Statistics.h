@@ -2,6 +2,8 @@
 
 #pragma once
 
+#include <string>
+
 #include <utils/xstring.h>
 
 #include "Blocks.h"
