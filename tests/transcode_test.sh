@@ -98,7 +98,7 @@ while read -r name wanted command; do
 done <<'ROWS'
 percent (\|\|transcode:[0-9]+%)+\|\| $transcode long | { sleep 1; cat >copy; }
 bytes (\|\|transcode:[0-9.]+MB)+\|\| { cat in; sleep 1; cat long; } | $transcode -o copy
-fault (\|\|transcode:[0-9.]+MB)+\|\|transcode:-:not.*\| { cat in; sleep 1; cat long bad; } | $transcode -o copy
+fault (\|\|transcode:.*MB)+\|\|transcode:-:not.*\| { cat in; sleep 1; cat long; head -c 1 in; } | $transcode -o copy
 text G\|G\| { echo G; sleep 1; echo G; } | $transcode
 short () $transcode -o copy in
 quiet G\|G\| { echo G; sleep 1; echo G; } | $transcode -q -o copy; cat copy
