@@ -2,43 +2,79 @@
 # The example as a user meets it: what it writes, where, and how it fails.
 set -u
 transcode=$1
+sources=$(cd "$(dirname "$0")/../examples/transcode" && pwd)
 dir=$(mktemp -d)
 trap 'rm -rf "$dir"' EXIT
-cd "$dir"
+cd "$dir" || exit 1
 failures=0
+fail() { echo "$*"; failures=$((failures + 1)); }
 # check NAME EXIT-CODE COMMAND...: runs the command, leaves its output in out and err
 check() {
   local name=$1 expected=$2 code=0
   shift 2
   "$@" >out 2>err || code=$?
-  [ $code = "$expected" ] || { echo "$name: exit code $code, not $expected: $(cat err)"; failures=$((failures + 1)); }
+  [ $code = "$expected" ] || fail "$name: exit code $code, not $expected: $(cat err)"
 }
-expect() { [ "$2" = "$3" ] || { echo "$1: '$2' is not '$3'"; failures=$((failures + 1)); }; }
+expect() { [ "$2" = "$3" ] || fail "$1: '$2' is not '$3'"; }
+same() { cmp -s "$2" "$3" || fail "$1: $2 and $3 differ"; }
 
-text=$'z\u00e9\u20ac\U1f600\n'
-printf '%s' "$text" >in
-for encoding in utf-16le utf-16be; do
-  iconv -f utf-8 -t $encoding in >wanted
-  check "to $encoding" 0 "$transcode" --to $encoding in
-  expect "to $encoding" "$(od -An -tx1 out)" "$(od -An -tx1 wanted)"
-  check "from $encoding" 0 "$transcode" --from $encoding -o back wanted
-  expect "from $encoding" "$(od -An -tx1 back)" "$(od -An -tx1 in)"
+# The sequences recur every 10 bytes, in UTF-8 and in UTF-16. The ends of a few blocks fall everywhere in them, at odd
+# places when the first byte comes by itself.
+printf '\357\273\277z\303\251\342\202\254\360\237\230\200\n' >in
+{ cat in; yes "$(tail -c +4 in)" | tr -d '\n' | head -c 500000; cat in; } >long
+encodings='utf-8 utf-16le utf-16be'
+for to in $encodings; do iconv -f utf-8 -t $to long >long.$to; done
+for from in $encodings; do
+  for to in $encodings; do
+    check "$from to $to" 0 "$transcode" --from $from --to $to long.$from
+    same "$from to $to" out long.$to
+    check "$from to $to, a stream" 0 "$transcode" -f $from -t $to - \
+      < <(head -c 1 long.$from; sleep 0.05; tail -c +2 long.$from)
+    same "$from to $to, a stream" out long.$to
+  done
+  check "report" 0 "$transcode" --report -f $from long.$from
+  expect "report" "$(tr -s ' \n' ' ' <out)" "long.$from, $from: bytes $(stat -c %s long.$from) UTF-8 code units 500028 \
+UTF-16 code units 250014 code points 200012 lines 2 longest line 200005 ASCII code points 25 % way back same bytes "
 done
-check "a stream" 0 "$transcode" - <in
-expect "a stream" "$(cat out)" "$(cat in)"
+yes 'GET /' | head -c 200000 >ascii
+check "from ascii" 0 "$transcode" -f ascii -t utf-16be ascii
+same "from ascii" out <(iconv -f ascii -t utf-16be ascii)
+
+# Faults before, at and behind the end of a block: the text before is printed, and the place named.
+while read -r encoding width fault; do
+  for bytes in 2 65528 65530 65532 65533 65534 65535 65536 65537 65538 131070 131072; do
+    [ $((bytes % width)) = 0 ] || continue
+    units=$((bytes / width))
+    { echo; head -c $((units - 1)) /dev/zero | tr '\0' x; } | iconv -f ascii -t "$encoding" >before
+    { cat before; printf "$fault"; } >bad
+    check "$fault" 1 "$transcode" -f "$encoding" -t "${encoding/ascii/utf-8}" bad
+    same "$fault at $bytes" out before
+    expect "$fault" "$(cat err)" "transcode: bad: not well-formed $encoding at byte $bytes (line 2, column $units)"
+  done
+done <<'ROWS'
+utf-8 1 \377x
+utf-8 1 \342\202x
+utf-8 1 \355\240\200
+utf-8 1 \360\237\230
+utf-16le 2 \75\330x\0
+utf-16le 2 \0\334
+utf-16be 2 \330\75
+utf-16be 2 \0
+ascii 1 \303\251
+ROWS
 
 echo old >kept
 chmod 640 kept
-printf 'ab\nc\303\251d\377z' >bad
-check "malformed UTF-8" 1 "$transcode" -o kept bad
-expect "malformed UTF-8" "$(cat err)" "transcode: bad: not well-formed utf-8 at byte 7 (line 2, column 4)"
-printf 'a\0\0\334' >bad
-check "malformed UTF-16" 1 "$transcode" -f utf-16le -o kept bad
-expect "malformed UTF-16" "$(cat err)" "transcode: bad: not well-formed utf-16le at byte 2 (line 1, column 2)"
-check "ascii" 1 "$transcode" -f ascii -o kept in
+check "malformed late" 1 "$transcode" -f ascii -t utf-16le -o kept bad
+check "interrupted" 124 timeout 0.3 "$transcode" -o kept - < <(cat long; sleep 1)
+check "what is added to" 1 timeout 5 bash -c "'$transcode' kept >>kept"
 expect "what was there" "$(cat kept)" old
 check "replacing" 0 "$transcode" -o kept in
-expect "replacing" "$(cat kept) $(stat -c %a kept) $(ls | wc -l)" "$(cat in) 640 7"
+ln -s new link
+check "malformed, by a dangling link" 1 "$transcode" -f ascii -o link bad
+check "a dangling link" 0 "$transcode" -o link in
+expect "what is there" "$(cat kept new) $(stat -c %a kept) $(readlink link) $(ls | grep -c -e kept -e new)" \
+  "$(cat in in) 640 new 2"
 check "a device" 0 "$transcode" -o /dev/null in
 expect "a device" "$(stat -c %F /dev/null)" "character special file"
 check "no such file" 1 "$transcode" missing
@@ -46,7 +82,34 @@ check "a full disk" 1 bash -c "'$transcode' in >/dev/full"
 check "no such option" 2 "$transcode" --nonsense
 check "no such encoding" 2 "$transcode" --to ebcdic
 check "ascii output" 2 "$transcode" --to ascii
-check "help" 0 "$transcode" --help
-check "report" 0 "$transcode" --report in
-expect "report" "$(grep -c -e 'code points  *5' -e 'same bytes' out)" 2
+
+# The sanitizers reserve more than any limit lets them.
+if bash -c "ulimit -v 32000; '$transcode' --help; exit" >/dev/null 2>&1; then
+  for options in '-t utf-16be' --report; do
+    check "little memory" 0 bash -c "ulimit -v 32000; head -c 200000000 /dev/zero | '$transcode' $options | wc -c"
+    [ "$(cat out)" -gt 100 ] || fail "little memory: $(cat out err)"
+  done
+fi
+
+# What a terminal gets to see, carriage returns as bars and without the blanks that cover what was there.
+while read -r name wanted command; do
+  seen=$(transcode="$transcode -t utf-8" script -qec "$command" /dev/null </dev/null | tr '\r' '|' | tr -d ' \n')
+  [[ $seen =~ ^$wanted$ ]] || fail "on a terminal, $name: '$seen' is not '$wanted'"
+done <<'ROWS'
+percent (\|\|transcode:[0-9]+%)+\|\| $transcode long | { sleep 1; cat >copy; }
+bytes (\|\|transcode:[0-9.]+MB)+\|\| { cat in; sleep 1; cat long; } | $transcode -o copy
+fault (\|\|transcode:.*MB)+\|\|transcode:-:not.*\| { cat in; sleep 1; cat long; head -c 1 in; } | $transcode -o copy
+text G\|G\| { echo G; sleep 1; echo G; } | $transcode
+short () $transcode -o copy in
+quiet G\|G\| { echo G; sleep 1; echo G; } | $transcode -q -o copy; cat copy
+ROWS
+
+# The options are the same wherever they are listed, and bash completes them, encodings and files.
+"$transcode" --help | grep -o -e '--[a-z]*' | sort -u >options
+for place in transcode.bash _transcode transcode.1; do
+  expect "options of $place" "$(sed 's/\\-/-/g' "$sources/$place" | grep -o -e '--[a-z]\+' | sort -u)" "$(cat options)"
+done
+printf '%s\n' 'transcode() { printf "<%s>" "$@"; echo; }' "source '$sources/transcode.bash'" \
+  $'transcode --fr\tasc\t -t utf-16l\t --to=utf-16b\t -q\t -o kep\t kep\t' exit | bash --norc -i >out 2>/dev/null
+expect completion "$(grep '^<' out)" '<--from><ascii><-t><utf-16le><--to=utf-16be><-q><-o><kept><kept>'
 exit $((failures > 0))

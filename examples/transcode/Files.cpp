@@ -1,0 +1,151 @@
+#include "Files.h"
+
+#include <atomic>
+#include <cerrno>
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <system_error>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace transcode {
+
+namespace {
+
+/// The temporary file that a signal which ends the process removes, or null.
+std::atomic<const char*> unfinished{nullptr};
+static_assert(std::atomic<const char*>::is_always_lock_free, "others may not be used by a signal handler");
+
+extern "C" void RemoveUnfinished(int signal) {
+  if (const char* const name = unfinished)
+    unlink(name);
+  raise(signal); // with its own effect now
+}
+
+void RemoveWhenInterrupted(const char* name) {
+  unfinished = name;
+  for (const int signal : {SIGHUP, SIGINT, SIGTERM}) {
+    struct sigaction action = {};
+    sigaction(signal, nullptr, &action);
+    if (action.sa_handler != SIG_DFL)
+      continue; // who started the program wants it ignored
+    action.sa_handler = RemoveUnfinished;
+    action.sa_flags = static_cast<int>(SA_RESETHAND);
+    sigaction(signal, &action, nullptr);
+  }
+}
+
+/// What a link, or a chain of them, leads to; it need not exist.
+std::string FollowLinks(const std::string& name) {
+  namespace fs = std::filesystem;
+  constexpr int kMaxLinks = 40;
+  fs::path path = name;
+  std::error_code error;
+  for (int i = 0; i < kMaxLinks && is_symlink(symlink_status(path, error)); ++i)
+    path = path.parent_path() / read_symlink(path, error);
+  return path;
+}
+
+} // namespace
+
+std::runtime_error SystemError(const std::string& name) {
+  return std::runtime_error(name + ": " + std::strerror(errno));
+}
+
+Input::Input(const std::string& name)
+    : m_name(name == "-" ? "standard input" : name),
+      m_fd(name == "-" ? STDIN_FILENO : open(name.c_str(), O_RDONLY)) {
+  if (m_fd == -1)
+    throw SystemError(m_name);
+}
+
+Input::~Input() {
+  if (m_fd != STDIN_FILENO)
+    close(m_fd);
+}
+
+ssize_t Input::Read(char* p, ssize_t n) {
+  for (;;) {
+    const ssize_t count = read(m_fd, p, static_cast<std::size_t>(n));
+    if (count >= 0)
+      return count;
+    if (errno != EINTR)
+      throw SystemError(m_name);
+  }
+}
+
+ssize_t Input::BytesLeft() const {
+  struct stat status;
+  if (fstat(m_fd, &status) != 0 || !S_ISREG(status.st_mode))
+    return 0;
+  return status.st_size - lseek(m_fd, 0, SEEK_CUR);
+}
+
+Output::Output(const std::string& name) : m_name(name), m_fd(STDOUT_FILENO) {
+  if (name == "-") {
+    m_name = "standard output";
+    return;
+  }
+  struct stat old;
+  const bool exists = stat(name.c_str(), &old) == 0;
+  if (exists && !S_ISREG(old.st_mode)) {
+    m_fd = open(name.c_str(), O_WRONLY | O_TRUNC);
+    if (m_fd == -1)
+      throw SystemError(name);
+    return;
+  }
+  m_target = FollowLinks(name);
+  m_temporary = m_target + ".XXXXXX";
+  m_fd = mkstemp(m_temporary.data());
+  if (m_fd == -1)
+    throw SystemError(name);
+  RemoveWhenInterrupted(m_temporary.c_str());
+  const mode_t mask = umask(0);
+  umask(mask);
+  fchmod(m_fd, exists ? old.st_mode & 07777 : 0666 & ~mask);
+}
+
+Output::~Output() {
+  if (m_fd != STDOUT_FILENO && m_fd != -1)
+    close(m_fd);
+  if (!m_temporary.empty()) {
+    unlink(m_temporary.c_str());
+    unfinished = nullptr;
+  }
+}
+
+void Output::Write(std::string_view bytes) {
+  while (!bytes.empty()) {
+    const ssize_t count = write(m_fd, bytes.data(), bytes.size());
+    if (count >= 0)
+      bytes.remove_prefix(static_cast<std::size_t>(count));
+    else if (errno != EINTR)
+      throw SystemError(m_name);
+  }
+}
+
+void Output::Finish() {
+  if (m_target.empty())
+    return;
+  const int fd = m_fd;
+  m_fd = -1;
+  if (close(fd) != 0 || std::rename(m_temporary.c_str(), m_target.c_str()) != 0)
+    throw SystemError(m_name);
+  unfinished = nullptr;
+  m_temporary.clear();
+}
+
+bool Output::IsTerminal() const { return isatty(m_fd) == 1; }
+
+bool Output::IsFedBackTo(const Input& input) const {
+  struct stat in, out;
+  return fstat(input.Descriptor(), &in) == 0 && fstat(m_fd, &out) == 0 && S_ISREG(out.st_mode) &&
+         in.st_dev == out.st_dev && in.st_ino == out.st_ino;
+}
+
+} // namespace transcode

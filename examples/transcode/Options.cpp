@@ -1,0 +1,76 @@
+#include "Options.h"
+
+#include <cstring>
+
+#include <getopt.h>
+
+namespace transcode {
+
+const char kUsage[] = "Usage: transcode [--from ENC] [--to ENC] [-o OUT] [--report] [--quiet] [FILE]\n";
+const char kHelp[] =
+    "Converts text from one encoding to another, of any length in little memory.\n"
+    "\n"
+    "  -f, --from ENC    encoding of the input: utf-8 (default), utf-16le, utf-16be or ascii\n"
+    "  -t, --to ENC      encoding of the output: utf-8 (default), utf-16le or utf-16be\n"
+    "  -o, --output OUT  write to the file OUT instead of standard output\n"
+    "  -r, --report      print what is in the text instead of the text; with -o, both\n"
+    "  -q, --quiet       show no progress on the terminal\n"
+    "  -h, --help        print this help\n"
+    "\n"
+    "Without FILE, or with - for FILE or OUT, the standard streams are used. A byte order mark\n"
+    "is text like any other. When the input is malformed, the place of the first fault is named\n"
+    "and the exit code is 1; 2 tells of wrong usage. A file OUT then stays as it was, but what\n"
+    "goes to standard output or a device has been written up to the fault.\n";
+
+namespace {
+
+struct EncodingName {
+  const char* name;
+  Encoding encoding;
+};
+constexpr EncodingName kEncodings[] = {{"utf-8", Encoding::kUtf8},
+                                       {"utf-16le", Encoding::kUtf16Le},
+                                       {"utf-16be", Encoding::kUtf16Be},
+                                       {"ascii", Encoding::kAscii}};
+
+Encoding ParseEncoding(const char* text) {
+  for (const EncodingName& e : kEncodings)
+    if (strcasecmp(text, e.name) == 0)
+      return e.encoding;
+  throw UsageError(std::string("unknown encoding '") + text + "'");
+}
+
+} // namespace
+
+const char* Name(Encoding encoding) { return kEncodings[static_cast<int>(encoding)].name; }
+
+Options ParseOptions(int argc, char** argv) {
+  static const option kOptions[] = {{"from", required_argument, nullptr, 'f'},
+                                    {"to", required_argument, nullptr, 't'},
+                                    {"output", required_argument, nullptr, 'o'},
+                                    {"report", no_argument, nullptr, 'r'},
+                                    {"quiet", no_argument, nullptr, 'q'},
+                                    {"help", no_argument, nullptr, 'h'},
+                                    {nullptr, 0, nullptr, 0}};
+  Options options;
+  for (int c; (c = getopt_long(argc, argv, "f:t:o:rqh", kOptions, nullptr)) != -1;) {
+    switch (c) {
+    case 'f': options.from = ParseEncoding(optarg); break;
+    case 't': options.to = ParseEncoding(optarg); break;
+    case 'o': options.output = optarg; break;
+    case 'r': options.report = true; break;
+    case 'q': options.quiet = true; break;
+    case 'h': options.help = true; break;
+    default: throw UsageError("");
+    }
+  }
+  if (argc - optind > 1)
+    throw UsageError("more than one FILE");
+  if (options.to == Encoding::kAscii)
+    throw UsageError("ascii is for input only: ASCII text is UTF-8 already");
+  if (optind < argc)
+    options.input = argv[optind];
+  return options;
+}
+
+} // namespace transcode

@@ -1,0 +1,36 @@
+// How far a long run has got, shown on the terminal.
+
+#pragma once
+
+#include <chrono>
+
+#include <utils/BasicTypes.h>
+
+namespace transcode {
+
+using mirel::ssize_t;
+
+/// A line on standard error, if that is the terminal that the program was started from. It appears only when
+/// the run takes longer than a moment, and goes with the object: before anything else is printed.
+class Progress {
+public:
+  /// total is 0 where it isn't known.
+  Progress(bool isWanted, ssize_t total);
+  ~Progress();
+  Progress(const Progress&) = delete;
+  Progress& operator=(const Progress&) = delete;
+
+  /// Counts bytes that are done.
+  void Add(ssize_t bytes);
+
+private:
+  typedef std::chrono::steady_clock Clock;
+
+  const bool m_isWanted;
+  const ssize_t m_total;
+  ssize_t m_done = 0;
+  bool m_isShown = false;
+  Clock::time_point m_next; ///< when to show something again
+};
+
+} // namespace transcode

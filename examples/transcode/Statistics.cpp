@@ -1,0 +1,114 @@
+#include "Statistics.h"
+
+#include <algorithm>
+#include <limits>
+
+#include <utils/xostream.h>
+
+namespace transcode {
+
+namespace {
+
+using mirel::char16;
+
+/// How many units of [p, end) are of a kind. The inner loop counts in units, which lets compilers look at as
+/// many of them at once as there are in a wide register.
+template <class Predicate> ssize_t Count(const char16* p, const char16* end, Predicate isOfKind) {
+  constexpr ssize_t kMax = std::numeric_limits<char16>::max();
+  ssize_t total = 0;
+  while (p != end) {
+    const char16* const stop = p + std::min(end - p, kMax);
+    char16 count = 0;
+    for (; p != stop; ++p)
+      count = static_cast<char16>(count + isOfKind(*p));
+    total += count;
+  }
+  return total;
+}
+
+/// A pair of surrogates is counted by the first of them.
+ssize_t CodePoints(const char16* p, const char16* end) {
+  return Count(p, end, [](char16 unit) { return (unit & 0xFC00) != 0xDC00; });
+}
+
+/// A sink that keeps what it is given.
+struct MemorySink : mirel::IOutputStream {
+  void WriteStream(const void* address, ssize_t count) override {
+    text.append(static_cast<const char*>(address), count);
+  }
+  void FlushStream() override {}
+  string8 text;
+};
+
+} // namespace
+
+void Statistics::Advance(const Blocks& block) {
+  const string16& text = block.Text();
+  m_bytes += static_cast<ssize_t>(block.Bytes().size());
+  const ssize_t newlines = Count(text.begin(), text.end(), [](char16 unit) { return unit == '\n'; });
+  const char16* lastLine = text.begin();
+  if (newlines > 0) {
+    lastLine += text.rfind('\n') + 1;
+    m_column = 0;
+  }
+  m_newlines += newlines;
+  m_column += CodePoints(lastLine, text.end());
+}
+
+void Statistics::Examine(Blocks& block) {
+  const string16& text = block.Text();
+  m_utf8Units += static_cast<ssize_t>(block.Utf8().size());
+  m_utf16Units += text.size();
+  m_codePoints += CodePoints(text.begin(), text.end());
+  m_asciiCodePoints += Count(text.begin(), text.end(), [](char16 unit) { return unit < 0x80; });
+  for (const char16* p = text.begin(); p != text.end();) {
+    const char16* const lineEnd = mirel::Find(p, text.end(), char16('\n'));
+    m_line += CodePoints(p, lineEnd);
+    m_longestLine = std::max(m_longestLine, m_line);
+    p = lineEnd;
+    if (p != text.end()) {
+      m_line = 0;
+      ++p;
+    }
+  }
+  m_comesBack = block.ComesBack() && m_comesBack;
+}
+
+std::string Statistics::Place() const {
+  return "byte " + std::to_string(m_bytes) + " (line " + std::to_string(m_newlines + 1) + ", column " +
+         std::to_string(m_column + 1) + ")";
+}
+
+string8 Statistics::Report(const std::string& title) const {
+  MemorySink sink;
+  mirel::xostream os(sink);
+  const auto row = [&os](const char* name, ssize_t value) {
+    os << name;
+    os.width(12);
+    os.put(value);
+    os.endl();
+  };
+  os << title.c_str() << ":";
+  os.Indent(2);
+  os.endl();
+  row("bytes                 ", m_bytes);
+  row("UTF-8 code units      ", m_utf8Units);
+  row("UTF-16 code units     ", m_utf16Units);
+  row("code points           ", m_codePoints);
+  row("lines                 ", m_newlines + (m_column > 0));
+  row("longest line          ", m_longestLine);
+  os << "ASCII code points     ";
+  os.width(12);
+  os.precision(4);
+  os.put(m_codePoints == 0
+             ? 0.0
+             : 100.0 * static_cast<double>(m_asciiCodePoints) / static_cast<double>(m_codePoints));
+  os << " %";
+  os.endl();
+  os << "way back              " << (m_comesBack ? "  same bytes" : " OTHER BYTES");
+  os.Indent(0);
+  os.endl();
+  return sink.text;
+}
+
+} // namespace transcode

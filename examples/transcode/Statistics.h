@@ -1,0 +1,39 @@
+// What there is to tell of a text that has gone by in blocks.
+
+#pragma once
+
+#include <string>
+
+#include <utils/xstring.h>
+
+#include "Blocks.h"
+
+namespace transcode {
+
+/// A line ends with a newline, which isn't counted to it; what follows the last newline is a line too.
+class Statistics {
+public:
+  /// Counts what tells where the text has got to.
+  void Advance(const Blocks& block);
+  /// Counts the rest of what the report tells. Comes after Advance with the same block.
+  void Examine(Blocks& block);
+
+  /// The place where the next block would start, in words: "byte 12 (line 2, column 1)".
+  std::string Place() const;
+  /// The table of it all under the given title.
+  string8 Report(const std::string& title) const;
+
+private:
+  ssize_t m_bytes = 0;
+  ssize_t m_newlines = 0;
+  ssize_t m_column = 0; ///< code points behind the last newline
+  ssize_t m_utf8Units = 0;
+  ssize_t m_utf16Units = 0;
+  ssize_t m_codePoints = 0;
+  ssize_t m_asciiCodePoints = 0;
+  ssize_t m_longestLine = 0;
+  ssize_t m_line = 0; ///< code points of the line that goes on in the next block
+  bool m_comesBack = true;
+};
+
+} // namespace transcode
