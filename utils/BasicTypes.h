@@ -8,6 +8,7 @@
 /// Marks a class or function that a program may use from the shared library; everything else stays hidden.
 #define MIREL_API __attribute__((visibility("default")))
 
+/// All that the library offers, but for the macros.
 namespace mirel {
 
 /// Signed size, count or index. What it counts (elements, bytes, code units) is said where it is used.
