@@ -604,8 +604,8 @@ public:
 
   /// @}
   /// @name Erasing
-  /// Moves the elements behind down in one step, and so invalidates what points there; the storage stays. A
-  /// count can't be npos.
+  /// Removes elements. Those behind move down in one step, which invalidates what points there; the storage
+  /// stays. A count can't be npos.
   /// @{
 
   /// The elements of [i1, i2). @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
