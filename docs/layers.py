@@ -46,7 +46,9 @@ def main():
     if loops:
         sys.exit(f"headers include each other: {', '.join(loops)}")
 
-    print('digraph layers {\nnode [shape=box, margin="0.2,0.1", fontname="sans-serif", fontsize=10]\nedge [arrowsize=0.6]')
+    print('digraph layers {')
+    print('node [shape=box, margin="0.2,0.1", fontname="sans-serif", fontsize=10]')
+    print('edge [arrowsize=0.6]')
     for name, path in {**sources, **headers}.items():
         lines = textwrap.wrap(summary(path), 44)
         title = path.relative_to(directory.parent)
