@@ -17,13 +17,14 @@
 #define MIREL_DESCRIBED
 #endif
 
+/// All that the library offers, but for the macros.
 namespace mirel {
 
 /// Signed size, count or index. What it counts (elements, bytes, code units) is said where it is used.
 typedef intptr_t ssize_t;
 
-typedef uint8_t uint8;
-typedef uint16_t uint16;
-typedef int64_t int64;
+typedef uint8_t uint8;   ///< A byte.
+typedef uint16_t uint16; ///< The storage of a UTF-16 code unit.
+typedef int64_t int64;   ///< What streams count in.
 
 } // namespace mirel

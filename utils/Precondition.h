@@ -14,6 +14,8 @@ namespace mirel {
 /// Reports a violated precondition through the C library's assertion facility and ends the process (SIGABRT).
 ///
 /// @param expression  what should have been true, as text
+/// @param file        source file of the check
+/// @param line        its line there
 /// @param function    signature of the function that made the check
 [[noreturn, gnu::cold]] MIREL_API void AssertionFailed(const char* expression, const char* file, int line,
                                                        const char* function);

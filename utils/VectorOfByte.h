@@ -32,7 +32,8 @@ template <class... N> using IfIntegers = std::enable_if_t<(kIsInteger<N> && ...)
 
 /// @name Comparing ranges
 /// A range is a pair of pointers or iterators, the second one past the last element. Code units compare as
-/// unsigned values in both widths. An empty range may be a pair of null pointers.
+/// unsigned values in both widths. An empty range may be a pair of null pointers. At worst the cost is linear
+/// in the shorter length.
 /// @{
 
 /// Orders two ranges by their first differing element; of a range and its proper prefix, the prefix is first.
@@ -63,7 +64,7 @@ inline int LexicographicalCompareX(const unsigned char* x1, const unsigned char*
   return lenX < lenY ? -1 : lenX > lenY;
 }
 
-/// The same for 8-bit code units, compared as bytes.
+/// The same for 8-bit code units, as bytes.
 inline int LexicographicalCompareX(const char* x1, const char* x2, const char* y1, const char* y2) {
   const auto bytes = [](const char* p) { return reinterpret_cast<const unsigned char*>(p); };
   return LexicographicalCompareX(bytes(x1), bytes(x2), bytes(y1), bytes(y2));
@@ -73,6 +74,7 @@ inline int LexicographicalCompareX(const char* x1, const char* x2, const char* y
 inline bool IsEqual(const char8* x1, const char8* x2, const char8* y1) {
   return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1)) == 0;
 }
+/// The same for 16-bit code units.
 inline bool IsEqual(const uint16* x1, const uint16* x2, const uint16* y1) {
   return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1) * sizeof(uint16)) == 0;
 }
@@ -88,7 +90,9 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 /// @}
 /// @name Searching ranges
 /// Each search returns a position in the searched range, or that range's end when nothing is found. None
-/// prepares anything: at worst the cost is the product of the two lengths.
+/// prepares anything: at worst the cost is the length searched for one element, and the product of the two
+/// lengths for a range. Pointers to code units have overloads of the same names and results, found several
+/// times as fast in longer ranges.
 /// @{
 
 /// The first element equal to v, or i2.
@@ -182,10 +186,9 @@ using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T
 
 } // namespace detail
 
-/// @name The same for code units
-/// Overload resolution prefers these for pointers to const code units. The results are those of the templates
-/// above, found several times as fast in longer ranges.
-/// @{
+// Overload resolution prefers these for pointers to const code units. The results are those of the templates
+// above, so the reference leaves them out.
+/// @cond
 
 template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T* i2, const T& v) {
   return detail::ByBlock<T>::Find(i1, i2, v);
@@ -232,12 +235,13 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
                                  : detail::CompareByBlock(x1, x2, y1, y2);
 }
 
-/// @}
+/// @endcond
 
 /// An untyped, growable array of bytes: the storage of every vector and string.
 ///
 /// Parameters: `i` is an offset or an iterator, `n` a number of bytes from there, `i1`/`i2` and `r1`/`r2` the
-/// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a repeat count.
+/// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a repeat count. Overloads that
+/// are templates take integers of any type and do what the overload before them does.
 ///
 /// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments
 /// stop the process with the text after "@pre". Memory that can't be had is std::bad_alloc, thrown before
@@ -246,8 +250,8 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 /// time per byte added, plus the bytes that it moves.
 class MIREL_DESCRIBED MIREL_API VectorOfByte {
 public:
-  typedef uint8 value_type;
-  typedef value_type* iterator;
+  typedef uint8 value_type;     ///< A byte.
+  typedef value_type* iterator; ///< A pointer into the storage.
 
   /// @name Construction, copy
   /// @{
@@ -258,10 +262,14 @@ public:
   VectorOfByte(const value_type* r1, const value_type* r2);
   /// count bytes of value x. @pre "0 <= count"
   explicit VectorOfByte(ssize_t count, value_type x);
+  /// The same for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0>
   explicit VectorOfByte(N count, X x) : VectorOfByte(ssize_t(count), value_type(x)) {}
+  /// The listed bytes.
   VectorOfByte(std::initializer_list<uint8> r);
+  /// A copy, whose capacity is its size.
   VectorOfByte(const VectorOfByte& r);
+  /// Gives the storage back.
   ~VectorOfByte() { Release(m_buffer); }
 
   /// Becomes a copy of r; keeps the storage where it is large enough.
@@ -273,12 +281,12 @@ public:
   /// @name Capacity
   /// @{
 
-  ssize_t size() const { return size_; }
-  ssize_t capacity() const { return m_capacity; }
-  bool empty() const { return size_ == 0; }
+  ssize_t size() const { return size_; }          ///< Bytes in use.
+  ssize_t capacity() const { return m_capacity; } ///< Bytes of storage.
+  bool empty() const { return size_ == 0; }       ///< Whether the size is 0.
 
-  /// Makes room for n bytes in all, exactly; does nothing where there is room. It is const so that a const
-  /// string can make room for its terminator; the contents stay as they are.
+  /// Makes room for n bytes in all, exactly; does nothing where there is room, as for a negative n. It is
+  /// const so that a const string can make room for its terminator; the contents stay as they are.
   void reserve(ssize_t n) const;
   /// Makes the size n bytes; new bytes have no particular value. @pre "0 <= n"
   void resize(ssize_t n);
@@ -298,35 +306,38 @@ public:
   /// data() and begin() are null in a buffer that has no storage yet.
   /// @{
 
-  value_type* begin() { return m_buffer; }
-  const value_type* begin() const { return m_buffer; }
-  value_type* end() { return m_buffer + size_; }
-  const value_type* end() const { return m_buffer + size_; }
-  value_type* data() { return m_buffer; }
-  const value_type* data() const { return m_buffer; }
-  value_type* data_end() { return m_buffer + size_; }
-  const value_type* data_end() const { return m_buffer + size_; }
+  value_type* begin() { return m_buffer; }                        ///< The first byte.
+  const value_type* begin() const { return m_buffer; }            ///< The first byte.
+  value_type* end() { return m_buffer + size_; }                  ///< Behind the last byte.
+  const value_type* end() const { return m_buffer + size_; }      ///< Behind the last byte.
+  value_type* data() { return m_buffer; }                         ///< As begin().
+  const value_type* data() const { return m_buffer; }             ///< As begin().
+  value_type* data_end() { return m_buffer + size_; }             ///< As end().
+  const value_type* data_end() const { return m_buffer + size_; } ///< As end().
 
-  /// Unchecked, so that it can address a gap that has just been opened.
+  /// The byte at offset i, unchecked, so that it can address a gap that has just been opened.
   value_type& operator[](ssize_t i) { return m_buffer[i]; }
-  /// @pre "0 <= i && i < size()"
+  /// The byte at offset i. @pre "0 <= i && i < size()"
   value_type operator[](ssize_t i) const {
     MIREL_ASSERT(0 <= i && i < size());
     return m_buffer[i];
   }
-  /// @pre "size() > 0", as in the three below
+  /// The first byte. @pre "size() > 0"
   value_type& front() {
     MIREL_ASSERT(size() > 0);
     return m_buffer[0];
   }
+  /// The first byte. @pre "size() > 0"
   value_type front() const {
     MIREL_ASSERT(size() > 0);
     return m_buffer[0];
   }
+  /// The last byte. @pre "size() > 0"
   value_type& back() {
     MIREL_ASSERT(size() > 0);
     return m_buffer[size_ - 1];
   }
+  /// The last byte. @pre "size() > 0"
   value_type back() const {
     MIREL_ASSERT(size() > 0);
     return m_buffer[size_ - 1];
@@ -370,31 +381,37 @@ public:
 
   /// @}
   /// @name Inserting
-  /// @pre "0 <= i && i <= size()", then "0 <= n", "r1 <= r2" or "0 <= count"
+  /// Before offset or iterator i.
   /// @{
 
-  /// Opens a gap of n bytes, of no particular value, before offset i.
+  /// Opens a gap of n bytes, of no particular value. @pre "0 <= i && i <= size()", then "0 <= n"
   void insertbytes(ssize_t i, ssize_t n);
-  /// Inserts the bytes of [r1, r2).
+  /// Inserts the bytes of [r1, r2). @pre "0 <= i && i <= size()", then "r1 <= r2"
   void insert(ssize_t i, const value_type* r1, const value_type* r2);
+  /// The same before an iterator.
   void insert(iterator i, const value_type* r1, const value_type* r2) { insert(i - begin(), r1, r2); }
-  /// Inserts count bytes of value x.
+  /// Inserts count bytes of value x. @pre "0 <= i && i <= size()", then "0 <= count"
   void insert(ssize_t i, ssize_t count, value_type x);
+  /// The same before an iterator.
   void insert(iterator i, ssize_t count, value_type x) { insert(i - begin(), count, x); }
-  /// Inserts one byte; the iterator form returns where it is now.
+  /// Inserts one byte. @pre "0 <= i && i <= size()"
   void insert(ssize_t i, value_type x) { insert(i, ssize_t(1), x); }
+  /// The same before an iterator. @return where the byte is now
   iterator insert(iterator i, value_type x);
 
-  /// Integers of any type: the offset forms above.
+  /// The bytes of [r1, r2), before an offset of any integer type.
   template <class N, detail::IfIntegers<N> = 0> void insert(N i, const value_type* r1, const value_type* r2) {
     insert(ssize_t(i), r1, r2);
   }
+  /// count bytes of value x, for integers of any type.
   template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
     insert(ssize_t(i), ssize_t(count), value_type(x));
   }
+  /// The same before an iterator.
   template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(iterator i, N count, X x) {
     insert(i - begin(), ssize_t(count), value_type(x));
   }
+  /// One byte, for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) {
     insert(ssize_t(i), value_type(x));
   }
@@ -412,6 +429,7 @@ public:
   iterator erase(iterator i);
   /// Removes n bytes from offset i on. @pre "0 <= i && 0 <= n && i+n <= size()"
   void erase(ssize_t i, ssize_t n);
+  /// The same for integers of any type.
   template <class N, class M, detail::IfIntegers<N, M> = 0> void erase(N i, M n) {
     erase(ssize_t(i), ssize_t(n));
   }
@@ -420,23 +438,34 @@ public:
 
   /// @}
   /// @name Comparison
-  /// The sign of compare() tells the order of the bytes as unsigned values.
+  /// The sign of compare() tells the order of the bytes as unsigned values. The cost is at worst linear in
+  /// the shorter length.
   /// @{
 
+  /// All bytes, with those of r.
   int compare(const VectorOfByte& r) const;
-  /// @pre "0 <= i && 0 <= n && i+n <= size()"
+  /// n bytes from offset i on, with those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const VectorOfByte& r) const;
-  /// @pre as above, then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  /// n bytes from offset i on, with rn of r from ri on.
+  /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   int compare(ssize_t i, ssize_t n, const VectorOfByte& r, ssize_t ri, ssize_t rn) const;
-  /// @pre as above, then "pn == 0 || (pn > 0 && p != nullptr)"
+  /// n bytes from offset i on, with the pn at p.
+  /// @pre "0 <= i && 0 <= n && i+n <= size()", then "pn == 0 || (pn > 0 && p != nullptr)"
   int compare(ssize_t i, ssize_t n, const value_type* p, ssize_t pn) const;
 
-  bool operator==(const VectorOfByte& r) const { return size_ == r.size_ && compare(r) == 0; }
-  bool operator!=(const VectorOfByte& r) const { return !(*this == r); }
-  bool operator<(const VectorOfByte& r) const { return compare(r) < 0; }
-  bool operator<=(const VectorOfByte& r) const { return compare(r) <= 0; }
-  bool operator>(const VectorOfByte& r) const { return compare(r) > 0; }
-  bool operator>=(const VectorOfByte& r) const { return compare(r) >= 0; }
+  /// @}
+  /// @name Relations
+  /// In the order of compare(); buffers of different sizes are unequal at once.
+  /// @{
+
+  bool operator==(const VectorOfByte& r) const {
+    return size_ == r.size_ && compare(r) == 0;
+  }                                                                        ///< Same bytes.
+  bool operator!=(const VectorOfByte& r) const { return !(*this == r); }   ///< Other bytes.
+  bool operator<(const VectorOfByte& r) const { return compare(r) < 0; }   ///< Before r.
+  bool operator<=(const VectorOfByte& r) const { return compare(r) <= 0; } ///< Before r or the same.
+  bool operator>(const VectorOfByte& r) const { return compare(r) > 0; }   ///< After r.
+  bool operator>=(const VectorOfByte& r) const { return compare(r) >= 0; } ///< After r or the same.
 
   /// @}
 

@@ -19,7 +19,8 @@ typedef int64 streamsize;
 class IndentingOutputStreamToOStream;
 
 /// Writes text to an IOutputStream, which must outlive it. What the sink throws leaves the member that was
-/// called; the next one tries again.
+/// called; the next one tries again. Bad arguments stop the process with the text given after "@pre", before
+/// anything is written. One thread at a time may use a stream.
 class MIREL_API xostream {
 public:
   /// A function that does something to a stream, for use with <<.
@@ -28,53 +29,58 @@ public:
   /// @name Construction
   /// @{
 
+  /// Will write to os. Memory that can't be had is std::bad_alloc.
   xostream(IOutputStream& os);
   /// Flushes nothing: all that was written is with the sink already.
   ~xostream();
-  /// Flushes; after it nothing reaches the sink any more.
+  /// Flushes; after it nothing reaches the sink any more, and writing does nothing.
   void close();
 
   /// @}
   /// @name Writing bytes as they are
   /// Zeros included; width and precision don't matter, the indent does. A null pointer may come with a count
   /// of 0.
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   /// @{
 
+  /// The pn bytes at p, handed to the sink before it returns. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void write(const xchar* p, ssize_t pn);
+  /// The same for bytes. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void writebytes(const uint8* p, ssize_t pn);
 
   /// @}
   /// @name Writing values
   /// As `<<` of the standard streams, padded to width(), which is 0 again afterwards. Wide characters are
-  /// written as UTF-8, and as U+FFFD where they are no code points by themselves.
+  /// written as UTF-8, and as U+FFFD where they are no code points by themselves. `<<` takes
+  /// strings and manipulators only.
   /// @{
 
-  void put(bool x);
-  void put(char x);
-  void put(signed char x);
-  void put(unsigned char x);
-  void put(wchar_t x);
-  void put(char16_t x);
-  void put(char32_t x);
-  void put(short x);
-  void put(unsigned short x);
-  void put(int x);
-  void put(unsigned int x);
-  void put(long x);
-  void put(unsigned long x);
-  void put(long long x);
-  void put(unsigned long long x);
-  void put(float x);
-  void put(double x);
-  void put(long double x);
-  void put(const void* x);
+  void put(bool x);               ///< 0 or 1.
+  void put(char x);               ///< One byte.
+  void put(signed char x);        ///< One byte.
+  void put(unsigned char x);      ///< One byte.
+  void put(wchar_t x);            ///< A code point in UTF-8.
+  void put(char16_t x);           ///< A code point in UTF-8; half a surrogate pair is U+FFFD.
+  void put(char32_t x);           ///< A code point in UTF-8.
+  void put(short x);              ///< A decimal number.
+  void put(unsigned short x);     ///< A decimal number, as a char16 is, which is this type.
+  void put(int x);                ///< A decimal number.
+  void put(unsigned int x);       ///< A decimal number.
+  void put(long x);               ///< A decimal number.
+  void put(unsigned long x);      ///< A decimal number.
+  void put(long long x);          ///< A decimal number.
+  void put(unsigned long long x); ///< A decimal number.
+  void put(float x);              ///< A number of precision() significant digits.
+  void put(double x);             ///< A number of precision() significant digits.
+  void put(long double x);        ///< A number of precision() significant digits.
+  void put(const void* x);        ///< An address, in hexadecimal.
   /// A zero-terminated run. @pre "x"
   void put(ConstString8Z x);
   /// A counted run. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void put(const char8* p, ssize_t pn);
   /// A counted run, padded to the given width in place of width().
+  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void put_internal(const xchar* p, ssize_t pn, ssize_t width);
+  /// Calls the manipulator with this stream, which it returns.
   xostream& operator<<(Manipulator manipulator) { return manipulator(*this); }
   xostream& operator<<(std::nullptr_t) = delete; // a literal 0 is no manipulator
 
@@ -94,14 +100,14 @@ public:
   /// The setters return the old value.
   /// @{
 
-  streamsize precision() const;
-  streamsize precision(streamsize x);
-  streamsize width() const;
-  streamsize width(streamsize x);
-  /// Sets the number of spaces that are put after each newline, before whatever comes next. @pre "0 <=
-  /// indent"
+  streamsize precision() const;       ///< Significant digits of a number with a point, 6 at first.
+  streamsize precision(streamsize x); ///< Sets that number.
+  streamsize width() const;           ///< Bytes that the next value is padded to, on the left; 0 at first.
+  streamsize width(streamsize x);     ///< Sets that number for the next value.
+  /// Sets the number of spaces that are put after each newline, before whatever comes next.
+  /// @pre "0 <= indent"
   void Indent(ssize_t indent);
-  ssize_t GetIndent() const;
+  ssize_t GetIndent() const; ///< That number of spaces, 0 at first.
 
   /// @}
 

@@ -18,6 +18,7 @@ class xostream;
 
 /// The number of code units before the first zero unit at s, which may not be null. Linear.
 inline ssize_t GetStringLength(const char8* s) { return static_cast<ssize_t>(std::strlen(s)); }
+/// The same of 16-bit code units.
 inline ssize_t GetStringLength(const char16* s) {
   const char16* end = s;
   while (*end != 0)
@@ -29,7 +30,7 @@ inline ssize_t GetStringLength(const char16* s) {
 ///
 /// Any of its units may be zero, and no terminator is kept: c_str() writes one behind the contents, where the
 /// next change may overwrite it. All that xvector offers is offered here too, and what is said there of bad
-/// arguments, memory, invalidation and aliasing holds.
+/// arguments, memory, invalidation, aliasing and cost holds.
 ///
 /// A zero-terminated argument (`const T*` without a count) must not be null, and ends before its first zero;
 /// it is measured once, before anything is checked or changed, and then treated as a pointer and count. The
@@ -41,11 +42,14 @@ public:
   /// @name Construction
   /// @{
 
+  /// An empty string, without storage.
   basic_xstring() {}
-  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"; npos isn't a count here
+  /// rn units of r from index ri on; npos isn't a count here.
+  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   basic_xstring(const basic_xstring<T>& r, ssize_t ri, ssize_t rn) : Base(r, ri, rn) {}
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)", of r and rn
+  /// The rn units at r. @pre "pn == 0 || (pn > 0 && p != nullptr)", of r and rn
   basic_xstring(const T* r, ssize_t rn) : Base(r, rn) {}
+  /// The same for counts of any integer type.
   template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
   basic_xstring(P r, N rn) : Base(static_cast<const T*>(r), ssize_t(rn)) {}
   /// A zero-terminated run.
@@ -53,21 +57,26 @@ public:
   basic_xstring(std::nullptr_t) = delete;
   /// count units x. @pre "0 <= count"
   explicit basic_xstring(ssize_t count, T x) : Base(count, x) {}
+  /// The same for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0>
   explicit basic_xstring(N count, X x) : Base(ssize_t(count), T(x)) {}
-  /// @pre "r1 <= r2"
+  /// The units of [r1, r2). @pre "r1 <= r2"
   basic_xstring(const T* r1, const T* r2) : Base(r1, r2) {}
+  /// A copy, whose capacity is its size.
   basic_xstring(const basic_xstring<T>& r) : Base(r) {}
   /// The units of a vector, as operator+ returns it. A template, so that braces are never taken for one.
   template <class V, std::enable_if_t<std::is_same_v<V, xvector<T>>, int> = 0>
   basic_xstring(const V& r) : Base(r) {}
+  /// Gives the storage back.
   ~basic_xstring() {}
 
   /// @}
   /// @name Assignment
   /// @{
 
+  /// Becomes a copy of r; keeps the storage where it is large enough.
   basic_xstring<T>& operator=(const basic_xstring<T>& r) = default;
+  /// Becomes a copy of a zero-terminated run.
   basic_xstring<T>& operator=(const T* rhs) { return assign(rhs); }
   basic_xstring<T>& operator=(std::nullptr_t) = delete;
   /// The listed units. Without it `s = {}` would be a null pointer.
@@ -76,6 +85,7 @@ public:
     return *this;
   }
   using Base::assign;
+  /// Becomes a copy of a zero-terminated run.
   basic_xstring<T>& assign(const T* s) {
     assign(s, GetStringLength(s));
     return *this;
@@ -108,22 +118,26 @@ public:
   /// @{
 
   using Base::operator+=;
+  /// Appends a zero-terminated run.
   basic_xstring<T>& operator+=(const T* s) { return append(s); }
   basic_xstring<T>& operator+=(std::nullptr_t) = delete;
+  /// Appends one unit, given as an integer of any type.
   template <class X, detail::IfIntegers<X> = 0> xvector<T>& operator+=(X x) { return Base::operator+=(T(x)); }
   using Base::append;
+  /// Appends a zero-terminated run.
   basic_xstring<T>& append(const T* s) {
     this->push_back(s, s + GetStringLength(s));
     return *this;
   }
   basic_xstring<T>& append(std::nullptr_t) = delete;
   using Base::insert;
-  /// @pre "0 <= i && i <= size()"
+  /// Inserts a zero-terminated run before index i. @pre "0 <= i && i <= size()"
   basic_xstring<T>& insert(ssize_t i, const T* s) {
     insert(i, s, s + GetStringLength(s));
     return *this;
   }
   using Base::replace;
+  /// Puts a zero-terminated run in the place of n units from index i on.
   /// @pre "0 <= i && 0 <= n && i+n <= size()"
   basic_xstring<T>& replace(ssize_t i, ssize_t n, const T* p) {
     replace(i, n, p, GetStringLength(p));
@@ -135,65 +149,87 @@ public:
   /// @{
 
   using Base::compare;
+  /// With a zero-terminated run.
   int compare(const T* p) const { return compare(p, GetStringLength(p)); }
   int compare(std::nullptr_t) const = delete;
-  /// @pre "0 <= i && 0 <= n && i+n <= size()"
+  /// n units from index i on, with a zero-terminated run. @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const T* p) const { return compare(i, n, p, GetStringLength(p)); }
   using Base::_Eq;
+  /// Whether the string holds the units of a zero-terminated run.
   bool _Eq(const T* rhs) const { return compare(rhs) == 0; }
   bool _Eq(std::nullptr_t) const = delete;
   using Base::_Lt;
+  /// Whether the string orders before a zero-terminated run.
   bool _Lt(const T* rhs) const { return compare(rhs) < 0; }
   bool _Lt(std::nullptr_t) const = delete;
 
   /// @}
   /// @name Search
-  /// An integer of any type is a unit: find(0) looks for a zero unit, not at a null pointer.
+  /// An integer of any type is a unit: find(0) looks for a zero unit, not at a null pointer. Results, and
+  /// what offset may be, are as in the vector's searches: from offset on forwards
+  /// @pre "0 <= offset && offset <= size()"
+  ///
+  /// and from offset down to 0 in reverse, npos being the last unit.
+  /// @pre "offset == npos || (0 <= offset && offset < size())"
   /// @{
 
   using Base::find;
+  /// The first occurrence of a zero-terminated run; of an empty one, offset.
   ssize_t find(const T* p, ssize_t offset = 0) const { return find(p, p + GetStringLength(p), offset); }
+  /// The first unit that is c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t find(X c, ssize_t offset = 0) const {
     return Base::find(T(c), offset);
   }
   using Base::rfind;
+  /// The last occurrence of a zero-terminated run that starts at or before offset; of an empty one, offset,
+  /// for npos size().
   ssize_t rfind(const T* p, ssize_t offset = Base::npos) const {
     return rfind(p, p + GetStringLength(p), offset);
   }
+  /// The last unit at or before offset that is c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t rfind(X c, ssize_t offset = Base::npos) const {
     return Base::rfind(T(c), offset);
   }
   using Base::find_first_of;
+  /// The first unit that occurs in a zero-terminated set.
   ssize_t find_first_of(const T* s, ssize_t offset = 0) const {
     return find_first_of(s, s + GetStringLength(s), offset);
   }
+  /// The first unit that is c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t find_first_of(X c, ssize_t offset = 0) const {
     return Base::find_first_of(T(c), offset);
   }
   using Base::find_first_not_of;
+  /// The first unit that doesn't occur in a zero-terminated set.
   ssize_t find_first_not_of(const T* s, ssize_t offset = 0) const {
     return find_first_not_of(s, s + GetStringLength(s), offset);
   }
+  /// The first unit that is not c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t find_first_not_of(X c, ssize_t offset = 0) const {
     return Base::find_first_not_of(T(c), offset);
   }
   using Base::find_last_of;
+  /// The last unit at or before offset that occurs in a zero-terminated set.
   ssize_t find_last_of(const T* s, ssize_t offset = Base::npos) const {
     return find_last_of(s, s + GetStringLength(s), offset);
   }
+  /// The last unit at or before offset that is c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t find_last_of(X c, ssize_t offset = Base::npos) const {
     return Base::find_last_of(T(c), offset);
   }
   using Base::find_last_not_of;
+  /// The last unit at or before offset that doesn't occur in a zero-terminated set.
   ssize_t find_last_not_of(const T* s, ssize_t offset = Base::npos) const {
     return find_last_not_of(s, s + GetStringLength(s), offset);
   }
+  /// The last unit at or before offset that is not c.
   template <class X, detail::IfIntegers<X> = 0>
   ssize_t find_last_not_of(X c, ssize_t offset = Base::npos) const {
     return Base::find_last_not_of(T(c), offset);
   }
 
-  /// As the vector's, but a string.
+  /// A new string: count units from index offset on, npos being all that follow.
+  /// @pre "0 <= offset && offset <= size()", then "count == npos || (0 <= count && offset+count <= size())"
   basic_xstring<T> substr(ssize_t offset = 0, ssize_t count = Base::npos) const {
     Base units = Base::substr(offset, count);
     basic_xstring<T> result;
@@ -207,9 +243,9 @@ public:
 /// Exchanges the contents of two strings in constant time.
 template <class T> void swap(basic_xstring<T>& a, basic_xstring<T>& b) noexcept { a.swap(b); }
 
-typedef basic_xstring<char8> string8;
-typedef basic_xstring<char16> string16;
-typedef basic_xstring<char> xstring;
+typedef basic_xstring<char8> string8;   ///< A string of UTF-8 code units, or of any bytes.
+typedef basic_xstring<char16> string16; ///< A string of UTF-16 code units.
+typedef basic_xstring<char> xstring;    ///< A string of plain char, the same type as string8.
 
 extern template class xvector<char8>;
 extern template class basic_xstring<char8>;
@@ -217,30 +253,40 @@ extern template class xvector<char16>;
 extern template class basic_xstring<char16>;
 
 /// @name Conversions
-/// Replace the contents of the destination with those of the run of srcLen units at src, in one pass. UTF-16
-/// is in the machine's own byte order; a byte order mark is a code point like any other, and so is a zero.
-/// What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for UTF-16.
-/// Memory that can't be had is std::bad_alloc and leaves the destination partly filled.
+/// Replace the contents of the destination with those of the run of srcLen units at src, in one pass and in
+/// linear time. UTF-16 is in the machine's own byte order; a byte order mark is a code point like any other,
+/// and so is a zero. What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition
+/// D91 for UTF-16. Memory that can't be had is std::bad_alloc and leaves the destination partly filled. The
+/// source may not lie in the destination; a null pointer may come with a count of 0.
 /// @{
 
 /// One unit for each byte: its value, or "?" for bytes from 0x80 on. @pre "newSize >= 0", of srcLen
 MIREL_API void Utf16FromAscii(string16& dst, const char8* src, ssize_t srcLen);
 
+/// UTF-8 to UTF-16.
 /// @return false where the source is malformed or cut off; then what precedes the bad sequence has been
 /// converted
 /// @pre "srcLen >= 0"
 MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src, ssize_t srcLen);
 /// The same for a zero-terminated run. @pre "src"
 MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src);
+/// UTF-16 to UTF-8.
+/// @return as the way there
+/// @pre "srcLen >= 0"
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src, ssize_t srcLen);
+/// The same for a zero-terminated run. @pre "src"
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src);
 
 /// What the four above do, for generic code: (char16, char8) is UTF-8 to UTF-16, (char8, char16) the way
 /// back.
+/// @return as theirs
+/// @pre "srcLen >= 0"
 template <class CharOut, class CharIn>
 bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen);
+/// @cond
 extern template MIREL_API bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);
 extern template MIREL_API bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen);
+/// @endcond
 
 /// @}
 

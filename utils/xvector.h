@@ -38,6 +38,7 @@ inline void p_create(char8* r1, char8* r2, char8 x) {
   if (r1 < r2)
     std::memset(r1, x, static_cast<std::size_t>(r2 - r1));
 }
+/// The same for 16-bit code units.
 inline void p_create(char16* r1, char16* r2, char16 x) { assigning_p_create<char16>(r1, r2, x); }
 
 /// Copies [src1, src2) to the run at dst, which may not overlap it, as one block.
@@ -55,15 +56,18 @@ template <class T, class It> void p_copy(T* dst, It src1, It src2) {
   for (; src1 != src2; ++src1, ++dst)
     *dst = *src1;
 }
+/// The same for 8-bit code units, as memcpy_p_copy().
 inline void p_copy(char8* dst, const char8* src1, const char8* src2) {
   memcpy_p_copy<char8>(dst, src1, src2);
 }
+/// The same for 16-bit code units, as memcpy_p_copy().
 inline void p_copy(char16* dst, const char16* src1, const char16* src2) {
   memcpy_p_copy<char16>(dst, src1, src2);
 }
 
 /// Destroys a run: nothing to do for code units.
 inline void p_del(char8*, char8*) {}
+/// The same for 16-bit code units.
 inline void p_del(char16*, char16*) {}
 
 /// @}
@@ -113,13 +117,13 @@ public:
   /// @name Types
   /// @{
 
-  typedef T value_type;
-  typedef T* iterator;
-  typedef const T* const_iterator;
-  typedef T& reference;
-  typedef const T& const_reference;
-  typedef ssize_t size_type;
-  typedef std::ptrdiff_t difference_type;
+  typedef T value_type;                   ///< An element.
+  typedef T* iterator;                    ///< A pointer into the storage.
+  typedef const T* const_iterator;        ///< The same to const elements.
+  typedef T& reference;                   ///< An element in place.
+  typedef const T& const_reference;       ///< The same to const elements.
+  typedef ssize_t size_type;              ///< A count or index, signed.
+  typedef std::ptrdiff_t difference_type; ///< The distance of two iterators.
 
   /// As a count: up to the end. As the start of a reverse search: the last element. As a result: not found.
   enum { npos = -1 };
@@ -128,73 +132,88 @@ public:
   /// @pre "p" of every dereference and step: only a null pointer is caught
   class const_reverse_iterator {
   public:
-    typedef std::bidirectional_iterator_tag iterator_category;
-    typedef T value_type;
-    typedef std::ptrdiff_t difference_type;
-    typedef const T* pointer;
-    typedef const T& reference;
+    typedef std::bidirectional_iterator_tag iterator_category; ///< It goes both ways.
+    typedef T value_type;                                      ///< An element.
+    typedef std::ptrdiff_t difference_type;                    ///< The distance of two iterators.
+    typedef const T* pointer;                                  ///< What -> gives.
+    typedef const T& reference;                                ///< What * gives.
 
+    /// Designates the element before _p.
     explicit const_reverse_iterator(const T* _p) : p(_p) {}
     /// The pointer held, one past the element designated.
     operator const T*() const { return p; }
+    /// The element designated.
     const T& operator*() const {
       MIREL_ASSERT(p);
       return p[-1];
     }
+    /// The same for its members.
     const T* operator->() const {
       MIREL_ASSERT(p);
       return p - 1;
     }
+    /// Steps towards the first element.
     const_reverse_iterator& operator++() {
       MIREL_ASSERT(p);
       --p;
       return *this;
     }
+    /// The same. @return where it was
     const const_reverse_iterator operator++(int) {
       const const_reverse_iterator old(*this);
       ++*this;
       return old;
     }
+    /// Steps towards the last element.
     const_reverse_iterator& operator--() {
       MIREL_ASSERT(p);
       ++p;
       return *this;
     }
+    /// The same. @return where it was
     const const_reverse_iterator operator--(int) {
       const const_reverse_iterator old(*this);
       --*this;
       return old;
     }
-    bool operator==(const const_reverse_iterator& rhs) const { return p == rhs.p; }
-    bool operator!=(const const_reverse_iterator& rhs) const { return p != rhs.p; }
+    bool operator==(const const_reverse_iterator& rhs) const { return p == rhs.p; } ///< Same place.
+    bool operator!=(const const_reverse_iterator& rhs) const { return p != rhs.p; } ///< Other place.
 
   protected:
-    const T* p;
+    const T* p; ///< One past the element designated.
   };
 
   /// The same over elements that may be changed.
   class reverse_iterator : public const_reverse_iterator {
   public:
-    typedef T* pointer;
-    typedef T& reference;
+    typedef T* pointer;   ///< What -> gives.
+    typedef T& reference; ///< What * gives.
 
+    /// Designates the element before _p.
     explicit reverse_iterator(T* _p) : const_reverse_iterator(_p) {}
+    /// The pointer held, one past the element designated.
     operator T*() const { return const_cast<T*>(this->p); }
+    /// The element designated.
     T& operator*() const { return const_cast<T&>(const_reverse_iterator::operator*()); }
+    /// The same for its members.
     T* operator->() const { return const_cast<T*>(const_reverse_iterator::operator->()); }
+    /// Steps towards the first element.
     reverse_iterator& operator++() {
       const_reverse_iterator::operator++();
       return *this;
     }
+    /// The same. @return where it was
     const reverse_iterator operator++(int) {
       const reverse_iterator old(*this);
       ++*this;
       return old;
     }
+    /// Steps towards the last element.
     reverse_iterator& operator--() {
       const_reverse_iterator::operator--();
       return *this;
     }
+    /// The same. @return where it was
     const reverse_iterator operator--(int) {
       const reverse_iterator old(*this);
       --*this;
@@ -209,10 +228,11 @@ public:
 
   /// An empty vector, without storage.
   xvector() {}
-  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  /// rn elements of r from index ri on. @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   xvector(const xvector<T>& r, ssize_t ri, ssize_t rn) { assign(r, ri, rn); }
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// The pn elements at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   xvector(const T* p, ssize_t pn) { assign(p, pn); }
+  /// The same for counts of any integer type.
   template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
   xvector(P p, N pn) : xvector(static_cast<const T*>(p), ssize_t(pn)) {}
   /// count elements equal to x. @pre "0 <= count"
@@ -220,15 +240,21 @@ public:
     MIREL_ASSERT(0 <= count);
     FillRun(0, 0, count, x);
   }
+  /// The same for int, and implicit.
   xvector(int count, const T& x) : xvector(ssize_t(count), x) {}
+  /// The same for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0>
   explicit xvector(N count, X x) : xvector(ssize_t(count), T(x)) {}
-  /// @pre "r1 <= r2"
+  /// The elements of [r1, r2). @pre "r1 <= r2"
   xvector(const T* r1, const T* r2) { assign(r1, r2); }
+  /// A copy.
   xvector(const xvector<T>& r) { assign(r); }
+  /// The listed elements.
   xvector(std::initializer_list<T> r) { assign(r.begin(), r.end()); }
+  /// Gives the storage back.
   ~xvector() { p_del(data(), data_end()); }
 
+  /// Becomes a copy of r; keeps the storage where it is large enough.
   xvector<T>& operator=(const xvector<T>& r) {
     if (this != &r)
       assign(r);
@@ -246,45 +272,52 @@ public:
     MIREL_ASSERT(size >= 0);
     m_buffer.reserve(Bytes(size));
   }
+  /// How many elements there is room for in the storage.
   ssize_t capacity() const { return Elements(m_buffer.capacity()); }
   /// Drops elements at the end, or adds elements equal to x there. @pre "newSize >= 0"
   void resize(ssize_t newSize, const T& x);
-  bool empty() const { return m_buffer.empty(); }
-  ssize_t size() const { return Elements(m_buffer.size()); }
-  ssize_t length() const { return size(); }
+  bool empty() const { return m_buffer.empty(); }            ///< Whether there are no elements.
+  ssize_t size() const { return Elements(m_buffer.size()); } ///< How many elements there are.
+  ssize_t length() const { return size(); }                  ///< As size().
 
   /// @}
   /// @name Access
   /// data() is null in a vector that has no storage yet. The elements stand one behind the other.
   /// @{
 
+  /// The first element.
   const T* data() const { return reinterpret_cast<const T*>(m_buffer.begin()); }
-  T* data() { return reinterpret_cast<T*>(m_buffer.begin()); }
+  T* data() { return reinterpret_cast<T*>(m_buffer.begin()); } ///< The first element.
+  /// Behind the last element.
   const T* data_end() const { return reinterpret_cast<const T*>(m_buffer.end()); }
-  T* data_end() { return reinterpret_cast<T*>(m_buffer.end()); }
+  T* data_end() { return reinterpret_cast<T*>(m_buffer.end()); } ///< Behind the last element.
 
-  /// @pre "0 <= i && i < size()"
+  /// The element at index i. @pre "0 <= i && i < size()"
   const T& operator[](ssize_t i) const {
     MIREL_ASSERT(0 <= i && i < size());
     return begin()[i];
   }
+  /// The element at index i. @pre "0 <= i && i < size()"
   T& operator[](ssize_t i) {
     MIREL_ASSERT(0 <= i && i < size());
     return begin()[i];
   }
-  /// @pre "size() > 0", here and in the three below
+  /// The first element. @pre "size() > 0"
   const T& front() const {
     MIREL_ASSERT(size() > 0);
     return *begin();
   }
+  /// The first element. @pre "size() > 0"
   T& front() {
     MIREL_ASSERT(size() > 0);
     return *begin();
   }
+  /// The last element. @pre "size() > 0"
   const T& back() const {
     MIREL_ASSERT(size() > 0);
     return begin()[size() - 1];
   }
+  /// The last element. @pre "size() > 0"
   T& back() {
     MIREL_ASSERT(size() > 0);
     return begin()[size() - 1];
@@ -294,14 +327,16 @@ public:
   /// @name Iterators
   /// @{
 
-  const_iterator begin() const { return data(); }
-  const_iterator end() const { return data_end(); }
-  iterator begin() { return data(); }
-  iterator end() { return data_end(); }
+  const_iterator begin() const { return data(); }   ///< The first element.
+  const_iterator end() const { return data_end(); } ///< Behind the last element.
+  iterator begin() { return data(); }               ///< The first element.
+  iterator end() { return data_end(); }             ///< Behind the last element.
+  /// The last element.
   const_reverse_iterator rbegin() const { return const_reverse_iterator(end()); }
+  /// Before the first element.
   const_reverse_iterator rend() const { return const_reverse_iterator(begin()); }
-  reverse_iterator rbegin() { return reverse_iterator(end()); }
-  reverse_iterator rend() { return reverse_iterator(begin()); }
+  reverse_iterator rbegin() { return reverse_iterator(end()); } ///< The last element.
+  reverse_iterator rend() { return reverse_iterator(begin()); } ///< Before the first element.
 
   /// @}
   /// @name Assignment
@@ -316,13 +351,14 @@ public:
     const auto source = Source(r1, r2);
     ReplaceRun(0, size(), source.begin(), source.size());
   }
+  /// The elements of r.
   void assign(const xvector<T>& r) { ReplaceRun(0, size(), r.begin(), r.size()); }
-  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  /// rn elements of r from index ri on. @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   void assign(const xvector<T>& r, ssize_t ri, ssize_t rn) {
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
     ReplaceRun(0, size(), r.begin() + ri, rn);
   }
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// The pn elements at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void assign(const T* p, ssize_t pn) {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     ReplaceRun(0, size(), p, pn);
@@ -332,6 +368,7 @@ public:
     MIREL_ASSERT(0 <= count);
     FillRun(0, size(), count, x);
   }
+  /// The same for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0> void assign(N count, X x) {
     assign(ssize_t(count), T(x));
   }
@@ -340,7 +377,7 @@ public:
     p_del(data(), data_end());
     m_buffer.clear();
   }
-  void clear() { erase(); }
+  void clear() { erase(); } ///< As erase().
 
   /// @}
   /// @name Appending
@@ -356,8 +393,11 @@ public:
   }
   /// Appends the elements of [r1, r2) count times. @pre "0 <= count", then "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> void push_back(ssize_t count, It r1, It r2);
+  /// Inserts x before the first element.
   void push_front(const T& x) { insert(ssize_t(0), x); }
+  /// Appends the elements of r.
   xvector<T>& operator+=(const xvector<T>& r) { return append(r); }
+  /// Appends x.
   xvector<T>& operator+=(const T& x) {
     push_back(x);
     return *this;
@@ -370,6 +410,7 @@ public:
     z.append(r);
     return z;
   }
+  /// A new vector: the elements of this one, then x. Allocates once.
   const xvector<T> operator+(const T& x) const {
     xvector<T> z;
     z.reserve(size() + 1);
@@ -385,17 +426,18 @@ public:
     swap(product);
     return *this;
   }
+  /// Appends the elements of r.
   xvector<T>& append(const xvector<T>& r) {
     Append(r.begin(), r.size());
     return *this;
   }
-  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  /// Appends rn elements of r from index ri on. @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   xvector<T>& append(const xvector<T>& r, ssize_t ri, ssize_t rn) {
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
     Append(r.begin() + ri, rn);
     return *this;
   }
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// Appends the pn elements at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   xvector<T>& append(const T* p, ssize_t pn) {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     Append(p, pn);
@@ -407,6 +449,7 @@ public:
     FillRun(size(), 0, count, x);
     return *this;
   }
+  /// The same for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0> xvector<T>& append(N count, X x) {
     return append(ssize_t(count), T(x));
   }
@@ -426,114 +469,134 @@ public:
 
   /// @}
   /// @name Inserting
-  /// Inserts before index or iterator i. @pre "0 <= i && i <= size()" of every overload, after those on r and
-  /// p
+  /// Before index or iterator i. Before an iterator the precondition is on its distance from begin().
   /// @{
 
-  /// The elements of [r1, r2), which may be any iterators as in assign(). @pre "r1 <= r2", last
+  /// Inserts the elements of [r1, r2), which may be any iterators as in assign().
+  /// @pre "0 <= i && i <= size()", then "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> void insert(ssize_t i, It r1, It r2) {
     MIREL_ASSERT(0 <= i && i <= size());
     MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     const auto source = Source(r1, r2);
     ReplaceRun(i, 0, source.begin(), source.size());
   }
+  /// Inserts the elements of r. @pre "0 <= i && i <= size()"
   void insert(ssize_t i, const xvector<T>& r) {
     MIREL_ASSERT(0 <= i && i <= size());
     ReplaceRun(i, 0, r.begin(), r.size());
   }
-  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  /// Inserts rn elements of r from index ri on.
+  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()", then "0 <= i && i <= size()"
   void insert(ssize_t i, const xvector<T>& r, ssize_t ri, ssize_t rn) {
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
     MIREL_ASSERT(0 <= i && i <= size());
     ReplaceRun(i, 0, r.begin() + ri, rn);
   }
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// Inserts the pn elements at p. @pre "pn == 0 || (pn > 0 && p != nullptr)", then "0 <= i && i <= size()"
   void insert(ssize_t i, const T* p, ssize_t pn) {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     MIREL_ASSERT(0 <= i && i <= size());
     ReplaceRun(i, 0, p, pn);
   }
+  /// Inserts x. @pre "0 <= i && i <= size()"
   void insert(ssize_t i, const T& x) {
     MIREL_ASSERT(0 <= i && i <= size());
     FillRun(i, 0, 1, x);
   }
+  /// The same for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) {
     insert(ssize_t(i), T(x));
   }
-  /// @return where the new element is
+  /// Inserts x before an iterator. @return where it is now
   iterator insert(iterator i, const T& x) {
     const ssize_t n = i - begin();
     insert(n, x);
     return begin() + n;
   }
-  /// count elements equal to x. @pre "0 <= count", last
+  /// Inserts count elements equal to x. @pre "0 <= i && i <= size()", then "0 <= count"
   void insert(ssize_t i, ssize_t count, const T& x) {
     MIREL_ASSERT(0 <= i && i <= size());
     MIREL_ASSERT(0 <= count);
     FillRun(i, 0, count, x);
   }
+  /// The same before an iterator.
   void insert(iterator i, ssize_t count, const T& x) { insert(i - begin(), count, x); }
+  /// The same for int.
   void insert(iterator i, int count, const T& x) { insert(i, ssize_t(count), x); }
+  /// The same before an index.
   void insert(ssize_t i, int count, const T& x) { insert(i, ssize_t(count), x); }
+  /// count elements equal to x before an iterator, for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(iterator i, N count, X x) {
     insert(i, ssize_t(count), T(x));
   }
+  /// The same before an index.
   template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
     insert(ssize_t(i), ssize_t(count), T(x));
   }
 
   /// @}
   /// @name Replacing
-  /// Replaces the n elements from index i on, or those of [i1, i2). @pre "0 <= i && 0 <= n && i+n <= size()"
-  /// or "begin() <= i1 && i1 <= i2 && i2 <= end()", then those on what is put there
+  /// The n elements from index i on, or those of [i1, i2), by others.
   /// @{
 
+  /// By the elements of r. @pre "0 <= i && 0 <= n && i+n <= size()"
   void replace(ssize_t i, ssize_t n, const xvector<T>& r) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     ReplaceRun(i, n, r.begin(), r.size());
   }
+  /// The same for integers of any type.
   template <class N, class M, detail::IfIntegers<N, M> = 0> void replace(N i, M n, const xvector<T>& r) {
     replace(ssize_t(i), ssize_t(n), r);
   }
-  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  /// By rn elements of r from index ri on.
+  /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   void replace(ssize_t i, ssize_t n, const xvector<T>& r, ssize_t ri, ssize_t rn) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
     ReplaceRun(i, n, r.begin() + ri, rn);
   }
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// By the pn elements at p.
+  /// @pre "0 <= i && 0 <= n && i+n <= size()", then "pn == 0 || (pn > 0 && p != nullptr)"
   void replace(ssize_t i, ssize_t n, const T* p, ssize_t pn) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     ReplaceRun(i, n, p, pn);
   }
+  /// The same for integers of any type.
   template <class N, class M, detail::IfIntegers<N, M> = 0> void replace(N i, M n, const T* p, ssize_t pn) {
     replace(ssize_t(i), ssize_t(n), p, pn);
   }
-  /// count elements equal to x. @pre "0 <= count"
+  /// By count elements equal to x. @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= count"
   void replace(ssize_t i, ssize_t n, ssize_t count, const T& x) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT(0 <= count);
     FillRun(i, n, count, x);
   }
+  /// The same for integers of any type.
   template <class N, class M, class K, class X, detail::IfIntegers<N, M, K, X> = 0>
   void replace(N i, M n, K count, X x) {
     replace(ssize_t(i), ssize_t(n), ssize_t(count), T(x));
   }
+  /// The elements of [i1, i2) by those of r. @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
   void replace(iterator i1, iterator i2, const xvector<T>& r) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
     ReplaceRun(i1 - begin(), i2 - i1, r.begin(), r.size());
   }
+  /// The elements of [i1, i2) by the pn at p.
+  /// @pre "begin() <= i1 && i1 <= i2 && i2 <= end()", then "pn == 0 || (pn > 0 && p != nullptr)"
   void replace(iterator i1, iterator i2, const T* p, ssize_t pn) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     ReplaceRun(i1 - begin(), i2 - i1, p, pn);
   }
+  /// The elements of [i1, i2) by count elements equal to x.
+  /// @pre "begin() <= i1 && i1 <= i2 && i2 <= end()", then "0 <= count"
   void replace(iterator i1, iterator i2, ssize_t count, const T& x) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
     MIREL_ASSERT(0 <= count);
     FillRun(i1 - begin(), i2 - i1, count, x);
   }
+  /// The same for integers of any type.
   template <class N, class X, detail::IfIntegers<N, X> = 0>
   void replace(iterator i1, iterator i2, N count, X x) {
     replace(i1, i2, ssize_t(count), T(x));
@@ -541,7 +604,8 @@ public:
 
   /// @}
   /// @name Erasing
-  /// Moves the elements behind down in one step; takes no npos.
+  /// Removes elements. Those behind move down in one step, which invalidates what points there; the storage
+  /// stays. A count can't be npos.
   /// @{
 
   /// The elements of [i1, i2). @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
@@ -563,6 +627,7 @@ public:
     MIREL_ASSERT_SUBRANGE(i, n, size());
     erase(begin() + i, begin() + i + n);
   }
+  /// The same for integers of any type.
   template <class N, class M, detail::IfIntegers<N, M> = 0> void erase(N i, M n) {
     erase(ssize_t(i), ssize_t(n));
   }
@@ -576,7 +641,7 @@ public:
     MIREL_ASSERT(0 <= i && i < size());
     erase(begin() + i);
   }
-  /// The first element. @pre "size() > 0"
+  /// The first element, in time linear in the size. @pre "size() > 0"
   void pop_front() {
     MIREL_ASSERT(size() > 0);
     erase_element(0);
@@ -595,30 +660,32 @@ public:
   /// @name Comparison
   /// By the first differing element as an unsigned value; of a vector and its proper prefix, the prefix is
   /// first. compare() is negative, 0 or positive: for char8 a difference is the value of memcmp, otherwise
-  /// -1, 0 or 1.
+  /// -1, 0 or 1. The cost is at worst linear in the shorter length.
   /// @{
 
+  /// All elements, with those of r.
   int compare(const xvector<T>& r) const {
     return LexicographicalCompareX(begin(), end(), r.begin(), r.end());
   }
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// All elements, with the pn at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   int compare(const T* p, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return LexicographicalCompareX(begin(), end(), p, p + pn);
   }
-  /// The n elements from index i on. @pre "0 <= i && 0 <= n && i+n <= size()", here and below, before the
-  /// others
+  /// The n elements from index i on, with those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const xvector<T>& r) const {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     return LexicographicalCompareX(begin() + i, begin() + i + n, r.begin(), r.end());
   }
-  /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  /// The n elements from index i on, with rn of r from index ri on.
+  /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   int compare(ssize_t i, ssize_t n, const xvector<T>& r, ssize_t ri, ssize_t rn) const {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
     return LexicographicalCompareX(begin() + i, begin() + i + n, r.begin() + ri, r.begin() + ri + rn);
   }
-  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// The n elements from index i on, with the pn at p.
+  /// @pre "0 <= i && 0 <= n && i+n <= size()", then "pn == 0 || (pn > 0 && p != nullptr)"
   int compare(ssize_t i, ssize_t n, const T* p, ssize_t pn) const {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
@@ -645,15 +712,20 @@ public:
   /// Reverse searches go from index offset, npos being that of the last element, down to 0.
   /// @pre "offset == npos || (0 <= offset && offset < size())"
   ///
-  /// A pointer and count is checked first, a range last. @pre "pn == 0 || (pn > 0 && p != nullptr)", "r1 <=
-  /// r2"
+  /// A pointer and count is checked before offset, a range after it.
+  /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// @pre "r1 <= r2"
+  ///
+  /// Nothing is allocated. At worst the cost is the length searched for one element, and its product with the
+  /// length of the range or set otherwise.
   /// @{
 
-  /// The first occurrence. An empty range is found at offset.
+  /// The first element that is c.
   ssize_t find(const T& c, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
     return Index(Find(begin() + offset, end(), c), end());
   }
+  /// The first occurrence of a range. An empty one is found at offset.
   template <class It, detail::IfIterator<It> = 0> ssize_t find(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
     MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
@@ -661,90 +733,107 @@ public:
       return offset;
     return Index(FindFirstSubSequence(begin() + offset, end(), AsConst(r1), AsConst(r2)), end());
   }
+  /// The same of a vector.
   ssize_t find(const xvector<T>& r, ssize_t offset = 0) const { return find(r.begin(), r.end(), offset); }
+  /// The same of the pn elements at p.
   ssize_t find(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return find(p, p + pn, offset);
   }
 
-  /// The last occurrence that starts at or before offset; it may reach past it. An empty range is found at
-  /// offset, for npos at size().
+  /// The last element at or before offset that is c.
   ssize_t rfind(const T& c, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
     return Index(FindLast(begin(), After(offset), c), After(offset));
   }
+  /// The last occurrence of a range that starts at or before offset; it may reach past it. An empty one is
+  /// found at offset, for npos at size().
   template <class It, detail::IfIterator<It> = 0> ssize_t rfind(It r1, It r2, ssize_t offset = npos) const;
+  /// The same of a vector.
   ssize_t rfind(const xvector<T>& r, ssize_t offset = npos) const {
     return rfind(r.begin(), r.end(), offset);
   }
+  /// The same of the pn elements at p.
   ssize_t rfind(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return rfind(p, p + pn, offset);
   }
 
-  /// The first element that is c or occurs in the set. An empty set matches nothing.
+  /// The first element that is c.
   ssize_t find_first_of(const T& c, ssize_t offset = 0) const { return find(c, offset); }
+  /// The first element that occurs in a set. An empty one matches nothing.
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_first_of(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
     MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return Index(FindFirstOf(begin() + offset, end(), AsConst(r1), AsConst(r2)), end());
   }
+  /// The same of a vector. It isn't const: on a const vector give its range.
   ssize_t find_first_of(const xvector<T>& r, ssize_t offset = 0) {
     return find_first_of(r.begin(), r.end(), offset);
   }
+  /// The same of the pn elements at p.
   ssize_t find_first_of(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return find_first_of(p, p + pn, offset);
   }
 
-  /// The first element that is not c or doesn't occur in the set. An empty set excludes nothing.
+  /// The first element that is not c.
   ssize_t find_first_not_of(const T& c, ssize_t offset = 0) const {
     return find_first_not_of(&c, &c + 1, offset);
   }
+  /// The first element that doesn't occur in a set. An empty one excludes nothing.
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_first_not_of(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
     MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return Index(FindFirstNotOf(begin() + offset, end(), AsConst(r1), AsConst(r2)), end());
   }
+  /// The same of a vector. It isn't const: on a const vector give its range.
   ssize_t find_first_not_of(const xvector<T>& r, ssize_t offset = 0) {
     return find_first_not_of(r.begin(), r.end(), offset);
   }
+  /// The same of the pn elements at p.
   ssize_t find_first_not_of(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return find_first_not_of(p, p + pn, offset);
   }
 
-  /// The last element at or before offset that is c or occurs in the set.
+  /// The last element at or before offset that is c.
   ssize_t find_last_of(const T& c, ssize_t offset = npos) const { return rfind(c, offset); }
+  /// The last element at or before offset that occurs in a set.
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_last_of(It r1, It r2, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
     MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return Index(FindLastOf(begin(), After(offset), AsConst(r1), AsConst(r2)), After(offset));
   }
+  /// The same of a vector.
   ssize_t find_last_of(const xvector<T>& r, ssize_t offset = npos) const {
     return find_last_of(r.begin(), r.end(), offset);
   }
+  /// The same of the pn elements at p.
   ssize_t find_last_of(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return find_last_of(p, p + pn, offset);
   }
 
-  /// The last element at or before offset that is not c or doesn't occur in the set.
+  /// The last element at or before offset that is not c.
   ssize_t find_last_not_of(const T& c, ssize_t offset = npos) const {
     return find_last_not_of(&c, &c + 1, offset);
   }
+  /// The last element at or before offset that doesn't occur in a set.
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_last_not_of(It r1, It r2, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
     MIREL_ASSERT_AS(IsRange(r1, r2), "r1 <= r2");
     return Index(FindLastNotOf(begin(), After(offset), AsConst(r1), AsConst(r2)), After(offset));
   }
+  /// The same of a vector.
   ssize_t find_last_not_of(const xvector<T>& r, ssize_t offset = npos) const {
     return find_last_not_of(r.begin(), r.end(), offset);
   }
+  /// The same of the pn elements at p.
   ssize_t find_last_not_of(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return find_last_not_of(p, p + pn, offset);
