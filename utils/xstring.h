@@ -68,7 +68,10 @@ public:
   /// @{
 
   basic_xstring<T>& operator=(const basic_xstring<T>& r) = default;
-  basic_xstring<T>& operator=(const T* rhs) { return assign(rhs); }
+  basic_xstring<T>& operator=(const T* rhs) {
+    assign(rhs);
+    return *this;
+  }
   basic_xstring<T>& operator=(std::nullptr_t) = delete;
   /// The listed units. Without it `s = {}` would be a null pointer.
   basic_xstring<T>& operator=(std::initializer_list<T> r) {

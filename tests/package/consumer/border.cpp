@@ -12,7 +12,9 @@
 
 #include "middle.h"
 
-static_assert(MIREL_VERSION == MIREL_VERSION_MAJOR * 10000 + MIREL_VERSION_MINOR * 100 + MIREL_VERSION_PATCH, "");
+#if MIREL_VERSION < 100
+#error "The version is no number that a program can decide by"
+#endif
 
 namespace {
 

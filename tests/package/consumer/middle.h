@@ -1,4 +1,4 @@
-// What a shared library that hides everything else offers: strings, streams and exceptions go across its border.
+// What a shared library that hides everything else offers: strings, streams and exceptions cross its border.
 
 #pragma once
 
