@@ -94,7 +94,7 @@ def aarch64(row):
     if not (boost / "boost").exists():
         (boost / "boost").symlink_to("/usr/include/boost")
     suite(cxx="aarch64-linux-gnu-g++", flags="-O2", options=(
-        "-DCMAKE_SYSTEM_NAME=Linux", "-DCMAKE_SYSTEM_PROCESSOR=aarch64", f"-DBoost_INCLUDE_DIR={boost}",
+        "-DCMAKE_SYSTEM_NAME=Linux", "-DCMAKE_SYSTEM_PROCESSOR=aarch64", f"-DBoost_INCLUDE_DIRS={boost}",
         "-DCMAKE_CROSSCOMPILING_EMULATOR=qemu-aarch64;-L;/usr/aarch64-linux-gnu",
         f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}"))(row)
 

@@ -77,7 +77,10 @@ public:
   /// Becomes a copy of r; keeps the storage where it is large enough.
   basic_xstring<T>& operator=(const basic_xstring<T>& r) = default;
   /// Becomes a copy of a zero-terminated run.
-  basic_xstring<T>& operator=(const T* rhs) { return assign(rhs); }
+  basic_xstring<T>& operator=(const T* rhs) {
+    assign(rhs);
+    return *this;
+  }
   basic_xstring<T>& operator=(std::nullptr_t) = delete;
   /// The listed units. Without it `s = {}` would be a null pointer.
   basic_xstring<T>& operator=(std::initializer_list<T> r) {
