@@ -102,7 +102,7 @@ def main():
                 "-DMIREL_BUILD_TESTS=OFF", "-DMIREL_BUILD_EXAMPLES=OFF")
             run("cmake", "--build", f"{prefix}_build", "--target", "install", "-j2")
             for cxx, dwarf in itertools.product(compilers, ("-gdwarf-4", "-gdwarf-5")):
-                run(cxx, "-std=c++17", dwarf, f"-I{prefix}/include/mirel", f"{source}/tests/debugger_program.cpp", "-o",
+                run(cxx, "-std=c++17", dwarf, f"-I{prefix}/include/mirel", f"{source}/tests/package/debugger_program.cpp", "-o",
                     program, f"-L{prefix}/lib", "-lmirel_utils", f"-Wl,--gc-sections,-rpath,{prefix}/lib")
                 expect_all(*gdb(program, prefix))
             expect(gdb(program, prefix, LC_ALL="C")[0], ASCII)

@@ -33,8 +33,15 @@ if(SHARED)
   set(versioned ${LIBDIR}/libmirel_utils.so.${minor} ${LIBDIR}/libmirel_utils.so.${VERSION})
 endif()
 expect_files(runtime ${versioned})
+set(auto_load share/gdb/auto-load)
+set(printers ${auto_load}/mirel/mirel_printers.py)
+if(SHARED)
+  file(REAL_PATH ${dir}/development/${LIBDIR} real_libdir)
+  list(APPEND printers ${auto_load}${real_libdir}/libmirel_utils.so.${VERSION}-gdb.py)
+endif()
 expect_files(development ${headers} include/mirel/utils/Version.h ${libraries} ${LIBDIR}/pkgconfig/mirel.pc
   ${LIBDIR}/cmake/mirel/mirel-config.cmake ${LIBDIR}/cmake/mirel/mirel-config-version.cmake
-  ${LIBDIR}/cmake/mirel/mirel-targets.cmake ${LIBDIR}/cmake/mirel/mirel-targets-release.cmake)
+  ${LIBDIR}/cmake/mirel/mirel-targets.cmake ${LIBDIR}/cmake/mirel/mirel-targets-release.cmake
+  ${printers})
 
 file(RENAME ${dir}/prefix ${dir}/moved)

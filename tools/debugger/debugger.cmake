@@ -1,5 +1,6 @@
 # How a debugger finds the script that shows strings as text; docs/debugging.md tells users what comes of it.
-set(script ${CMAKE_CURRENT_SOURCE_DIR}/mirel_printers.py)
+block() # leaves no variables behind
+set(script ${CMAKE_CURRENT_LIST_DIR}/mirel_printers.py)
 set(script_dir gdb/auto-load/mirel)
 if(MIREL_INSTALL)
   install(FILES ${script} DESTINATION ${CMAKE_INSTALL_DATADIR}/${script_dir} COMPONENT development)
@@ -34,3 +35,4 @@ if(type STREQUAL STATIC_LIBRARY AND CMAKE_EXECUTABLE_FORMAT STREQUAL ELF)
       APPEND PROPERTY COMPILE_DEFINITIONS MIREL_GDB_SCRIPT="${MIREL_GDB_SCRIPT}")
   endif()
 endif()
+endblock()
