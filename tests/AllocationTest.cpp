@@ -123,6 +123,7 @@ TYPED_TEST(Allocation, AFailureChangesNothing) {
       [](S& s) { s.reserve(kMax); },
       [](S& s) { s.resize(kMax, 'x'); },
       [](S& s) { s.append(kMax, 'x'); },
+      [](S& s) { s.append((kMax - 1) / ssize_t(sizeof(TypeParam)), 'x'); },
       [](S& s) { s.insert(0, kMax / 2 + 1, 'x'); },
       [](S& s) { s.assign(kMax, 'x'); },
       [](S& s) { s *= kMax; },

@@ -87,6 +87,15 @@ def headers(row):
                         "-fsyntax-only", "/dev/null")
 
 
+def layout(row):
+    """The layout of the sources, and what clang-tidy finds in them."""
+    sources = [path for folder in ("utils", "examples", "tests", "benchmarks")
+               for path in sorted((ROOT / folder).rglob("*")) if path.suffix in (".h", ".cpp")]
+    row.run("clang-format", "--dry-run", "-Werror", *sources)
+    for source in sorted((ROOT / "utils" / "src").glob("*.cpp")) + sorted((ROOT / "examples" / "transcode").glob("*.cpp")):
+        row.run("clang-tidy", "--quiet", source, "--", "-std=c++17", "-I.")
+
+
 def aarch64(row):
     """The reference target, under emulation. Boost's headers are shown to the cross compiler without the host's."""
     boost = OUT / "boost"
@@ -148,6 +157,7 @@ ROWS = [
     Row("AArch64 under emulation", aarch64),
     Row("valgrind", valgrind),
     Row("headers alone", headers),
+    Row("clang-format, clang-tidy", layout),
     Row("g++ C++17 -O2", suite(flags="-O2")),
     Row("g++ C++20 -O3 NDEBUG unsigned char", suite(std=20, flags="-O3 -DNDEBUG -funsigned-char")),
     Row("g++ C++23 -O0 signed char", suite(std=23, flags="-O0 -fsigned-char")),
