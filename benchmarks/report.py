@@ -4,7 +4,7 @@
 usage: report.py OUTPUT-DIRECTORY NAME=RESULTS.json...
 
 A ratio is the peer's time divided by ours, so that above 1 we are ahead. Parties run in turn, again and again; the
-ratio is taken of the medians, and the spread is that of the ratios of single repetitions.
+ratio is taken of the medians, and the spread is the middle half of the ratios of single repetitions.
 """
 
 import csv
@@ -36,8 +36,8 @@ def read_times(path):
 
 
 def ratio(ours, theirs):
-    single = sorted(t / o for o, t in zip(ours, theirs))
-    return statistics.median(theirs) / statistics.median(ours), single[0], single[-1]
+    low, _, high = statistics.quantiles((t / o for o, t in zip(ours, theirs)), n=4)
+    return statistics.median(theirs) / statistics.median(ours), low, high
 
 
 def read_goals():
@@ -114,7 +114,7 @@ def main():
     repetitions = max(len(t) for case in next(iter(runs.values())).values() for t in case.values())
     lines = ["# Benchmarks", "",
              "Each number is a peer's time divided by ours on the same data in the same run: above 1 we are ahead.",
-             "In brackets is the spread of the ratio over single repetitions. Absolute times on a shared machine mean",
+             "In brackets is the middle half of the ratios of single repetitions. Absolute times on a shared machine mean",
              "little, so the tables have none. A row that is below its goal in any column says why.", "",
              f"- machine: {cpu}, {context['num_cpus']} cores at about {context['mhz_per_cpu']} MHz",
              "- columns: the compiler and optimisation of the program; the library is a release build (-O3) by the "

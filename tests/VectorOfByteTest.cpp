@@ -137,6 +137,8 @@ TEST(VectorOfByteTest, EditsAtAnyPlace) {
   const VectorOfByte c(b);
   EXPECT_EQ(c.size(), 10);
   EXPECT_EQ(c.front() + c.back() + c[9], 5 + 2 * c[9]);
+  b.reserve(40);
+  EXPECT_TRUE(b.owns(b.data() + 39) && !b.owns(b.data() + 40) && b.capacity() == 40);
   EXPECT_TRUE(c.data_end() - c.data() == 10 && b.owns(b.data()) && !b.owns(&b) &&
               !VectorOfByte().owns(nullptr));
 }

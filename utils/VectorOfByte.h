@@ -191,26 +191,31 @@ using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T
 /// @cond
 
 template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T* i2, const T& v) {
-  return detail::ByBlock<T>::Find(i1, i2, v);
+  const bool isPlain = sizeof(T) > 1 && detail::IsShort(i1, i2); // for bytes there is the C library
+  return isPlain ? Find<const T*, T>(i1, i2, v) : detail::ByBlock<T>::Find(i1, i2, v);
 }
 template <class T, detail::IfCodeUnit<T> = 0> const T* FindLast(const T* i1, const T* i2, const T& v) {
   return detail::IsShort(i1, i2) ? FindLast<const T*, T>(i1, i2, v) : detail::ByBlock<T>::FindLast(i1, i2, v);
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
-  if (y1 != y2 && !detail::IsShort(x1, x2))
+  if (y1 == y2)
+    return x1;
+  if (!detail::IsShort(x1, x2))
     return detail::ByBlock<T>::FindFirstSubSequence(x1, x2, y1, y2);
   for (const T* p = x1; x2 - p >= y2 - y1; ++p)
-    if (IsPrefix(p, x2, y1, y2))
+    if (*p == *y1 && IsEqual(y1, y2, p))
       return p;
   return x2;
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
-  if (y1 != y2 && !detail::IsShort(x1, x2))
+  if (y1 == y2)
+    return x2;
+  if (!detail::IsShort(x1, x2))
     return detail::ByBlock<T>::FindLastSubSequence(x1, x2, y1, y2);
   for (ssize_t i = (x2 - x1) - (y2 - y1); i >= 0; --i)
-    if (IsPrefix(x1 + i, x2, y1, y2))
+    if (x1[i] == *y1 && IsEqual(y1, y2, x1 + i))
       return x1 + i;
   return x2;
 }
@@ -231,8 +236,15 @@ const T* FindLastNotOf(const T* x1, const T* x2, const T* y1, const T* y2) {
   return detail::ByBlock<T>::FindLastNotOf(x1, x2, y1, y2);
 }
 inline int LexicographicalCompareX(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
-  return detail::IsShort(x1, x2) ? LexicographicalCompareX<const char16*, const char16*>(x1, x2, y1, y2)
-                                 : detail::CompareByBlock(x1, x2, y1, y2);
+  const ssize_t lenX = x2 - x1;
+  const ssize_t lenY = y2 - y1;
+  const ssize_t len = lenX < lenY ? lenX : lenY;
+  if (!detail::IsShort(x1, x1 + len))
+    return detail::CompareByBlock(x1, x2, y1, y2);
+  for (ssize_t i = 0; i < len; ++i)
+    if (x1[i] != y1[i])
+      return x1[i] < y1[i] ? -1 : 1;
+  return lenX < lenY ? -1 : lenX > lenY;
 }
 
 /// @endcond

@@ -907,10 +907,11 @@ private:
   void ReplaceRun(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRun(ssize_t i, ssize_t n, ssize_t count, T x);
 
-  /// Appends the pn elements at p: the most frequent edit, with nothing to call where there is room.
+  /// Appends the pn elements at p: the most frequent edit, with nothing to call where there is room. Then the
+  /// elements may also be some of this vector, since nothing moves.
   void Append(const T* p, ssize_t pn) {
     const ssize_t oldSize = size();
-    if (pn > capacity() - oldSize || m_buffer.owns(p))
+    if (pn > capacity() - oldSize)
       return ReplaceRun(oldSize, 0, p, pn);
     m_buffer.growbytes(pn * S);
     p_copy(begin() + oldSize, p, p + pn);

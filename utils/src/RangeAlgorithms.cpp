@@ -97,7 +97,7 @@ template <class T, class Plain, class F>
 const T* Forward(const T* x1, const T* x2, const Plain& plain, const F& hasHit) {
   const T* const far = x2 - x1 < kNear ? x2 : x1 + kNear;
   const T* const p = plain(x1, far);
-  if (p != far || far == x2)
+  if (p != far)
     return p;
   return plain(Skip(far, x2, hasHit), x2);
 }
@@ -107,7 +107,7 @@ template <class T, class Plain, class F>
 const T* Backward(const T* x1, const T* x2, const Plain& plain, const F& hasHit) {
   const T* const far = x2 - x1 < kNear ? x1 : x2 - kNear;
   const T* const p = plain(far, x2);
-  if (p != x2 || far == x1)
+  if (p != x2)
     return p;
   const T* const end = SkipBack(x1, far, hasHit);
   const T* const q = plain(x1, end);
