@@ -47,8 +47,8 @@ TEST(XOStream, FormatsValues) {
   EXPECT_EQ(put(3.14159) + put(2.5f) + put(1e30L), "3.142.51e+30");
   EXPECT_EQ(put("text") + put("text", 2) + put(reinterpret_cast<const void*>(0x1A)), "textte0x1a");
   EXPECT_EQ(put(L'\u00E9') + put(u'\u20AC') + put(U'\U0001F600'), "\u00E9\u20AC\U0001F600");
-  EXPECT_EQ(put(char16_t(0xD800)) + put(char32_t(0x110000)) + put(static_cast<wchar_t>(-1)),
-            "\uFFFD\uFFFD\uFFFD");
+  for (const char32_t c : {0xD800u, 0x110000u, 0x4010000u, 0xFFFFFFFFu})
+    EXPECT_EQ(put(c) + put(static_cast<wchar_t>(c)), "\uFFFD\uFFFD");
   os.width(3);
   EXPECT_EQ(put("a", 1), "  a");
   os.put("b", 1), os.put_internal("ab", 2, 5);
