@@ -41,7 +41,7 @@ void ReportState(int) {
 }
 
 /// Expects that action stops with text while the storage of v is as before.
-template <class V, class F> void ExpectStop(V& v, const F& action, const std::string& text) {
+template <class V, class F> void ExpectStop(V& v, const std::string& text, const F& action) {
   const VectorOfByte& b = reinterpret_cast<const VectorOfByte&>(v);
   const VectorOfByte before = b;
   unchanged = [&, data = b.data(), capacity = b.capacity()] {
@@ -87,10 +87,9 @@ TYPED_TEST(Precondition, SubrangesStopForEveryPairOfValues) {
   S s = Of<TypeParam>("abc");
   for (const auto& [text, call] : calls)
     for (const auto& [i, n] : bad)
-      ExpectStop(
-          s, [&, call = call, i = i, n = n](S& v) { call(v, i, n); }, text);
-  ExpectStop(
-      s, [](S& v) { v.move(0, 2, 2); }, "0 <= s && 0 <= n && s+n <= size()");
+      ExpectStop(s, text, [&, call = call, i = i, n = n](S& v) { call(v, i, n); });
+  for (const ssize_t i : {ssize_t(-1), ssize_t(3), ssize_t(kMax), ssize_t(kMin)})
+    ExpectStop(s, "0 <= s && 0 <= n && s+n <= size()", [i](S& v) { v.move(0, i, 1); });
 }
 
 TYPED_TEST(Precondition, CallsThatStop) {
@@ -185,7 +184,7 @@ TYPED_TEST(Precondition, CallsThatStop) {
   };
   S s = Of<T>("abc");
   for (const auto& [text, call] : calls)
-    ExpectStop(s, call, text);
+    ExpectStop(s, text, call);
 }
 
 TEST(Precondition, OfBuffersConversionsAndStreams) {
@@ -222,34 +221,25 @@ TEST(Precondition, OfBuffersConversionsAndStreams) {
       {"size() > 0", [](VectorOfByte&) { std::as_const(*std::make_unique<VectorOfByte>()).back(); }},
   };
   for (const auto& [text, call] : calls)
-    ExpectStop(b, call, text);
+    ExpectStop(b, text, call);
 
   string16 wide = Of<char16>("abc");
   string8 narrow = Of<char8>("abc");
-  ExpectStop(
-      wide, [](string16& s) { mirel::Utf16FromUtf8(s, "a", -1); }, "srcLen >= 0");
-  ExpectStop(
-      wide, [](string16& s) { mirel::Utf16FromUtf8(s, nullptr); }, "src");
-  ExpectStop(
-      wide, [](string16& s) { mirel::Utf16FromAscii(s, "a", -1); }, "newSize >= 0");
-  ExpectStop(
-      narrow, [&](string8& s) { mirel::Utf8FromUtf16(s, wide.data(), kMin); }, "srcLen >= 0");
-  ExpectStop(
-      narrow, [](string8& s) { mirel::Utf8FromUtf16(s, nullptr); }, "src");
+  ExpectStop(wide, "srcLen >= 0", [](string16& s) { mirel::Utf16FromUtf8(s, "a", -1); });
+  ExpectStop(wide, "src", [](string16& s) { mirel::Utf16FromUtf8(s, nullptr); });
+  ExpectStop(wide, "newSize >= 0", [](string16& s) { mirel::Utf16FromAscii(s, "a", -1); });
+  ExpectStop(narrow, "srcLen >= 0", [&](string8& s) { mirel::Utf8FromUtf16(s, wide.data(), kMin); });
+  ExpectStop(narrow, "src", [](string8& s) { mirel::Utf8FromUtf16(s, nullptr); });
 
   struct : mirel::IOutputStream {
     void WriteStream(const void*, ssize_t) override {}
     void FlushStream() override {}
   } sink;
   mirel::xostream os(sink);
-  ExpectStop(
-      narrow, [&](string8&) { os.put(static_cast<const char*>(nullptr)); }, "x");
-  ExpectStop(
-      narrow, [&](string8&) { os.put(nullptr, 1); }, kPointer);
-  ExpectStop(
-      narrow, [&](string8&) { os.write("a", -1); }, kPointer);
-  ExpectStop(
-      narrow, [&](string8&) { os.Indent(-1); }, "0 <= indent");
+  ExpectStop(narrow, "x", [&](string8&) { os.put(static_cast<const char*>(nullptr)); });
+  ExpectStop(narrow, kPointer, [&](string8&) { os.put(nullptr, 1); });
+  ExpectStop(narrow, kPointer, [&](string8&) { os.write("a", -1); });
+  ExpectStop(narrow, "0 <= indent", [&](string8&) { os.Indent(-1); });
 }
 
 } // namespace

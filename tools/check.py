@@ -105,7 +105,7 @@ def aarch64(row):
     suite(cxx="aarch64-linux-gnu-g++", flags="-O2", options=(
         "-DCMAKE_SYSTEM_NAME=Linux", "-DCMAKE_SYSTEM_PROCESSOR=aarch64", f"-DBoost_INCLUDE_DIRS={boost}",
         "-DCMAKE_CROSSCOMPILING_EMULATOR=qemu-aarch64;-L;/usr/aarch64-linux-gnu",
-        f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}"))(row)
+        f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", NO_FMT))(row)
 
 
 def coverage(row):
@@ -146,11 +146,13 @@ def mutants(row):
 HARDENING = ("-O2 -D_FORTIFY_SOURCE=2 -D_GLIBCXX_ASSERTIONS -fstack-protector-strong -fstack-clash-protection "
              "-fcf-protection -Wformat -Werror=format-security -fPIE")
 SHARED = "-DBUILD_SHARED_LIBS=ON"
+# Debian's fmt is for its own standard library and processor, and its headers convert implicitly.
+NO_FMT = "-DCMAKE_DISABLE_FIND_PACKAGE_fmt=ON"
 
 
 def libcxx(std, flags, *options):
     return suite(cxx="clang++", std=std, flags=f"-stdlib=libc++ {flags}",
-                 options=(f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", *options))
+                 options=(f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", NO_FMT, *options))
 
 
 ROWS = [
@@ -175,7 +177,7 @@ ROWS = [
         flags="-O2 -g -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer")),
     Row("clang++ address, leak, undefined, conversions", suite(
         cxx="clang++", flags="-O2 -g -fsanitize=address,undefined,implicit-conversion,nullability,local-bounds,"
-        "float-divide-by-zero -fno-sanitize-recover=all -fno-omit-frame-pointer")),
+        "float-divide-by-zero -fno-sanitize-recover=all -fno-omit-frame-pointer", options=(NO_FMT,))),
     Row("clang++ thread", threads),
     Row("coverage", coverage),
     Row("fuzzers", fuzz),

@@ -175,7 +175,7 @@ template <class T> struct MIREL_API ByBlock {
 extern template struct ByBlock<char8>;
 extern template struct ByBlock<char16>;
 
-/// The order above, by blocks.
+/// The order above, by blocks; neither range is empty.
 MIREL_API int CompareByBlock(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
 
 /// In so short a range the plain loops are done before a call to the others has begun.

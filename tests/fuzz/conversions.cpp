@@ -21,7 +21,7 @@ extern "C" int LLVMFuzzerTestOneInput(const unsigned char* data, std::size_t siz
   static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 3, 12, 15, 30, 40, 44, 1000};
   const std::size_t before = kBefore[data[0] % std::size(kBefore)];
   ++data, --size;
-  CheckCuts<char16>(before, oracle::Text<char8>(data, data + size));
+  CheckCuts<char16>(before, oracle::Text<char8>(reinterpret_cast<const char8*>(data), size));
   oracle::Text<char16> units(size / 2, 0);
   for (std::size_t i = 0; i < units.size(); ++i)
     units[i] = static_cast<char16>(data[2 * i] | data[2 * i + 1] << 8);

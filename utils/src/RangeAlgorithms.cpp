@@ -292,7 +292,7 @@ int CompareByBlock(const char16* x1, const char16* x2, const char16* y1, const c
     while (end - p >= n && IsEqual(p, p + n, q))
       p += n, q += n;
   };
-  if (len > 0 && *p == *q) {
+  if (*p == *q) {
     skip(256);
     skip(16);
   }
