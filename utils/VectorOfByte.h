@@ -195,7 +195,14 @@ template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T
   return isPlain ? Find<const T*, T>(i1, i2, v) : detail::ByBlock<T>::Find(i1, i2, v);
 }
 template <class T, detail::IfCodeUnit<T> = 0> const T* FindLast(const T* i1, const T* i2, const T& v) {
-  return detail::IsShort(i1, i2) ? FindLast<const T*, T>(i1, i2, v) : detail::ByBlock<T>::FindLast(i1, i2, v);
+  if (!detail::IsShort(i1, i2))
+    return detail::ByBlock<T>::FindLast(i1, i2, v);
+  const T unit = v;
+  // By index, which compilers do better than by a pointer that goes back.
+  for (ssize_t i = i2 - i1; i > 0; --i)
+    if (i1[i - 1] == unit)
+      return i1 + (i - 1);
+  return i2;
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
