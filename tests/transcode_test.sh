@@ -80,6 +80,9 @@ expect "a device" "$(stat -c %F /dev/null)" "character special file"
 check "no such file" 1 "$transcode" missing
 check "a full disk" 1 bash -c "'$transcode' in >/dev/full"
 check "no such option" 2 "$transcode" --nonsense
+check "no name" 2 "$transcode" -o '' in
+ln -s loop2 loop1; ln -s loop1 loop2
+check "a loop of links" 1 "$transcode" -o loop1 in
 check "no such encoding" 2 "$transcode" --to ebcdic
 check "ascii output" 2 "$transcode" --to ascii
 

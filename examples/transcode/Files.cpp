@@ -29,7 +29,7 @@ extern "C" void RemoveUnfinished(int signal) {
 
 void RemoveWhenInterrupted(const char* name) {
   unfinished = name;
-  for (const int signal : {SIGHUP, SIGINT, SIGTERM}) {
+  for (const int signal : {SIGHUP, SIGINT, SIGQUIT, SIGPIPE, SIGTERM, SIGXCPU, SIGXFSZ}) {
     struct sigaction action = {};
     sigaction(signal, nullptr, &action);
     if (action.sa_handler != SIG_DFL)
@@ -93,6 +93,8 @@ Output::Output(const std::string& name) : m_name(name), m_fd(STDOUT_FILENO) {
   }
   struct stat old;
   const bool exists = stat(name.c_str(), &old) == 0;
+  if (!exists && errno != ENOENT)
+    throw SystemError(name);
   if (exists && !S_ISREG(old.st_mode)) {
     m_fd = open(name.c_str(), O_WRONLY | O_TRUNC);
     if (m_fd == -1)

@@ -57,7 +57,11 @@ Options ParseOptions(int argc, char** argv) {
     switch (c) {
     case 'f': options.from = ParseEncoding(optarg); break;
     case 't': options.to = ParseEncoding(optarg); break;
-    case 'o': options.output = optarg; break;
+    case 'o':
+      if (*optarg == '\0')
+        throw UsageError("OUT has no name");
+      options.output = optarg;
+      break;
     case 'r': options.report = true; break;
     case 'q': options.quiet = true; break;
     case 'h': options.help = true; break;
