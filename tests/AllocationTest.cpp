@@ -119,6 +119,13 @@ TYPED_TEST(Allocation, AFailureChangesNothing) {
       [](S& s) { s *= 3; },
       [](S& s) { s + s; },
       [](S& s) { s.substr(); },
+      [](S& s) { S copy(s); },
+      [](S& s) { s.push_front(s[1]); },
+      [&](S& s) { s.insert(1, r); },
+      [&](S& s) { s.replace(1, 1, 5, 'x'); },
+      [&](S& s) { s.push_back(3, r.begin(), r.end()); },
+      [&](S& s) { s.append(r.data(), 4); },
+      [z = r.c_str()](S& s) { s.append(z); },
       // What no machine can have.
       [](S& s) { s.reserve(kMax); },
       [](S& s) { s.resize(kMax, 'x'); },
@@ -156,6 +163,31 @@ TYPED_TEST(Allocation, AFailureChangesNothing) {
   S empty;
   empty *= kMax;
   EXPECT_EQ(empty.capacity(), 0);
+}
+
+TYPED_TEST(Allocation, AFailedConversionThrowsAndLeavesAUsableString) {
+  using Other = std::conditional_t<sizeof(TypeParam) == 1, char16, char8>;
+  const basic_xstring<TypeParam> text(9000, 'a');
+  for (long failAfter = 0; failAfter < 2; ++failAfter) {
+    basic_xstring<Other> dst;
+    allocation::failAfter = failAfter;
+    EXPECT_EQ(allocation::Count([&] {
+                if (failAfter == 0) {
+                  EXPECT_THROW(UtfToUtf(dst, text.data(), text.size()), std::bad_alloc);
+                } else {
+                  EXPECT_TRUE(UtfToUtf(dst, text.data(), text.size()));
+                }
+              }),
+              1);
+    allocation::failAfter = -1;
+    dst.push_back('x');
+    EXPECT_EQ(dst.size(), failAfter == 0 ? 1 : 9001);
+  }
+  mirel::string16 wide(3, 'x');
+  allocation::failAfter = 0;
+  EXPECT_THROW(mirel::Utf16FromAscii(wide, "abcdef", 6), std::bad_alloc);
+  allocation::failAfter = -1;
+  EXPECT_EQ(Std(wide), (std::basic_string<char16>(3, 'x')));
 }
 
 } // namespace

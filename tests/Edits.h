@@ -153,6 +153,8 @@ public:
     ASSERT_PRED2(is, v.find_last_of(r, reverse), text.find_last_of(pattern, ur));
     ASSERT_PRED2(is, v.find_last_not_of(r, reverse), text.find_last_not_of(pattern, ur));
     ASSERT_PRED2(is, v.find_last_not_of(c, reverse), text.find_last_not_of(c, ur));
+    ASSERT_PRED2(is, v.find(p, forward, pn), text.find(pattern, uf));
+    ASSERT_PRED2(is, v.rfind(p, reverse, pn), text.rfind(pattern, ur));
     ASSERT_PRED2(is, v.find_first_of(p, forward, pn), text.find_first_of(pattern, uf));
     ASSERT_PRED2(is, v.find_first_not_of(p, forward, pn), text.find_first_not_of(pattern, uf));
     ASSERT_PRED2(is, v.find_last_of(p, reverse, pn), text.find_last_of(pattern, ur));

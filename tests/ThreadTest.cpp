@@ -23,7 +23,8 @@ TEST(Thread, UsesItsOwnObjects) {
       ASSERT_TRUE(mirel::Utf16FromUtf8(wide, text.data(), text.size()));
       wide.insert(0, 3, u'b');
       ASSERT_TRUE(mirel::Utf8FromUtf16(text, wide.data(), wide.size()));
-      if (text.FindAndErase('b') == 3 && i % 50 == 0)
+      ASSERT_EQ(text.FindAndErase('b'), 3);
+      if (i % 50 == 0)
         text.erase();
     }
   });

@@ -76,7 +76,8 @@ TEST(Utf, RunsOfAsciiBeforeAndBehindOthers) {
          {"\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xFF", "\xE2\x82", "\xED\xA0\x80"})
       CheckUtf8(Text<char8>(before, 'a') + text + Text<char8>(before, 'b'));
     for (const Text<char16>& text : {Text<char16>{0xE9}, {0x20AC}, {0xD83D, 0xDE00}, {0xD83D}, {0xDE00}})
-      CheckUtf16(Text<char16>(before, 'a') + text + Text<char16>(before, 'b'));
+      for (const char16 filler : {char16('a'), char16(0x20AC)})
+        CheckUtf16(Text<char16>(before, filler) + text + Text<char16>(before, filler));
   }
 }
 

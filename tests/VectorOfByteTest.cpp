@@ -143,7 +143,9 @@ TEST(VectorOfByteTest, EditsAtAnyPlace) {
 TEST(VectorOfByteTest, ComparesBytes) {
   const VectorOfByte a{1, 2}, b{1, 200}, c;
   EXPECT_TRUE(a < b && a <= b && b > a && b >= a && a != b && !(a == b) && c < a && a >= a && a <= a);
-  EXPECT_EQ(a.compare(0, 1, b, 0, 1) + a.compare(1, 0, c) + a.compare(2, 0, nullptr, 0), 0);
+  EXPECT_EQ(a.compare(0, 1, b, 0, 1) + a.compare(1, 0, c) + a.compare(2, 0, nullptr, 0) +
+                a.compare(0, 1, b.data(), 1),
+            0);
   EXPECT_EQ(VectorOfByte(3, 7), (VectorOfByte{7, 7, 7}));
   VectorOfByte d(a.begin(), a.end());
   const VectorOfByte& same = d;
@@ -154,7 +156,7 @@ TEST(VectorOfByteTest, ComparesBytes) {
   EXPECT_EQ(d, b);
   d = c;
   EXPECT_EQ(d, VectorOfByte(c));
-  d.swap(const_cast<VectorOfByte&>(static_cast<const VectorOfByte&>(VectorOfByte())));
+  VectorOfByte().swap(d);
   EXPECT_TRUE(d.empty() && d.data() == nullptr);
 }
 

@@ -1,6 +1,5 @@
 #include "Support.h"
 
-#include <locale>
 #include <stdexcept>
 
 #include <utils/xostream.h>
@@ -51,7 +50,7 @@ TEST(XOStream, FormatsValues) {
     EXPECT_EQ(put(c) + put(static_cast<wchar_t>(c)), "\uFFFD\uFFFD");
   os.width(3);
   EXPECT_EQ(put("a", 1), "  a");
-  os.put("b", 1), os.put_internal("ab", 2, 5);
+  os.put("b", 1), os.put_internal("ab", 2, 5), os.put(nullptr, 0);
   EXPECT_EQ(sink.text, "  ab   ab");
 }
 

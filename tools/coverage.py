@@ -5,8 +5,9 @@ usage: coverage.py BUILD-DIRECTORY
 
 Runs the suite, built there with clang's -fprofile-instr-generate -fcoverage-mapping and -mllvm
 -runtime-counter-relocation. The last keeps the counters in a file that the children write too, so that a violated
-precondition, which ends a process, is seen. What a template does counts for all its instances together. Ends with 1
-if anything is missed.
+precondition, which ends a process, is seen. What a template does counts for all its instances together. A violated
+precondition counts as one for those behind it in the function too, since their counts are differences; that each is
+reported is what the tables of tests/PreconditionTest.cpp are for. Ends with 1 if anything is missed.
 """
 
 import collections
@@ -41,12 +42,13 @@ def region_counts(functions):
 
 
 def branch_counts(file):
-    """{(line, column, line and column in a macro): [times true, times false]}"""
+    """{(place, number at that place): [times true, times false]}; the parts of an assertion's condition have one
+    place, that of the assertion."""
     counts = collections.defaultdict(lambda: [0, 0])
 
     def add(place, branches):
-        for line, column, _, _, true, false, *_ in branches:
-            total = counts[place or (line, column), line, column]
+        for number, (line, column, _, _, true, false, *_) in enumerate(branches):
+            total = counts[(place, number) if place else ((line, column), 0)]
             total[0] += true
             total[1] += false
 

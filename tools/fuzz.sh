@@ -10,9 +10,10 @@ cmake -S . -B $dir -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo -DCMAKE_CXX_COMPIL
   -DCMAKE_CXX_FLAGS="-fsanitize=fuzzer-no-link,address,undefined,implicit-conversion -fno-sanitize-recover=all" >/dev/null
 cmake --build $dir --target fuzz_edits fuzz_conversions
 pids=()
+declare -A longest=([edits]=400 [conversions]=129)
 for name in edits conversions; do
   mkdir -p $dir/corpus/$name $dir/found
-  $dir/tests/fuzz_$name -max_total_time="$seconds" -timeout=10 -max_len=400 -artifact_prefix=$dir/found/$name- \
+  $dir/tests/fuzz_$name -max_total_time="$seconds" -timeout=10 -max_len=${longest[$name]} -artifact_prefix=$dir/found/$name- \
     $dir/corpus/$name tests/fuzz/seeds/$name >$dir/$name.log 2>&1 &
   pids+=($!)
 done

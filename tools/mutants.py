@@ -5,8 +5,7 @@ usage: mutants.py [NUMBER...]
 
 The mutants stand in tools/mutants.txt, a file's name and below it pairs of lines: what stands in the source, once,
 and what is put in its place. Each is built in a copy of the tree, one copy for each processor, with the address
-sanitizer, which notices what happens to go well on this machine. Ends with 1 if one
-survives. A mutant that makes a loop endless is noticed too, by the time that it takes.
+sanitizer, which notices what happens to go well on this machine. Ends with 1 if one survives. A mutant that makes a loop endless is noticed too, by the time that it takes.
 """
 
 import os
@@ -28,7 +27,7 @@ def read_mutants():
     for line in (ROOT / "tools" / "mutants.txt").read_text().splitlines():
         if line.startswith("- "):
             original = line[2:]
-        elif line.startswith("+ "):
+        elif line.startswith("+"):  # nothing may stand behind it
             mutants.append((file, original, line[2:]))
         elif line and not line.startswith("#"):
             file = line

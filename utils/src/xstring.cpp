@@ -40,8 +40,8 @@ namespace utf = boost::locale::utf;
 /// So many units of input are converted on the stack before the result is appended in one go: an append of
 /// its own for each would ask for room and keep the size in memory every time.
 constexpr ssize_t kChunk = 1024;
-/// The most units of output for one of input.
-constexpr ssize_t kExpansion = 3;
+/// The most units of output for one of input: three bytes for a unit of UTF-16, one unit for a byte.
+template <class CharOut> constexpr ssize_t kExpansion = sizeof(CharOut) == 1 ? 3 : 1;
 
 /// Units of ASCII that are converted at once: more than compilers unroll, so that they use wide instructions.
 constexpr ssize_t kBlock = 32;
@@ -216,7 +216,7 @@ bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen)
   const CharIn* const end = src + srcLen;
   bool isWellFormed = true;
   for (const CharIn* p = src; p != end && isWellFormed;) {
-    CharOut chunk[kExpansion * (kChunk + kLookahead)];
+    CharOut chunk[kExpansion<CharOut> * (kChunk + kLookahead)];
     CharOut* out = chunk;
     const CharIn* const chunkEnd = end - p < kChunk ? end : p + kChunk;
     const CharIn* const stop = end - p < kLookahead ? p : std::min(chunkEnd, end - (kLookahead - 1));
