@@ -68,10 +68,12 @@ def table(runs, goals, keep):
             ratios = [ratio(runs[n][case]["ours"], runs[n][case][peer]) for n in names]
             goal, reason = goal_of(goals, case, peer)
             cells = [f"{r:.2f} ({low:.2f} to {high:.2f})" for r, low, high in ratios]
-            missed = goal is not None and min(round(r, 2) for r, _, _ in ratios) < goal
+            missing = [high for r, _, high in ratios if goal is not None and round(r, 2) < goal]
             total += goal is not None
-            below += missed
-            note = (reason or "below") if missed else ""
+            below += bool(missing)
+            note = ""
+            if missing:
+                note = "within the spread" if all(high >= goal for high in missing) else reason or "below"
             lines.append(f"| {case[0]} | {case[1]} | {case[2]} | {case[3]} | {peer} | " + " | ".join(cells) +
                          f" | {goal if goal is not None else ''} | {note} |")
     return lines, total, below
@@ -85,7 +87,7 @@ def plot(runs, path):
         if case[2] in ("65536", "200000"):
             for peer in sorted(times[case]):
                 if peer != "ours":
-                    value, low, high = ratio(times[case]["ours"], times[case][peer])
+                    value, _, _ = ratio(times[case]["ours"], times[case][peer])
                     bars.append((f"{case[0]}, {case[1]}, {case[3]}: {peer}", value))
     figure, axes = plt.subplots(figsize=(11, 0.17 * len(bars) + 1))
     axes.barh([label for label, _ in bars], [value for _, value in bars],
@@ -95,7 +97,7 @@ def plot(runs, path):
     axes.axvline(1, color="black", linewidth=1)
     axes.set_ylim(len(bars) - 0.5, -0.5)
     axes.tick_params(axis="y", labelsize=6)
-    axes.set_xlabel(f"peer's time / our time, 64 Ki units ({name}); right of the line we are ahead")
+    axes.set_xlabel(f"peer's time / our time, 64 Ki units or 200,000 edits ({name}); right of the line we are ahead")
     figure.tight_layout()
     figure.savefig(path, dpi=110)
 
