@@ -16,6 +16,7 @@ const char kHelp[] =
     "  -r, --report      print what is in the text instead of the text; with -o, both\n"
     "  -q, --quiet       show no progress on the terminal\n"
     "  -h, --help        print this help\n"
+    "  -V, --version     print the version\n"
     "\n"
     "Without FILE, or with - for FILE or OUT, the standard streams are used. A byte order mark\n"
     "is text like any other. When the input is malformed, the place of the first fault is named\n"
@@ -45,15 +46,13 @@ Encoding ParseEncoding(const char* text) {
 const char* Name(Encoding encoding) { return kEncodings[static_cast<int>(encoding)].name; }
 
 Options ParseOptions(int argc, char** argv) {
-  static const option kOptions[] = {{"from", required_argument, nullptr, 'f'},
-                                    {"to", required_argument, nullptr, 't'},
-                                    {"output", required_argument, nullptr, 'o'},
-                                    {"report", no_argument, nullptr, 'r'},
-                                    {"quiet", no_argument, nullptr, 'q'},
-                                    {"help", no_argument, nullptr, 'h'},
-                                    {nullptr, 0, nullptr, 0}};
+  static const option kOptions[] = {
+      {"from", required_argument, nullptr, 'f'},   {"to", required_argument, nullptr, 't'},
+      {"output", required_argument, nullptr, 'o'}, {"report", no_argument, nullptr, 'r'},
+      {"quiet", no_argument, nullptr, 'q'},        {"help", no_argument, nullptr, 'h'},
+      {"version", no_argument, nullptr, 'V'},      {nullptr, 0, nullptr, 0}};
   Options options;
-  for (int c; (c = getopt_long(argc, argv, "f:t:o:rqh", kOptions, nullptr)) != -1;) {
+  for (int c; (c = getopt_long(argc, argv, "f:t:o:rqhV", kOptions, nullptr)) != -1;) {
     switch (c) {
     case 'f': options.from = ParseEncoding(optarg); break;
     case 't': options.to = ParseEncoding(optarg); break;
@@ -65,6 +64,7 @@ Options ParseOptions(int argc, char** argv) {
     case 'r': options.report = true; break;
     case 'q': options.quiet = true; break;
     case 'h': options.help = true; break;
+    case 'V': options.version = true; break;
     default: throw UsageError("");
     }
   }

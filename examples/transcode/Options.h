@@ -24,6 +24,7 @@ struct Options {
   bool report = false;
   bool quiet = false;
   bool help = false;
+  bool version = false;
 };
 
 /// An encoding as it is called on the command line.

@@ -15,6 +15,8 @@
 #include "Progress.h"
 #include "Statistics.h"
 
+#include <utils/Version.h>
+
 namespace transcode {
 
 namespace {
@@ -67,6 +69,8 @@ int Main(int argc, char** argv) {
     const Options options = ParseOptions(argc, argv);
     if (options.help)
       Print(std::string(kUsage) + kHelp);
+    else if (options.version)
+      Print("transcode (mirel) " MIREL_VERSION_STRING "\n");
     else
       Run(options);
     return EXIT_SUCCESS;
