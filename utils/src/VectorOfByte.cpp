@@ -38,7 +38,7 @@ void FillBytes(uint8* dst, ssize_t n, uint8 x) {
 }
 
 /// Makes room for n bytes in all. This is where growth is decided, for all edits but push_back of an element,
-/// which follows the same rule inline (where no sum of two sizes can overflow): the new size plus the old
+/// which follows the same rule inline (no sum of two sizes overflows in 64 bits): the new size plus the old
 /// capacity. The capacity at least doubles, so a run of edits moves each byte a constant number of times on
 /// average; a first request is granted exactly.
 void GrowTo(const VectorOfByte& buffer, ssize_t n) {
