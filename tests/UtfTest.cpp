@@ -70,15 +70,26 @@ TEST(Utf, SurrogatesMustPair) {
         }
 }
 
-TEST(Utf, RunsOfAsciiBeforeAndBehindOthers) {
-  for (const std::size_t before : {15u, 16u, 47u, 48u, 1020u, 1023u, 1024u, 5000u}) {
-    for (const char8* text :
-         {"\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xFF", "\xE2\x82", "\xED\xA0\x80"})
-      CheckUtf8(Text<char8>(before, 'a') + text + Text<char8>(before, 'b'));
-    for (const Text<char16>& text : {Text<char16>{0xE9}, {0x20AC}, {0xD83D, 0xDE00}, {0xD83D}, {0xDE00}})
-      for (const char16 filler : {char16('a'), char16(0x20AC)})
-        CheckUtf16(Text<char16>(before, filler) + text + Text<char16>(before, filler));
-  }
+TEST(Utf, OneThatIsDifferentInARun) {
+  const char8* const bytes[] = {"a",        "\xC3\xA9",     "\xE2\x82\xAC", "\xF0\x9F\x98\x80",
+                                "\xFF",     "\xC3",         "\xC1\xA9",     "\xDF\xBF",
+                                "\xE2\x82", "\xED\xA0\x80", "\xEF\xBC\x8C"};
+  const Text<char16> units[] = {{'a'},    {0xE9},   {0x20AC},         {0x7F},   {0x80},  {0x7FF},
+                                {0x0800}, {0xFF0C}, {0xD83D, 0xDE00}, {0xD83D}, {0xDE00}};
+  const auto run = [](const auto& one, std::size_t n) {
+    auto text = one;
+    for (text.clear(); n > 0; --n)
+      text += one;
+    return text;
+  };
+  for (const std::size_t n :
+       {1u, 2u, 3u, 4u, 5u, 6u, 7u, 8u, 9u, 15u, 16u, 17u, 47u, 48u, 49u, 1020u, 1023u, 1024u, 5000u})
+    for (int filler = 0; filler < 3; ++filler) {
+      for (const char8* one : bytes)
+        CheckUtf8(run(Text<char8>(bytes[filler]), n) + one + run(Text<char8>(bytes[filler]), n));
+      for (const Text<char16>& one : units)
+        CheckUtf16(run(units[filler], n) + one + run(units[filler], n));
+    }
 }
 
 TEST(Utf, CutOffAtEveryPlace) {
