@@ -15,8 +15,10 @@ import textwrap
 
 def includes(path):
     """What a file includes of this project and of libraries, by name; the standard's headers have no directory."""
-    found = re.findall(r"^#include <(\w+)/([\w/]+)\.\w+>", path.read_text(), re.MULTILINE)
-    return {name if library == "utils" else library for library, name in found}
+    text = path.read_text()
+    found = re.findall(r"^#include <(\w+)/([\w/]+)\.\w+>", text, re.MULTILINE)
+    own = set(re.findall(r'^#include "(\w+)\.h"', text, re.MULTILINE))
+    return own | {name if library == "utils" else library for library, name in found}
 
 
 def summary(path):
@@ -39,7 +41,7 @@ def below(edges, start):
 
 def main():
     directory = pathlib.Path(sys.argv[1])
-    headers = {path.stem: path for path in sorted(directory.glob("*.h"))}
+    headers = {path.stem: path for path in sorted([*directory.glob("*.h"), *directory.glob("src/*.h")])}
     sources = {path.stem: path for path in sorted(directory.glob("src/*.cpp"))}
     above = {name: includes(path) for name, path in headers.items()}
     loops = [name for name in above if name in below(above, name)]

@@ -95,16 +95,19 @@ def layout(row):
         row.run("clang-tidy", "--quiet", source, "--", "-std=c++17", "-I.", f"-I{row.dir}/include")
 
 
-def aarch64(row):
-    """The reference target, under emulation. Boost's headers are shown to the cross compiler without the host's."""
-    boost = OUT / "boost"
-    boost.mkdir(exist_ok=True)
-    if not (boost / "boost").exists():
-        (boost / "boost").symlink_to("/usr/include/boost")
-    suite(cxx="aarch64-linux-gnu-g++", flags="-O2", options=(
-        "-DCMAKE_SYSTEM_NAME=Linux", "-DCMAKE_SYSTEM_PROCESSOR=aarch64", f"-DBoost_INCLUDE_DIRS={boost}",
-        "-DCMAKE_CROSSCOMPILING_EMULATOR=qemu-aarch64;-L;/usr/aarch64-linux-gnu",
-        f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", NO_FMT))(row)
+def emulated(processor):
+    """The suite for another processor, under emulation. Boost's headers are shown to the cross compiler without
+    the host's."""
+    def work(row):
+        boost = OUT / f"boost-{processor}"
+        boost.mkdir(exist_ok=True)
+        if not (boost / "boost").exists():
+            (boost / "boost").symlink_to("/usr/include/boost")
+        suite(cxx=f"{processor}-linux-gnu-g++", flags="-O2", options=(
+            "-DCMAKE_SYSTEM_NAME=Linux", f"-DCMAKE_SYSTEM_PROCESSOR={processor}", f"-DBoost_INCLUDE_DIRS={boost}",
+            f"-DCMAKE_CROSSCOMPILING_EMULATOR=qemu-{processor};-L;/usr/{processor}-linux-gnu",
+            f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", NO_FMT))(row)
+    return work
 
 
 def coverage(row):
@@ -155,7 +158,8 @@ def libcxx(std, flags, *options):
 
 
 ROWS = [
-    Row("AArch64 under emulation", aarch64),
+    Row("AArch64 under emulation", emulated("aarch64")),
+    Row("s390x under emulation, big-endian", emulated("s390x")),
     Row("valgrind", valgrind),
     Row("headers alone", headers),
     Row("clang-format, clang-tidy", layout),

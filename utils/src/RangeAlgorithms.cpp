@@ -3,7 +3,7 @@
 // A loop that leaves at the first hit isn't vectorised by most compilers. These look at a block of fixed size
 // at a time and only ask whether there is a hit in it, without leaving early; that every compiler turns into
 // a few wide instructions. What is near the start of a range, and the block that has the hit, are left to
-// loops that say where it is, and are quicker where it is close: by single units, for sets by words.
+// loops that say where it is, and are quicker where it is close: by single units, for small sets by words.
 //
 // Three things here look as if they could be simplified, and are measured: each costs a factor of five or
 // more. The loops marked noinline one compiler would otherwise merge with the loop around them, and then not
@@ -145,9 +145,12 @@ template <class T> uint64_t MarkMembers(uint64_t word, const T* y1, const T* y2,
   return isMember ? marks : marks ^ kMarks<T>;
 }
 
-/// Whether [p, end) is searched by words, for a set that isn't so large that single units are quicker.
+/// The largest set for which a search goes by words. A word is held against all of the set, a single unit
+/// only until it is found, and for bytes that is done by the C library.
+template <class T> constexpr ssize_t kSmallSet = sizeof(T) == 1 ? 20 : 32;
+
 template <class T> bool IsByWords(const T* p, const T* end, const T* y1, const T* y2) {
-  return end - p >= kWord<T> && y2 - y1 <= 32;
+  return end - p >= kWord<T> && y2 - y1 <= kSmallSet<T>;
 }
 
 /// The first or the last unit of [p, end) that is in the set, or isn't; end if there is none.

@@ -39,8 +39,10 @@ constexpr ssize_t kBlock = 32;
 /// Units of ASCII that are converted by words before that is tried.
 constexpr ssize_t kNear = 16;
 
-/// No step of a conversion needs to see more units than this to tell what stands at its start.
+/// A step of a conversion begins before a pointer that is called stop here, and behind it so many units can
+/// be read, itself included. It may end behind stop, but within the text.
 constexpr ssize_t kLookahead = 4;
+static_assert(kWord<char16> <= kLookahead);
 
 /// The bits that no unit of ASCII has, in a word.
 template <class T> constexpr uint64_t kNotAscii = InEach<T>(sizeof(T) == 1 ? 0x80 : 0xFF80);
@@ -95,13 +97,14 @@ void ConvertWord(uint64_t word, char8* out) {
 
 /// Converts ASCII from p on, where some stands, up to stop or something else: one unit, since many are single
 /// spaces between other letters, then words, since most runs in most texts are short, then blocks. A word
-/// that has something else in it is written whole; what comes next overwrites the rest.
+/// that has something else in it is written whole, but out goes behind its ASCII only.
 template <class CharOut, class CharIn>
 Progress<CharOut, CharIn> ConvertAscii(const CharIn* p, const CharIn* stop, CharOut* out) {
+  static_assert(kNear % kWord<CharIn> == 0);
   *out++ = static_cast<CharOut>(*p++);
   if (p == stop || Unit(*p) >= 0x80)
     return {p, out};
-  const CharIn* const far = p + kNear;
+  const CharIn* const begin = p;
   while (stop - p >= kWord<CharIn>) {
     const uint64_t word = LoadWord(p), others = word & kNotAscii<CharIn>;
     ConvertWord(word, out);
@@ -110,7 +113,7 @@ Progress<CharOut, CharIn> ConvertAscii(const CharIn* p, const CharIn* stop, Char
       return {p + n, out + n};
     }
     p += kWord<CharIn>, out += kWord<CharIn>;
-    if (p == far) {
+    if (p - begin == kNear) {
       const auto blocks = ConvertBlocks(p, stop, out);
       p = blocks.p, out = blocks.out;
     }
@@ -134,25 +137,24 @@ unsigned DecodePair(const char8* p) {
 
 /// Whether a word of bytes is four well-formed pairs.
 bool ArePairs(uint64_t word) {
-  // A lead that has none of these bits, C0 or C1, is overlong. For all others the sum has the highest bit.
-  const uint64_t sums = (word & InEach<char16>(0x1E)) + InEach<char16>(0x7FFE);
+  // The leads C0 and C1 would be overlong. For all others the sum has the highest bit.
+  const uint64_t sums = (word & InEach<char16>(0x1F)) + InEach<char16>(0x7FFE);
   return (word & InEach<char16>(0xC0E0)) == InEach<char16>(0x80C0) &&
          (sums & InEach<char16>(0x8000)) == InEach<char16>(0x8000);
 }
 
-/// Converts sequences of two bytes from p on, where one begins: in most scripts that have them they come in
-/// words.
+/// Converts sequences of two bytes from p on, where one may begin: most stand in runs.
 Progress<char16, char8> ConvertPairs(const char8* p, const char8* stop, char16* out) {
   while (const unsigned unit = DecodePair(p)) {
     *out++ = static_cast<char16>(unit);
     p += 2;
-    for (; stop - p >= kWord<char8>; p += 8, out += 4) {
+    for (; stop - p >= kWord<char8>; p += kWord<char8>, out += kWord<char16>) {
       const uint64_t word = LoadWord(p);
       if (!ArePairs(word))
         break;
       StoreWord<4>((word & InEach<char16>(0x1F)) << 6 | (word >> 8 & InEach<char16>(kTailBits)), out);
     }
-    if (p >= stop || Unit(*p) < 0xC0 || Unit(*p) > 0xDF)
+    if (p >= stop || Unit(*p) < 0xC0 || Unit(*p) > 0xDF) // sooner known than from the next pair
       break;
   }
   return {p, out};
@@ -169,9 +171,9 @@ Progress<char16, char8> ConvertTriples(const char8* p, const char8* stop, char16
   return {p, out};
 }
 
-// The next two convert what is plainly well-formed, until something else comes or stop is reached. There are
-// kLookahead units to be read from before stop on. They are not inlined: that leaves their variables in
-// registers, which in the caller have addresses that are taken.
+// ConvertPlain, for either direction, converts what is plainly well-formed, until something else comes or
+// stop is reached. It isn't inlined: that leaves its variables in registers, which in the caller have
+// addresses that are taken.
 
 [[gnu::noinline]] Progress<char16, char8> ConvertPlain(const char8* p, const char8* stop, char16* out) {
   while (p < stop) {
@@ -249,7 +251,7 @@ Progress<char8, char16> ConvertTriples(const char16* p, const char16* stop, char
   out += 3;
   for (++p; p < stop && (int(IsTriple(p[0])) & int(IsTriple(p[1]))) != 0; p += 2, out += 6) {
     const uint64_t both = p[0] | uint64_t(p[1]) << 24;
-    // Eight bytes are written at once; what comes next overwrites the last two.
+    // Eight bytes are written at once, of which six count.
     StoreWord<8>(0x8080E08080E0 | (both >> 12 & 0x00000F00000F) | (both << 2 & 0x003F00003F00) |
                      (both << 16 & 0x3F00003F0000),
                  out);
@@ -309,6 +311,7 @@ bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen)
   const CharIn* const end = src + srcLen;
   bool isWellFormed = true;
   for (const CharIn* p = src; p != end && isWellFormed;) {
+    // A step may end behind chunkEnd, and a store be wider than what counts of it.
     CharOut chunk[kExpansion<CharOut> * (kChunk + kLookahead)];
     CharOut* out = chunk;
     const CharIn* const chunkEnd = end - p < kChunk ? end : p + kChunk;

@@ -55,7 +55,8 @@ template <class T> uint64_t MarkEqual(uint64_t word, T x) {
   return ~(((difference & low) + low) | difference | low);
 }
 
-// There are no branches in the next two: where a run ends can't be foreseen.
+// The next two count instead of branching, since it can't be foreseen which unit it is. The loop has always
+// the same number of rounds.
 
 /// How many units stand before the first one that has a bit in the word, which isn't 0.
 template <class T> ssize_t UnitsBeforeFirst(uint64_t word) {
