@@ -47,6 +47,15 @@ template <ssize_t n, class T> [[gnu::noinline]] bool HasBoth(const T* p, T first
   return static_cast<bool>(any);
 }
 
+/// Whether there is one with middle at r[k] besides.
+template <ssize_t n, class T>
+[[gnu::noinline]] bool HasThree(const T* p, T first, const T* q, T last, const T* r, T middle) {
+  T any = 0;
+  for (ssize_t k = 0; k < n; ++k)
+    any = T(any | T((p[k] == first) & (q[k] == last) & (r[k] == middle)));
+  return static_cast<bool>(any);
+}
+
 /// Whether one of n units is in the set.
 template <ssize_t n, class T> bool HasAny(const T* p, const T* y1, const T* y2) {
   for (; y1 != y2; ++y1)
@@ -182,11 +191,12 @@ template <class T> const T* Last(const T* p, const T* end, const T* y1, const T*
 
 /// A pattern of at least one unit.
 template <class T> struct Pattern {
-  Pattern(const T* y1, const T* y2) : begin(y1), last(y2 - y1 - 1), first(*y1), final(y1[last]) {}
+  Pattern(const T* y1, const T* y2)
+      : begin(y1), last(y2 - y1 - 1), first(*y1), middle(y1[last / 2]), final(y1[last]) {}
 
   const T* begin;
   ssize_t last; ///< the index of the last unit
-  T first, final;
+  T first, middle, final;
 
   /// Whether the pattern stands at p, where there is room for it.
   bool IsAt(const T* p) const { return *p == first && p[last] == final && IsEqual(begin, begin + last, p); }
@@ -202,8 +212,12 @@ template <class T> struct Pattern {
         return q;
     return end;
   }
-  /// Whether a block of n places has one at which it may stand.
-  template <ssize_t n> bool MayBeIn(const T* p) const { return HasBoth<n>(p, first, p + last, final); }
+  /// Whether a block of n places has one at which it may stand. Where the first unit is frequent, most blocks
+  /// have one that fits with the last one, but few have one that fits with the middle too.
+  template <ssize_t n> bool MayBeIn(const T* p) const {
+    return HasBoth<n>(p, first, p + last, final) &&
+           HasThree<n>(p, first, p + last, final, p + last / 2, middle);
+  }
 };
 
 } // namespace
