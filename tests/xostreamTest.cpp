@@ -1,5 +1,6 @@
 #include "Support.h"
 
+#include <locale>
 #include <stdexcept>
 
 #include <utils/xostream.h>
@@ -52,6 +53,17 @@ TEST(XOStream, FormatsValues) {
   EXPECT_EQ(put("a", 1), "  a");
   os.put("b", 1), os.put_internal("ab", 2, 5), os.put(nullptr, 0);
   EXPECT_EQ(sink.text, "  ab   ab");
+}
+
+TEST(XOStream, KeepsToTheClassicLocale) {
+  struct Grouped : std::numpunct<char> {
+    std::string do_grouping() const override { return "\3"; }
+  };
+  Sink sink;
+  const std::locale before = std::locale::global({std::locale::classic(), new Grouped});
+  xostream(sink).put(1234567);
+  std::locale::global(before);
+  EXPECT_EQ(sink.text, "1234567");
 }
 
 TEST(XOStream, IndentsAndCloses) {
