@@ -49,14 +49,10 @@ template <class T, class N> void CallWithIntegers() {
   EXPECT_EQ(s.size(), 11);
 }
 
+template <class T, class... N> void CallWithEach() { (CallWithIntegers<T, N>(), ...); }
+
 TYPED_TEST(Overload, IntegersOfEveryType) {
-  CallWithIntegers<TypeParam, short>();
-  CallWithIntegers<TypeParam, int>();
-  CallWithIntegers<TypeParam, unsigned>();
-  CallWithIntegers<TypeParam, ssize_t>();
-  CallWithIntegers<TypeParam, std::size_t>();
-  CallWithIntegers<TypeParam, long long>();
-  CallWithIntegers<TypeParam, unsigned char>();
+  CallWithEach<TypeParam, short, int, unsigned, ssize_t, std::size_t, long long, unsigned char>();
 }
 
 TYPED_TEST(Overload, LiteralZeroIsANumber) {
