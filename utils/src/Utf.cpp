@@ -39,8 +39,8 @@ constexpr ssize_t kBlock = 32;
 /// Units of ASCII that are converted by words before that is tried.
 constexpr ssize_t kNear = 16;
 
-/// A step of a conversion begins before a pointer that is called stop here, and behind it so many units can
-/// be read, itself included. It may end behind stop, but within the text.
+/// A step of a conversion begins before a pointer that is called stop here, and can read so many units from
+/// its own beginning on. It may end behind stop, but ends within the text.
 constexpr ssize_t kLookahead = 4;
 static_assert(kWord<char16> <= kLookahead);
 
