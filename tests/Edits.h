@@ -112,7 +112,8 @@ public:
     }
     ASSERT_EQ(Std(v), m) << "edit " << what;
     ASSERT_TRUE(v.size() <= v.capacity() && v.empty() == m.empty() && v.end() - v.begin() == v.size());
-    ASSERT_TRUE(v.empty() || (v.front() == m.front() && std::as_const(v).back() == m.back()));
+    ASSERT_TRUE(v.empty() || (v.front() == m.front() && std::as_const(v).back() == m.back() &&
+                              std::as_const(v)[v.size() / 2] == m[m.size() / 2]));
     if (this->Number(3) == 0)
       return S(v).swap(v); // without spare storage, so that the next edit has to move it
     const T* const z = v.c_str();

@@ -112,7 +112,7 @@ def emulated(processor):
 
 def coverage(row):
     """Every piece of code in utils/ run, every branch taken both ways."""
-    row.build("mirel_tests", cxx="clang++", flags="-O0 -g -fprofile-instr-generate -fcoverage-mapping "
+    row.build("mirel_tests", cxx="clang++", flags="-O1 -g -fprofile-instr-generate -fcoverage-mapping "
               "-mllvm -runtime-counter-relocation")
     row.run("tools/coverage.py", row.dir)
 

@@ -5,7 +5,8 @@ usage: coverage.py BUILD-DIRECTORY
 
 Runs the suite, built there with clang's -fprofile-instr-generate -fcoverage-mapping and -mllvm
 -runtime-counter-relocation. The last keeps the counters in a file that the children write too, so that a violated
-precondition, which ends a process, is seen. What a template does counts for all its instances together. A violated
+precondition, which ends a process, is seen. What wasn't taken is a difference of counters, of which two threads at once
+lose some, so the tests of threads are left out. What a template does counts for all its instances together. A violated
 precondition counts as one for those behind it in the function too, since their counts are differences; that each is
 reported is what the tables of tests/PreconditionTest.cpp are for. Ends with 1 if anything is missed.
 """
@@ -23,8 +24,8 @@ ROOT = pathlib.Path(__file__).resolve().parent.parent
 def run_suite(build):
     raw, profile = build / "suite.profraw", build / "suite.profdata"
     raw.unlink(missing_ok=True)
-    subprocess.run([build / "tests" / "mirel_tests", "--gtest_brief=1"], check=True,
-                   env={**os.environ, "LLVM_PROFILE_FILE": f"{raw}%c"})
+    subprocess.run([build / "tests" / "mirel_tests", "--gtest_brief=1", "--gtest_filter=-Thread*"],
+                   check=True, env={**os.environ, "LLVM_PROFILE_FILE": f"{raw}%c"})
     subprocess.run(["llvm-profdata-14", "merge", "-o", profile, raw], check=True)
     exported = subprocess.run(["llvm-cov-14", "export", build / "tests" / "mirel_tests", f"-instr-profile={profile}",
                                ROOT / "utils"], check=True, stdout=subprocess.PIPE).stdout
