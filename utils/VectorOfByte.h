@@ -318,7 +318,7 @@ public:
       insertbytes(size(), count);
   }
   /// Makes the size 0 and keeps the storage.
-  void clear() noexcept;
+  void clear() noexcept { size_ = 0; }
 
   /// @}
   /// @name Access

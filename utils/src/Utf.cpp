@@ -36,8 +36,6 @@ template <class CharOut> constexpr ssize_t kExpansion = sizeof(CharOut) == 1 ? 3
 
 /// Units of ASCII that are converted at once: more than compilers unroll, so that they use wide instructions.
 constexpr ssize_t kBlock = 32;
-/// Units of ASCII that are converted by words before that is tried.
-constexpr ssize_t kNear = 16;
 
 /// A step of a conversion begins before a pointer that is called stop here, and can read so many units from
 /// its own beginning on. It may end behind stop, but ends within the text.
@@ -47,37 +45,29 @@ static_assert(kWord<char16> <= kLookahead);
 /// The bits that no unit of ASCII has, in a word.
 template <class T> constexpr uint64_t kNotAscii = InEach<T>(sizeof(T) == 1 ? 0x80 : 0xFF80);
 
-/// Whether n units are ASCII; looks at all of them without leaving early.
-template <ssize_t n, class T> bool IsAscii(const T* p) {
-  uint64_t words[std::size_t(n) * sizeof(T) / sizeof(uint64_t)];
-  std::memcpy(words, p, sizeof(words));
-  uint64_t bits = 0;
-  for (const uint64_t word : words)
-    bits |= word;
-  return (bits & kNotAscii<T>) == 0;
-}
-
-/// Converts n units of ASCII, through a copy: for all the compiler knows, bytes at p are those at out.
-/// Inlined, one compiler takes it apart into single units, which is five times slower.
-template <ssize_t n, class CharOut, class CharIn>
-[[gnu::noinline]] void CopyAscii(CharOut* out, const CharIn* p) {
-  CharIn units[std::size_t(n)];
-  std::memcpy(units, p, sizeof(units));
-  for (ssize_t k = 0; k < n; ++k)
-    out[k] = static_cast<CharOut>(units[k]);
-}
-
 /// How far a conversion got.
 template <class CharOut, class CharIn> struct Progress {
   const CharIn* p;
   CharOut* out;
 };
 
-/// Converts blocks of ASCII from p on.
+// Below, a block or word that has something other than ASCII in it is written whole, but out goes behind its
+// ASCII only.
+
+/// Converts ASCII from p on, up to something else or until less than a block is left. It isn't inlined: there
+/// one compiler forgets that out isn't where p is, and takes the blocks apart into single units.
 template <class CharOut, class CharIn>
-[[gnu::noinline]] Progress<CharOut, CharIn> ConvertBlocks(const CharIn* p, const CharIn* stop, CharOut* out) {
-  for (; stop - p >= kBlock && IsAscii<kBlock>(p); p += kBlock, out += kBlock)
-    CopyAscii<kBlock>(out, p);
+[[gnu::noinline]] Progress<CharOut, CharIn> ConvertBlocks(const CharIn* __restrict p, const CharIn* stop,
+                                                          CharOut* __restrict out) {
+  for (; stop - p >= kBlock; p += kBlock, out += kBlock) {
+    for (ssize_t k = 0; k < kBlock; ++k)
+      out[k] = static_cast<CharOut>(Unit(p[k]));
+    for (ssize_t k = 0; k < kBlock; k += kWord<CharIn>)
+      if (const uint64_t others = LoadWord(p + k) & kNotAscii<CharIn>; others != 0) {
+        const ssize_t n = k + UnitsBeforeFirst<CharIn>(others);
+        return {p + n, out + n};
+      }
+  }
   return {p, out};
 }
 
@@ -95,16 +85,22 @@ void ConvertWord(uint64_t word, char8* out) {
   StoreWord<4>(word | word >> 16, out);
 }
 
-/// Converts ASCII from p on, where some stands, up to stop or something else: one unit, since many are single
-/// spaces between other letters, then words, since most runs in most texts are short, then blocks. A word
-/// that has something else in it is written whole, but out goes behind its ASCII only.
+/// Converts ASCII from p on, where some stands, up to stop or something else: one or two units, since most
+/// runs between other letters are a space, or a comma and a space, then blocks, and words where no block is
+/// left.
 template <class CharOut, class CharIn>
 Progress<CharOut, CharIn> ConvertAscii(const CharIn* p, const CharIn* stop, CharOut* out) {
-  static_assert(kNear % kWord<CharIn> == 0);
-  *out++ = static_cast<CharOut>(*p++);
-  if (p == stop || Unit(*p) >= 0x80)
-    return {p, out};
-  const CharIn* const begin = p;
+  for (int k = 0; k < 2; ++k) {
+    *out++ = static_cast<CharOut>(*p++);
+    if (p == stop || Unit(*p) >= 0x80)
+      return {p, out};
+  }
+  if (stop - p >= kBlock) {
+    const auto blocks = ConvertBlocks(p, stop, out);
+    p = blocks.p, out = blocks.out;
+    if (p != stop && Unit(*p) >= 0x80)
+      return {p, out};
+  }
   while (stop - p >= kWord<CharIn>) {
     const uint64_t word = LoadWord(p), others = word & kNotAscii<CharIn>;
     ConvertWord(word, out);
@@ -113,10 +109,6 @@ Progress<CharOut, CharIn> ConvertAscii(const CharIn* p, const CharIn* stop, Char
       return {p + n, out + n};
     }
     p += kWord<CharIn>, out += kWord<CharIn>;
-    if (p - begin == kNear) {
-      const auto blocks = ConvertBlocks(p, stop, out);
-      p = blocks.p, out = blocks.out;
-    }
   }
   for (; p != stop && Unit(*p) < 0x80; ++p)
     *out++ = static_cast<CharOut>(*p);
@@ -145,26 +137,32 @@ bool ArePairs(uint64_t word) {
 
 /// Converts sequences of two bytes from p on, where one may begin: most stand in runs.
 Progress<char16, char8> ConvertPairs(const char8* p, const char8* stop, char16* out) {
-  while (const unsigned unit = DecodePair(p)) {
+  const auto convertOne = [&] {
+    const unsigned unit = DecodePair(p);
+    if (unit == 0)
+      return false;
     *out++ = static_cast<char16>(unit);
     p += 2;
-    for (; stop - p >= kWord<char8>; p += kWord<char8>, out += kWord<char16>) {
-      const uint64_t word = LoadWord(p);
-      if (!ArePairs(word))
-        break;
-      StoreWord<4>((word & InEach<char16>(0x1F)) << 6 | (word >> 8 & InEach<char16>(kTailBits)), out);
-    }
-    if (p >= stop || Unit(*p) < 0xC0 || Unit(*p) > 0xDF) // sooner known than from the next pair
+    return p < stop && Unit(*p) >= 0xC0 && Unit(*p) < 0xE0; // sooner known than from the next pair
+  };
+  if (!convertOne())
+    return {p, out};
+  for (; stop - p >= kWord<char8>; p += kWord<char8>, out += kWord<char16>) {
+    const uint64_t word = LoadWord(p);
+    if (!ArePairs(word))
       break;
+    StoreWord<4>((word & InEach<char16>(0x1F)) << 6 | (word >> 8 & InEach<char16>(kTailBits)), out);
+  }
+  while (p < stop && convertOne()) {
   }
   return {p, out};
 }
 
-/// Converts sequences of three bytes whose lead leaves nothing else to check: the bulk of most Asian text.
+/// Converts sequences of three bytes whose lead leaves nothing else to check, which are nearly all.
 Progress<char16, char8> ConvertTriples(const char8* p, const char8* stop, char16* out) {
   for (; p < stop; p += 3) {
     const unsigned a = Unit(p[0]), b = TailBits(p[1]), c = TailBits(p[2]);
-    if (a < 0xE1 || a > 0xEC || (b | c) > kTailBits)
+    if (a < 0xE1 || a == 0xED || a > 0xEF || (b | c) > kTailBits)
       break;
     *out++ = static_cast<char16>((a & 0x0F) << 12 | b << 6 | c);
   }
@@ -228,18 +226,19 @@ char8* EncodePair(unsigned unit, char8* out) {
 /// Converts units that take two bytes from p on, where one stands.
 Progress<char8, char16> ConvertPairs(const char16* p, const char16* stop, char8* out) {
   out = EncodePair(*p++, out);
-  while (p < stop && IsPair(*p)) {
+  if (p >= stop || !IsPair(*p))
+    return {p, out};
+  for (; p < stop; p += 4, out += 8) {
     const uint64_t word = LoadWord(p);
     // A unit below 0x80 makes the difference borrow from the next one, but has high bits in it itself.
-    if (((word | (word - InEach<char16>(0x80))) & InEach<char16>(0xF800)) == 0) {
-      StoreWord<8>(InEach<char16>(0x80C0) | (word >> 6 & InEach<char16>(0x1F)) |
-                       (word & InEach<char16>(kTailBits)) << 8,
-                   out);
-      p += 4, out += 8;
-    } else {
-      out = EncodePair(*p++, out);
-    }
+    if (((word | (word - InEach<char16>(0x80))) & InEach<char16>(0xF800)) != 0)
+      break;
+    StoreWord<8>(InEach<char16>(0x80C0) | (word >> 6 & InEach<char16>(0x1F)) |
+                     (word & InEach<char16>(kTailBits)) << 8,
+                 out);
   }
+  for (; p < stop && IsPair(*p); ++p)
+    out = EncodePair(*p, out);
   return {p, out};
 }
 
@@ -322,11 +321,12 @@ bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen)
       p = plain.p, out = plain.out;
       if (p >= chunkEnd)
         break;
-      // The traits are the judges of everything else, and of the last few units.
-      const utf::code_point c = Decode(p, end);
-      isWellFormed = c != utf::illegal && c != utf::incomplete;
-      if (isWellFormed)
-        out = utf::utf_traits<CharOut>::encode(c, out);
+      do { // the traits are the judges of everything else, and of the last few units
+        const utf::code_point c = Decode(p, end);
+        isWellFormed = c != utf::illegal && c != utf::incomplete;
+        if (isWellFormed)
+          out = utf::utf_traits<CharOut>::encode(c, out);
+      } while (isWellFormed && p >= stop && p < chunkEnd);
     }
     result.append(chunk, out - chunk);
   }

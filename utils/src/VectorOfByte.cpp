@@ -92,8 +92,6 @@ void VectorOfByte::resize(ssize_t n) {
   size_ = n;
 }
 
-void VectorOfByte::clear() noexcept { size_ = 0; }
-
 void VectorOfByte::assign(const value_type* r1, const value_type* r2) {
   MIREL_ASSERT(r1 <= r2);
   if (owns(r1)) {
