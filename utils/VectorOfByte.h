@@ -10,6 +10,7 @@
 #include <initializer_list>
 #include <iterator>
 #include <type_traits>
+#include <utility>
 
 #include <utils/Precondition.h>
 #include <utils/xchar.h>
@@ -289,12 +290,19 @@ public:
   /// A copy, whose capacity is its size.
   VectorOfByte(const VectorOfByte& r);
   /// Gives the storage back.
-  ~VectorOfByte() { Release(m_buffer); }
+  ~VectorOfByte() {
+    if (m_buffer != nullptr) // compilers leave it out where they see that it is null
+      Release(m_buffer);
+  }
 
   /// Becomes a copy of r; keeps the storage where it is large enough.
   VectorOfByte& operator=(const VectorOfByte& r);
   /// Exchanges contents, sizes and capacities in constant time.
-  void swap(VectorOfByte& r) noexcept;
+  void swap(VectorOfByte& r) noexcept {
+    std::swap(m_buffer, r.m_buffer);
+    std::swap(size_, r.size_);
+    std::swap(m_capacity, r.m_capacity);
+  }
 
   /// @}
   /// @name Capacity

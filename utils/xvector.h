@@ -942,7 +942,7 @@ template <class T> T* xvector<T>::ResizeRun(ssize_t i, ssize_t n, ssize_t newN) 
     m_buffer.growbytes(Bytes(newN - n));
   else if (newN > n)
     m_buffer.insertbytes((i + n) * S, Bytes(newN - n));
-  else
+  else if (newN < n)
     erase(begin() + i + newN, begin() + i + n);
   return begin() + i;
 }

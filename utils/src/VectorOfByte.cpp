@@ -3,7 +3,6 @@
 #include <cstdlib>
 #include <limits>
 #include <new>
-#include <utility>
 
 namespace mirel {
 
@@ -61,12 +60,6 @@ VectorOfByte& VectorOfByte::operator=(const VectorOfByte& r) {
   if (this != &r)
     assign(r.begin(), r.end());
   return *this;
-}
-
-void VectorOfByte::swap(VectorOfByte& r) noexcept {
-  std::swap(m_buffer, r.m_buffer);
-  std::swap(size_, r.size_);
-  std::swap(m_capacity, r.m_capacity);
 }
 
 /// Makes a buffer n bytes large and returns where it is now; it is untouched when that throws.
