@@ -39,15 +39,13 @@ TYPED_TEST_SUITE(Allocation, CodeUnits);
 TYPED_TEST(Allocation, GrowthIsGeometric) {
   using S = basic_xstring<TypeParam>;
   const S run = Of<TypeParam>("seventeen units..");
-  const std::vector<std::function<void(S&)>> edits = {
-      [](S& s) { s.push_back('x'); },
-      [](S& s) { s.append(1, 'x'); },
-      [](S& s) { s.resize(s.size() + 1, 'x'); },
-      [&](S& s) { s += run; },
-      [](S& s) { s.push_back('x'), s.c_str(); },
-      [](S& s) { s.append(1, 'x'), s.c_str(); },
-      [&](S& s) { s += run, s.c_str(); },
-  };
+  const std::vector<std::function<void(S&)>> edits = {[](S& s) { s.push_back('x'); },
+                                                      [](S& s) { s.append(1, 'x'); },
+                                                      [](S& s) { s.resize(s.size() + 1, 'x'); },
+                                                      [&](S& s) { s += run; },
+                                                      [](S& s) { s.push_back('x'), s.c_str(); },
+                                                      [](S& s) { s.append(1, 'x'), s.c_str(); },
+                                                      [&](S& s) { s += run, s.c_str(); }};
   for (const auto& edit : edits) {
     S s;
     EXPECT_LT(allocation::Count([&] {
@@ -103,40 +101,20 @@ TYPED_TEST(Allocation, AFailureChangesNothing) {
   const S r = Of<TypeParam>("0123456789");
   static const volatile ssize_t kMax = std::numeric_limits<ssize_t>::max(); // unknown to the compiler
   const std::vector<std::function<void(S&)>> edits = {
-      [](S& s) { s.reserve(100); },
-      [](S& s) { s.resize(100, 'x'); },
-      [](S& s) { s.c_str(); },
-      [](S& s) { s.push_back('x'); },
-      [](S& s) { s.insert(1, 5, 'x'); },
-      [&](S& s) { s = r; },
-      [&](S& s) { s += r; },
-      [](S& s) { s += s; },
-      [](S& s) { s.assign(s, 1, 2); },
-      [&](S& s) { s.replace(1, 2, r); },
-      [](S& s) { s.replace(0, 3, s.data() + 1, 2); },
-      [](S& s) { s.assign(s.rbegin(), s.rend()); },
-      [](S& s) { s.insert(1, s.begin(), s.end()); },
-      [](S& s) { s *= 3; },
-      [](S& s) { s + s; },
-      [](S& s) { s.substr(); },
-      [](S& s) { S copy(s); },
-      [](S& s) { s.push_front(s[1]); },
-      [&](S& s) { s.insert(1, r); },
-      [&](S& s) { s.replace(1, 1, 5, 'x'); },
-      [&](S& s) { s.push_back(3, r.begin(), r.end()); },
-      [&](S& s) { s.append(r.data(), 4); },
+      [](S& s) { s.reserve(100); }, [](S& s) { s.resize(100, 'x'); }, [](S& s) { s.c_str(); },
+      [](S& s) { s.push_back('x'); }, [](S& s) { s.insert(1, 5, 'x'); }, [&](S& s) { s = r; },
+      [&](S& s) { s += r; }, [](S& s) { s += s; }, [](S& s) { s.assign(s, 1, 2); },
+      [&](S& s) { s.replace(1, 2, r); }, [](S& s) { s.replace(0, 3, s.data() + 1, 2); },
+      [](S& s) { s.assign(s.rbegin(), s.rend()); }, [](S& s) { s.insert(1, s.begin(), s.end()); },
+      [](S& s) { s *= 3; }, [](S& s) { s + s; }, [](S& s) { s.substr(); }, [](S& s) { S copy(s); },
+      [](S& s) { s.push_front(s[1]); }, [&](S& s) { s.insert(1, r); }, [&](S& s) { s.replace(1, 1, 5, 'x'); },
+      [&](S& s) { s.push_back(3, r.begin(), r.end()); }, [&](S& s) { s.append(r.data(), 4); },
       [z = r.c_str()](S& s) { s.append(z); },
       // What no machine can have.
-      [](S& s) { s.reserve(kMax); },
-      [](S& s) { s.resize(kMax, 'x'); },
-      [](S& s) { s.append(kMax, 'x'); },
+      [](S& s) { s.reserve(kMax); }, [](S& s) { s.resize(kMax, 'x'); }, [](S& s) { s.append(kMax, 'x'); },
       [](S& s) { s.append((kMax - 1) / ssize_t(sizeof(TypeParam)), 'x'); },
-      [](S& s) { s.insert(0, kMax / 2 + 1, 'x'); },
-      [](S& s) { s.assign(kMax, 'x'); },
-      [](S& s) { s *= kMax; },
-      [](S& s) { s *= kMax / 3 + 1; },
-      [](S& s) { s.append(s.data(), kMax); },
-  };
+      [](S& s) { s.insert(0, kMax / 2 + 1, 'x'); }, [](S& s) { s.assign(kMax, 'x'); },
+      [](S& s) { s *= kMax; }, [](S& s) { s *= kMax / 3 + 1; }, [](S& s) { s.append(s.data(), kMax); }};
   for (std::size_t i = 0; i < edits.size(); ++i) {
     int failures = 0;
     for (long failAfter = 0;; ++failAfter) {

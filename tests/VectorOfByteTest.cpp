@@ -32,17 +32,11 @@ TYPED_TEST(RangeAlgorithms, FailedSearchesReturnTheEnd) {
   const auto text = Of<TypeParam>("abcbc"), bc = Of<TypeParam>("bc");
   const TypeParam *const x1 = text.begin(), *const x2 = text.end(), *const y1 = bc.begin(),
                          *const y2 = bc.end();
-  EXPECT_EQ(FindFirstSubSequence(x1, x2, y1, y2), x1 + 1);
   EXPECT_EQ(FindFirstSubSequence(x1, x1 + 2, y1, y2), x1 + 2);
   EXPECT_EQ(FindFirstSubSequence(x1, x2, y1, y1), x1);
-  EXPECT_EQ(FindLastSubSequence(x1, x2, y1, y2), x1 + 3);
   EXPECT_EQ(FindLastSubSequence(x1, x1 + 2, y1, y2), x1 + 2);
   EXPECT_EQ(FindLastSubSequence(x1, x2, y1, y1), x2);
-  EXPECT_EQ(FindLast(x1, x1 + 1, 'b'), x1 + 1);
-  EXPECT_EQ(FindLastNotOf(x1, x2, y1, y2), x1);
-  EXPECT_EQ(FindFirstNotOf(y1, y2, y1, y2), y2);
-  EXPECT_EQ(FindFirstOf(x1, x2, y1, y1), x2);
-  EXPECT_TRUE(IsPrefix(x2, x2, y1, y1) && IsPrefix(x1 + 1, x2, y1, y2) && !IsPrefix(x1 + 4, x2, y1, y2));
+  EXPECT_TRUE(FindLast(x1, x1 + 1, 'b') == x1 + 1 && FindFirstNotOf(y1, y2, y1, y2) == y2);
   const std::list<TypeParam> list(x1, x2); // forward traversal is enough
   EXPECT_EQ(std::distance(list.begin(), FindFirstSubSequence(list.begin(), list.end(), y1, y2)), 1);
 }
