@@ -316,17 +316,14 @@ bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen)
     CharOut* out = chunk;
     const CharIn* const chunkEnd = end - p < kChunk ? end : p + kChunk;
     const CharIn* const stop = end - p < kLookahead ? p : std::min(chunkEnd, end - (kLookahead - 1));
+    const auto plain = ConvertPlain(p, stop, out);
+    p = plain.p, out = plain.out;
+    // The traits are the judges of what that didn't take, and of the last few units.
     while (p < chunkEnd && isWellFormed) {
-      const auto plain = ConvertPlain(p, stop, out);
-      p = plain.p, out = plain.out;
-      if (p >= chunkEnd)
-        break;
-      do { // the traits are the judges of everything else, and of the last few units
-        const utf::code_point c = Decode(p, end);
-        isWellFormed = c != utf::illegal && c != utf::incomplete;
-        if (isWellFormed)
-          out = utf::utf_traits<CharOut>::encode(c, out);
-      } while (isWellFormed && p >= stop && p < chunkEnd);
+      const utf::code_point c = Decode(p, end);
+      isWellFormed = c != utf::illegal && c != utf::incomplete;
+      if (isWellFormed)
+        out = utf::utf_traits<CharOut>::encode(c, out);
     }
     result.append(chunk, out - chunk);
   }
