@@ -6,11 +6,6 @@
 #include <new>
 #include <vector>
 
-namespace allocation {
-long count = 0;
-long failAfter = -1;
-} // namespace allocation
-
 // The linker puts the wrapper in the place of realloc in a static library; a shared one finds it in the
 // program.
 #ifdef MIREL_SHARED

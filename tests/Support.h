@@ -35,8 +35,8 @@ using CodeUnits = testing::Types<char8, char16>;
 
 namespace allocation {
 
-extern long count;     ///< how many allocations there were
-extern long failAfter; ///< how many of the next ones succeed before one fails; -1 for all
+inline thread_local long count = 0;      ///< how many allocations this thread has made
+inline thread_local long failAfter = -1; ///< how many of its next ones succeed before one fails; -1 for all
 
 /// Allocations that an action takes.
 template <class F> long Count(const F& action) {
