@@ -179,8 +179,28 @@ extern template struct ByBlock<char16>;
 /// The order above, by blocks; neither range is empty.
 MIREL_API int CompareByBlock(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
 
-/// In so short a range the plain loops are done before a call to the others has begun.
+/// In so short a range the loops in this file are done before a call to the others has begun.
 template <class T> bool IsShort(const T* x1, const T* x2) { return x2 - x1 <= 16; }
+
+/// Find() that asks for the end of the range at every fourth unit only.
+template <class T> const T* FindByFour(const T* i1, const T* i2, T v) {
+  while (i2 - i1 >= 4 && i1[0] != v && i1[1] != v && i1[2] != v && i1[3] != v)
+    i1 += 4;
+  while (i1 != i2 && *i1 != v)
+    ++i1;
+  return i1;
+}
+
+/// FindLast() in the same way, and by index, which compilers do better than by a pointer that goes back.
+template <class T> const T* FindLastByFour(const T* i1, const T* i2, T v) {
+  ssize_t i = i2 - i1;
+  while (i >= 4 && i1[i - 1] != v && i1[i - 2] != v && i1[i - 3] != v && i1[i - 4] != v)
+    i -= 4;
+  while (i > 0)
+    if (i1[--i] == v)
+      return i1 + i;
+  return i2;
+}
 
 template <class T>
 using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T, char16>, int>;
@@ -192,18 +212,12 @@ using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T
 /// @cond
 
 template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T* i2, const T& v) {
-  const bool isPlain = sizeof(T) > 1 && detail::IsShort(i1, i2); // for bytes there is the C library
-  return isPlain ? Find<const T*, T>(i1, i2, v) : detail::ByBlock<T>::Find(i1, i2, v);
+  const bool isInPlace = sizeof(T) > 1 && detail::IsShort(i1, i2); // for bytes there is the C library
+  return isInPlace ? detail::FindByFour(i1, i2, v) : detail::ByBlock<T>::Find(i1, i2, v);
 }
 template <class T, detail::IfCodeUnit<T> = 0> const T* FindLast(const T* i1, const T* i2, const T& v) {
-  if (!detail::IsShort(i1, i2))
-    return detail::ByBlock<T>::FindLast(i1, i2, v);
-  const T unit = v;
-  // By index, which compilers do better than by a pointer that goes back.
-  for (ssize_t i = i2 - i1; i > 0; --i)
-    if (i1[i - 1] == unit)
-      return i1 + (i - 1);
-  return i2;
+  return detail::IsShort(i1, i2) ? detail::FindLastByFour(i1, i2, v)
+                                 : detail::ByBlock<T>::FindLast(i1, i2, v);
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {

@@ -130,15 +130,6 @@ const T* Backward(const T* x1, const T* x2, const Plain& plain, const F& hasHit)
   return q == end ? x2 : q;
 }
 
-/// Find() one by one, with the end of the range asked for at every fourth unit only.
-template <class T> const T* FindByFour(const T* p, const T* end, T v) {
-  for (; end - p >= 4; p += 4)
-    for (ssize_t k = 0; k < 4; ++k)
-      if (p[k] == v)
-        return p + k;
-  return mirel::Find<const T*, T>(p, end, v);
-}
-
 /// Whether the set has v in it. For bytes the C library is quicker, unless the set is tiny.
 template <class T> bool IsIn(const T* y1, const T* y2, T v) {
   if (sizeof(T) == 1 && y2 - y1 > 4)
@@ -237,7 +228,7 @@ template <class T> const T* ByBlock<T>::Find(const T* i1, const T* i2, T v) {
 
 template <class T> const T* ByBlock<T>::FindLast(const T* i1, const T* i2, T v) {
   return Backward(
-      i1, i2, [=](const T* p, const T* end) { return mirel::FindLast<const T*, T>(p, end, v); },
+      i1, i2, [=](const T* p, const T* end) { return FindLastByFour(p, end, v); },
       [=](const T* p, auto n) { return Has<n>(p, v); });
 }
 
