@@ -22,7 +22,7 @@ extern "C" int LLVMFuzzerTestOneInput(const unsigned char* data, std::size_t siz
     return 0;
   // Up to where blocks are tried, up to the end of one, and seldom, since that takes long, up to that of a
   // chunk.
-  static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 3, 12, 15, 30, 40, 44, 1000};
+  static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 1, 2, 5, 20, 31, 34, 1000};
   const std::size_t before = kBefore[data[0] % std::size(kBefore)];
   ++data, --size;
   CheckCuts<char16>(before, oracle::Text<char8>(reinterpret_cast<const char8*>(data), size));

@@ -1,8 +1,8 @@
 // The conversions between UTF-8, UTF-16 and ASCII.
 //
 // Most of a text is plainly well-formed, and is converted here: ASCII by words and blocks, other letters by
-// runs of those that take the same number of bytes. What isn't is left to the traits of Boost, one code point
-// at a time.
+// runs of those that take the same number of bytes, some at a time. What isn't is left to the traits of
+// Boost, one code point at a time.
 
 #include <utils/xstring.h>
 
@@ -118,174 +118,215 @@ Progress<CharOut, CharIn> ConvertAscii(const CharIn* p, const CharIn* stop, Char
 /// The bits that the UTF-8 unit adds to a code point, or more than kTailBits if it can't follow another one.
 inline unsigned TailBits(char8 unit) { return Unit(unit) ^ 0x80u; }
 constexpr unsigned kTailBits = 0x3F;
+constexpr char8 Tail(unsigned bits) { return static_cast<char8>(0x80 | (bits & kTailBits)); }
 
 constexpr bool IsSurrogate(unsigned unit) { return (unit & 0xF800) == 0xD800; }
 
-/// The code unit that two bytes stand for, or 0 if they aren't well-formed.
-unsigned DecodePair(const char8* p) {
-  const unsigned b = TailBits(p[1]), unit = (unsigned(Unit(p[0])) - 0xC0) << 6 | b;
-  return b > kTailBits || unit < 0x80 || unit > 0x7FF ? 0 : unit;
-}
+// The letters that take two, three and four bytes in UTF-8, to be converted to units of CharOut:
+//
+// - kIn, kOut: how many units one takes in the input and in the output,
+// - IsAtMost(): whether no letter of more bytes begins with the unit, which isn't ASCII,
+// - MayBegin(): whether one may begin with the unit,
+// - Convert(): converts the one at p; false if none that is well-formed stands there,
+// - ConvertSome(): the same for kSome of them at once, where a word can be read.
 
-/// Whether a word of bytes is four well-formed pairs.
-bool ArePairs(uint64_t word) {
-  // The leads C0 and C1 would be overlong. For all others the sum has the highest bit.
-  const uint64_t sums = (word & InEach<char16>(0x1F)) + InEach<char16>(0x7FFE);
-  return (word & InEach<char16>(0xC0E0)) == InEach<char16>(0x80C0) &&
-         (sums & InEach<char16>(0x8000)) == InEach<char16>(0x8000);
-}
+template <class CharOut> struct TwoBytes;
+template <class CharOut> struct ThreeBytes;
+template <class CharOut> struct FourBytes;
 
-/// Converts sequences of two bytes from p on, where one may begin: most stand in runs.
-Progress<char16, char8> ConvertPairs(const char8* p, const char8* stop, char16* out) {
-  const auto convertOne = [&] {
-    const unsigned unit = DecodePair(p);
-    if (unit == 0)
+template <> struct TwoBytes<char16> {
+  static constexpr ssize_t kIn = 2, kOut = 1, kSome = 4;
+
+  static constexpr bool IsAtMost(unsigned unit) { return unit < 0xE0; }
+  static constexpr bool MayBegin(unsigned unit) { return unit >= 0xC2 && unit < 0xE0; }
+
+  static bool Convert(const char8* p, char16* out) {
+    const unsigned b = TailBits(p[1]), unit = (unsigned(Unit(p[0])) - 0xC0) << 6 | b;
+    if (b > kTailBits || unit < 0x80 || unit > 0x7FF)
       return false;
-    *out++ = static_cast<char16>(unit);
-    p += 2;
-    return p < stop && Unit(*p) >= 0xC0 && Unit(*p) < 0xE0; // sooner known than from the next pair
-  };
-  if (!convertOne())
-    return {p, out};
-  for (; stop - p >= kWord<char8>; p += kWord<char8>, out += kWord<char16>) {
+    *out = static_cast<char16>(unit);
+    return true;
+  }
+
+  static bool ConvertSome(const char8* p, char16* out) {
+    const uint64_t bits = LoadWord(p) ^ InEach<char16>(0x80C0);
+    // The leads C0 and C1 would be overlong. They make the difference borrow, which leaves high bits in it.
+    if (((bits | (bits - InEach<char16>(2))) & InEach<char16>(0xC0E0)) != 0)
+      return false;
+    StoreWord<4>((bits << 6 & InEach<char16>(0x07C0)) | (bits >> 8 & InEach<char16>(kTailBits)), out);
+    return true;
+  }
+};
+
+template <> struct TwoBytes<char8> {
+  static constexpr ssize_t kIn = 1, kOut = 2, kSome = 4;
+
+  static constexpr bool IsAtMost(unsigned unit) { return unit < 0x800; }
+  static constexpr bool MayBegin(unsigned unit) { return unit >= 0x80 && unit < 0x800; }
+
+  static bool Convert(const char16* p, char8* out) {
+    if (!MayBegin(p[0]))
+      return false;
+    out[0] = static_cast<char8>(0xC0 | p[0] >> 6);
+    out[1] = Tail(p[0]);
+    return true;
+  }
+
+  static bool ConvertSome(const char16* p, char8* out) {
+    const uint64_t word = LoadWord(p), tails = word & InEach<char16>(kTailBits), leads = (word ^ tails) >> 6;
+    // Leads below 2 make the difference borrow, which leaves high bits in it.
+    if (((leads | (leads - InEach<char16>(2))) & InEach<char16>(0xFFE0)) != 0)
+      return false;
+    StoreWord<8>(InEach<char16>(0x80C0) | leads | tails << 8, out);
+    return true;
+  }
+};
+
+/// The bits in the place of each of two letters of three bytes.
+constexpr uint64_t InTwo(uint64_t bits) { return bits | bits << 24; }
+
+template <> struct ThreeBytes<char16> {
+  static constexpr ssize_t kIn = 3, kOut = 1, kSome = 2;
+
+  static constexpr bool IsAtMost(unsigned unit) { return unit < 0xF0; }
+  static constexpr bool MayBegin(unsigned unit) { return unit >= 0xE0 && unit < 0xF0; }
+
+  static bool Convert(const char8* p, char16* out) {
+    const unsigned a = Unit(p[0]) ^ 0xE0u, b = TailBits(p[1]), c = TailBits(p[2]),
+                   unit = a << 12 | b << 6 | c;
+    if (a > 0xF || (b | c) > kTailBits || unit < 0x800 || IsSurrogate(unit))
+      return false;
+    *out = static_cast<char16>(unit);
+    return true;
+  }
+
+  static bool ConvertSome(const char8* p, char16* out) {
     const uint64_t word = LoadWord(p);
-    if (!ArePairs(word))
-      break;
-    StoreWord<4>((word & InEach<char16>(0x1F)) << 6 | (word >> 8 & InEach<char16>(kTailBits)), out);
+    const uint64_t units =
+        (word << 12 & InTwo(0xF000)) | (word >> 2 & InTwo(0x0FC0)) | (word >> 16 & InTwo(kTailBits));
+    // Where the highest bits are 0 the sequence is overlong, where they are 1B it stands for a surrogate. For
+    // all others both sums have the next bit.
+    const uint64_t high = units >> 11 & InTwo(0x1F);
+    const uint64_t sums = (high + InTwo(0x1F)) & ((high ^ InTwo(0x1B)) + InTwo(0x1F));
+    if ((word & InTwo(0xC0C0F0)) != InTwo(0x8080E0) || (sums & InTwo(0x20)) != InTwo(0x20))
+      return false;
+    out[0] = static_cast<char16>(units);
+    out[1] = static_cast<char16>(units >> 24);
+    return true;
   }
-  while (p < stop && convertOne()) {
+};
+
+template <> struct ThreeBytes<char8> {
+  static constexpr ssize_t kIn = 1, kOut = 3, kSome = 2;
+
+  static constexpr bool IsAtMost(unsigned unit) { return !IsSurrogate(unit); }
+  static constexpr bool MayBegin(unsigned unit) { return unit >= 0x800 && !IsSurrogate(unit); }
+
+  static bool Convert(const char16* p, char8* out) {
+    if (!MayBegin(p[0]))
+      return false;
+    out[0] = static_cast<char8>(0xE0 | p[0] >> 12);
+    out[1] = Tail(p[0] >> 6);
+    out[2] = Tail(p[0]);
+    return true;
   }
-  return {p, out};
-}
 
-/// Converts sequences of three bytes whose lead leaves nothing else to check, which are nearly all.
-Progress<char16, char8> ConvertTriples(const char8* p, const char8* stop, char16* out) {
-  for (; p < stop; p += 3) {
-    const unsigned a = Unit(p[0]), b = TailBits(p[1]), c = TailBits(p[2]);
-    if (a < 0xE1 || a == 0xED || a > 0xEF || (b | c) > kTailBits)
-      break;
-    *out++ = static_cast<char16>((a & 0x0F) << 12 | b << 6 | c);
-  }
-  return {p, out};
-}
-
-// ConvertPlain, for either direction, converts what is plainly well-formed, until something else comes or
-// stop is reached. It isn't inlined: that leaves its variables in registers, which in the caller have
-// addresses that are taken.
-
-[[gnu::noinline]] Progress<char16, char8> ConvertPlain(const char8* p, const char8* stop, char16* out) {
-  while (p < stop) {
-    unsigned a = Unit(p[0]);
-    if (a < 0x80) {
-      const auto ascii = ConvertAscii(p, stop, out);
-      p = ascii.p, out = ascii.out;
-      if (p == stop)
-        break;
-      a = Unit(p[0]); // not ASCII
-    }
-    if (a < 0xE0) {
-      const auto pairs = ConvertPairs(p, stop, out);
-      if (pairs.p == p)
-        break;
-      p = pairs.p, out = pairs.out;
-    } else if (a < 0xF0) {
-      const auto triples = ConvertTriples(p, stop, out);
-      if (triples.p == p) {
-        const unsigned b = TailBits(p[1]), c = TailBits(p[2]), unit = (a & 0x0F) << 12 | b << 6 | c;
-        if ((b | c) > kTailBits || unit < 0x800 || IsSurrogate(unit))
-          break;
-        *out++ = static_cast<char16>(unit);
-        p += 3;
-      } else {
-        p = triples.p, out = triples.out;
-      }
-    } else {
-      const unsigned b = TailBits(p[1]), c = TailBits(p[2]), d = TailBits(p[3]);
-      const unsigned codePoint = (a & 0x0F) << 18 | b << 12 | c << 6 | d;
-      if ((b | c | d) > kTailBits || codePoint < 0x10000 || codePoint > 0x10FFFF)
-        break;
-      *out++ = static_cast<char16>(0xD7C0 + (codePoint >> 10));
-      *out++ = static_cast<char16>(0xDC00 + (codePoint & 0x3FF));
-      p += 4;
-    }
-  }
-  return {p, out};
-}
-
-char8 Tail(unsigned bits) { return static_cast<char8>(0x80 | (bits & kTailBits)); }
-
-constexpr bool IsPair(unsigned unit) { return unit >= 0x80 && unit < 0x800; }
-constexpr bool IsTriple(unsigned unit) { return unit >= 0x800 && !IsSurrogate(unit); }
-
-char8* EncodePair(unsigned unit, char8* out) {
-  out[0] = static_cast<char8>(0xC0 | unit >> 6);
-  out[1] = Tail(unit);
-  return out + 2;
-}
-
-/// Converts units that take two bytes from p on, where one stands.
-Progress<char8, char16> ConvertPairs(const char16* p, const char16* stop, char8* out) {
-  out = EncodePair(*p++, out);
-  if (p >= stop || !IsPair(*p))
-    return {p, out};
-  for (; p < stop; p += 4, out += 8) {
-    const uint64_t word = LoadWord(p);
-    // A unit below 0x80 makes the difference borrow from the next one, but has high bits in it itself.
-    if (((word | (word - InEach<char16>(0x80))) & InEach<char16>(0xF800)) != 0)
-      break;
-    StoreWord<8>(InEach<char16>(0x80C0) | (word >> 6 & InEach<char16>(0x1F)) |
-                     (word & InEach<char16>(kTailBits)) << 8,
-                 out);
-  }
-  for (; p < stop && IsPair(*p); ++p)
-    out = EncodePair(*p, out);
-  return {p, out};
-}
-
-/// Converts units that take three bytes from p on, where one stands, in steps of two, which one branch
-/// decides: two made Japanese a tenth slower.
-Progress<char8, char16> ConvertTriples(const char16* p, const char16* stop, char8* out) {
-  out[0] = static_cast<char8>(0xE0 | *p >> 12);
-  out[1] = Tail(*p >> 6);
-  out[2] = Tail(*p);
-  out += 3;
-  for (++p; p < stop && (int(IsTriple(p[0])) & int(IsTriple(p[1]))) != 0; p += 2, out += 6) {
+  static bool ConvertSome(const char16* p, char8* out) {
+    // One branch: two made Japanese a tenth slower.
+    if ((int(MayBegin(p[0])) & int(MayBegin(p[1]))) == 0)
+      return false;
     const uint64_t both = p[0] | uint64_t(p[1]) << 24;
     // Eight bytes are written at once, of which six count.
-    StoreWord<8>(0x8080E08080E0 | (both >> 12 & 0x00000F00000F) | (both << 2 & 0x003F00003F00) |
-                     (both << 16 & 0x3F00003F0000),
+    StoreWord<8>(InTwo(0x8080E0) | (both >> 12 & InTwo(0x0F)) | (both << 2 & InTwo(0x3F00)) |
+                     (both << 16 & InTwo(0x3F0000)),
                  out);
+    return true;
   }
-  return {p, out};
+};
+
+template <> struct FourBytes<char16> {
+  static constexpr ssize_t kIn = 4, kOut = 2;
+
+  static bool Convert(const char8* p, char16* out) {
+    const unsigned a = Unit(p[0]) & 0x0Fu, b = TailBits(p[1]), c = TailBits(p[2]), d = TailBits(p[3]);
+    const unsigned codePoint = a << 18 | b << 12 | c << 6 | d;
+    if ((b | c | d) > kTailBits || codePoint < 0x10000 || codePoint > 0x10FFFF)
+      return false;
+    out[0] = static_cast<char16>(0xD7C0 + (codePoint >> 10));
+    out[1] = static_cast<char16>(0xDC00 + (codePoint & 0x3FF));
+    return true;
+  }
+};
+
+template <> struct FourBytes<char8> {
+  static constexpr ssize_t kIn = 2, kOut = 4;
+
+  static bool Convert(const char16* p, char8* out) {
+    const unsigned a = p[0] ^ 0xD800u, b = p[1] ^ 0xDC00u;
+    if ((a | b) > 0x3FF)
+      return false;
+    const unsigned codePoint = 0x10000 + (a << 10 | b);
+    out[0] = static_cast<char8>(0xF0 | codePoint >> 18);
+    out[1] = Tail(codePoint >> 12);
+    out[2] = Tail(codePoint >> 6);
+    out[3] = Tail(codePoint);
+    return true;
+  }
+};
+
+/// Converts letters of one kind from p on, and the single spaces between words of them.
+template <class Letters, class CharOut, class CharIn>
+[[gnu::noinline]] Progress<CharOut, CharIn> ConvertRun(const CharIn* p, const CharIn* stop, CharOut* out) {
+  for (;;) {
+    for (; stop - p > kWord<CharIn> - kLookahead;
+         p += Letters::kSome * Letters::kIn, out += Letters::kSome * Letters::kOut)
+      if (!Letters::ConvertSome(p, out))
+        break;
+    for (; p < stop && Letters::Convert(p, out); p += Letters::kIn, out += Letters::kOut) {
+    }
+    if (p >= stop || Unit(p[0]) >= 0x80 || !Letters::MayBegin(Unit(p[1])))
+      return {p, out};
+    *out++ = static_cast<CharOut>(*p++);
+  }
 }
 
-[[gnu::noinline]] Progress<char8, char16> ConvertPlain(const char16* p, const char16* stop, char8* out) {
+/// Converts the letter at p, if it is well-formed, and what follows if that is one of the same kind: many
+/// stand alone.
+template <class Letters, class CharOut, class CharIn>
+Progress<CharOut, CharIn> ConvertLetters(const CharIn* p, const CharIn* stop, CharOut* out) {
+  if (!Letters::Convert(p, out))
+    return {p, out};
+  p += Letters::kIn, out += Letters::kOut;
+  if (p >= stop || !Letters::MayBegin(Unit(*p)))
+    return {p, out};
+  return ConvertRun<Letters>(p, stop, out);
+}
+
+/// Converts what is plainly well-formed, until something else comes or stop is reached. It isn't inlined:
+/// that leaves its variables in registers, which in the caller have addresses that are taken.
+template <class CharOut, class CharIn>
+[[gnu::noinline]] Progress<CharOut, CharIn> ConvertPlain(const CharIn* p, const CharIn* stop, CharOut* out) {
   while (p < stop) {
-    unsigned a = p[0];
-    if (a < 0x80) {
+    if (Unit(*p) < 0x80) {
       const auto ascii = ConvertAscii(p, stop, out);
       p = ascii.p, out = ascii.out;
       if (p == stop)
         break;
-      a = p[0]; // not ASCII
     }
-    if (IsPair(a)) {
-      const auto pairs = ConvertPairs(p, stop, out);
-      p = pairs.p, out = pairs.out;
-    } else if (IsTriple(a)) {
-      const auto triples = ConvertTriples(p, stop, out);
-      p = triples.p, out = triples.out;
-    } else {
-      const unsigned b = p[1];
-      if (a >= 0xDC00 || (b & 0xFC00) != 0xDC00)
+    if (const unsigned unit = Unit(*p); TwoBytes<CharOut>::IsAtMost(unit)) {
+      const auto letters = ConvertLetters<TwoBytes<CharOut>>(p, stop, out);
+      if (letters.p == p)
         break;
-      const unsigned codePoint = 0x10000 + ((a & 0x3FF) << 10) + (b & 0x3FF);
-      out[0] = static_cast<char8>(0xF0 | codePoint >> 18);
-      out[1] = Tail(codePoint >> 12);
-      out[2] = Tail(codePoint >> 6);
-      out[3] = Tail(codePoint);
-      out += 4;
-      p += 2;
+      p = letters.p, out = letters.out;
+    } else if (ThreeBytes<CharOut>::IsAtMost(unit)) {
+      const auto letters = ConvertLetters<ThreeBytes<CharOut>>(p, stop, out);
+      if (letters.p == p)
+        break;
+      p = letters.p, out = letters.out;
+    } else {
+      if (!FourBytes<CharOut>::Convert(p, out))
+        break;
+      p += FourBytes<CharOut>::kIn, out += FourBytes<CharOut>::kOut;
     }
   }
   return {p, out};
