@@ -57,7 +57,7 @@ public:
     };
     const auto without = [&](T c) { return M(m.begin(), std::remove(m.begin(), m.end(), c)); };
     const auto times = [](ssize_t k, T c) { return M(size_t(k), c); };
-    const ssize_t what = this->Number(36);
+    const ssize_t what = this->Number(37);
     switch (what) {
     case 0: v.push_back(x1), becomes(size, 0, {own1}); break;
     case 1: v.append(r), becomes(size, 0, text); break;
@@ -103,6 +103,7 @@ public:
     case 32: v.append(v.c_str() + ri), becomes(size, 0, zeroTerminated); break;
     case 33: v.assign(v.c_str() + ri), becomes(0, size, zeroTerminated); break;
     case 34: v.insert(i, v.c_str() + ri), becomes(i, 0, zeroTerminated); break;
+    case 37: v.append(v.c_str() + ri, size - ri + 1), becomes(size, 0, M(m, size_t(ri)) + T(0)); break;
     case 36: {
       const ssize_t k = std::min(n, rn);
       v.move(i, ri, k), becomes(i, k, m.substr(size_t(ri), size_t(k)));

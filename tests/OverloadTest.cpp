@@ -81,7 +81,26 @@ TYPED_TEST(Overload, LiteralZeroIsANumber) {
       s.replace(0, 0, kZero, x);
   VectorOfByte().insert(nullptr, 0, 0);
   EXPECT_TRUE(s.empty() && S({r.data(), 0}).empty() && S({r, 0, 0}).empty());
-  static_assert(!std::is_constructible_v<S, std::nullptr_t> && !std::is_assignable_v<S&, std::nullptr_t>);
+  static_assert(!std::is_constructible_v<S, std::nullptr_t>);
+}
+
+// Calls with a string and a null pointer, to be asked whether they would compile.
+#define CALL(EXPRESSION)                                                                                     \
+  [](auto&& s, auto null) -> decltype(EXPRESSION, void()) { static_cast<void>(s), null; }
+
+TYPED_TEST(Overload, LiteralNullIsNoString) {
+  const auto compiles = [](auto call) {
+    return std::is_invocable_v<decltype(call), basic_xstring<TypeParam>, std::nullptr_t>;
+  };
+  EXPECT_TRUE(compiles(CALL(s.insert(0, null, 0))));
+  EXPECT_FALSE(compiles(CALL(s = null)) || compiles(CALL(s += null)) || compiles(CALL(s.assign(null))) ||
+               compiles(CALL(s.append(null))) || compiles(CALL(s.insert(0, null))) ||
+               compiles(CALL(s.replace(0, 0, null))) || compiles(CALL(s.compare(null))) ||
+               compiles(CALL(s.compare(0, 0, null))) || compiles(CALL(s._Eq(null))) ||
+               compiles(CALL(s._Lt(null))) || compiles(CALL(s.find(null))) ||
+               compiles(CALL(s.rfind(null, 0))) || compiles(CALL(s.find_first_of(null))) ||
+               compiles(CALL(s.find_first_not_of(null))) || compiles(CALL(s.find_last_of(null))) ||
+               compiles(CALL(s.find_last_not_of(null, 0))));
 }
 
 TYPED_TEST(Overload, AnyIteratorIsASource) {

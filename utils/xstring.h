@@ -139,6 +139,7 @@ public:
     insert(i, s, s + GetStringLength(s));
     return *this;
   }
+  basic_xstring<T>& insert(ssize_t, std::nullptr_t) = delete;
   using Base::replace;
   /// Puts a zero-terminated run in the place of n units from index i on.
   /// @pre "0 <= i && 0 <= n && i+n <= size()"
@@ -146,6 +147,7 @@ public:
     replace(i, n, p, GetStringLength(p));
     return *this;
   }
+  basic_xstring<T>& replace(ssize_t, ssize_t, std::nullptr_t) = delete;
 
   /// @}
   /// @name Comparison
@@ -157,6 +159,7 @@ public:
   int compare(std::nullptr_t) const = delete;
   /// n units from index i on, with a zero-terminated run. @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const T* p) const { return compare(i, n, p, GetStringLength(p)); }
+  int compare(ssize_t, ssize_t, std::nullptr_t) const = delete;
   using Base::_Eq;
   /// Whether the string holds the units of a zero-terminated run.
   bool _Eq(const T* rhs) const { return compare(rhs) == 0; }
@@ -179,6 +182,7 @@ public:
   using Base::find;
   /// The first occurrence of a zero-terminated run; of an empty one, offset.
   ssize_t find(const T* p, ssize_t offset = 0) const { return find(p, p + GetStringLength(p), offset); }
+  ssize_t find(std::nullptr_t, ssize_t = 0) const = delete;
   /// The first unit that is c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t find(X c, ssize_t offset = 0) const {
     return Base::find(T(c), offset);
@@ -189,6 +193,7 @@ public:
   ssize_t rfind(const T* p, ssize_t offset = Base::npos) const {
     return rfind(p, p + GetStringLength(p), offset);
   }
+  ssize_t rfind(std::nullptr_t, ssize_t = Base::npos) const = delete;
   /// The last unit at or before offset that is c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t rfind(X c, ssize_t offset = Base::npos) const {
     return Base::rfind(T(c), offset);
@@ -198,6 +203,7 @@ public:
   ssize_t find_first_of(const T* s, ssize_t offset = 0) const {
     return find_first_of(s, s + GetStringLength(s), offset);
   }
+  ssize_t find_first_of(std::nullptr_t, ssize_t = 0) const = delete;
   /// The first unit that is c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t find_first_of(X c, ssize_t offset = 0) const {
     return Base::find_first_of(T(c), offset);
@@ -207,6 +213,7 @@ public:
   ssize_t find_first_not_of(const T* s, ssize_t offset = 0) const {
     return find_first_not_of(s, s + GetStringLength(s), offset);
   }
+  ssize_t find_first_not_of(std::nullptr_t, ssize_t = 0) const = delete;
   /// The first unit that is not c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t find_first_not_of(X c, ssize_t offset = 0) const {
     return Base::find_first_not_of(T(c), offset);
@@ -216,6 +223,7 @@ public:
   ssize_t find_last_of(const T* s, ssize_t offset = Base::npos) const {
     return find_last_of(s, s + GetStringLength(s), offset);
   }
+  ssize_t find_last_of(std::nullptr_t, ssize_t = Base::npos) const = delete;
   /// The last unit at or before offset that is c.
   template <class X, detail::IfIntegers<X> = 0> ssize_t find_last_of(X c, ssize_t offset = Base::npos) const {
     return Base::find_last_of(T(c), offset);
@@ -225,6 +233,7 @@ public:
   ssize_t find_last_not_of(const T* s, ssize_t offset = Base::npos) const {
     return find_last_not_of(s, s + GetStringLength(s), offset);
   }
+  ssize_t find_last_not_of(std::nullptr_t, ssize_t = Base::npos) const = delete;
   /// The last unit at or before offset that is not c.
   template <class X, detail::IfIntegers<X> = 0>
   ssize_t find_last_not_of(X c, ssize_t offset = Base::npos) const {
@@ -259,8 +268,9 @@ extern template class basic_xstring<char16>;
 /// Replace the contents of the destination with those of the run of srcLen units at src, in one pass and in
 /// linear time. UTF-16 is in the machine's own byte order; a byte order mark is a code point like any other,
 /// and so is a zero. What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition
-/// D91 for UTF-16. Memory that can't be had is std::bad_alloc and leaves the destination partly filled. The
-/// source may not lie in the destination; a null pointer may come with a count of 0.
+/// D91 for UTF-16. Memory that can't be had is std::bad_alloc; the destination then holds the beginning of
+/// the result, or, of the conversion from ASCII, what it held before. The source may not lie in the
+/// destination; a null pointer may come with a count of 0.
 /// @{
 
 /// One unit for each byte: its value, or "?" for bytes from 0x80 on. @pre "newSize >= 0", of srcLen

@@ -907,14 +907,15 @@ private:
   void ReplaceRun(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRun(ssize_t i, ssize_t n, ssize_t count, T x);
 
-  /// Appends the pn elements at p: the most frequent edit, with nothing to call where there is room. Then the
-  /// elements may also be some of this vector, since nothing moves.
+  /// Appends the pn elements at p: the most frequent edit, with no call to the library where there is room.
+  /// Then they may also be some of this vector, even of its spare part, since nothing else moves.
   void Append(const T* p, ssize_t pn) {
     const ssize_t oldSize = size();
     if (pn > capacity() - oldSize)
       return ReplaceRun(oldSize, 0, p, pn);
     m_buffer.growbytes(pn * S);
-    p_copy(begin() + oldSize, p, p + pn);
+    if (pn > 0) // memmove may not be given null pointers, even for no bytes
+      std::memmove(begin() + oldSize, p, static_cast<std::size_t>(pn * S));
   }
 
   /// The end of the part that a reverse search from offset goes through.
