@@ -66,7 +66,7 @@ TEST(Utf, SurrogatesMustPair) {
 TEST(Utf, OneThatIsDifferentInARun) {
   const char8* const bytes[] = {"a",        "\xC3\xA9",     "\xE2\x82\xAC", "\xF0\x9F\x98\x80",
                                 "\xFF",     "\xC3",         "\xC1\xA9",     "\xDF\xBF",
-                                "\xE2\x82", "\xED\xA0\x80", "\xEF\xBC\x8C"};
+                                "\xE1\x82", "\xED\xA0\x80", "\xEF\xBC\x8C", "\xE0\x9F\xBF"};
   const Text<char16> units[] = {{'a'},    {0xE9},   {0x20AC},         {0x7F},   {0x80},  {0x7FF},
                                 {0x0800}, {0xFF0C}, {0xD83D, 0xDE00}, {0xD83D}, {0xDE00}};
   const auto run = [](const auto& one, std::size_t n) {
