@@ -103,13 +103,14 @@ public:
     case 32: v.append(v.c_str() + ri), becomes(size, 0, zeroTerminated); break;
     case 33: v.assign(v.c_str() + ri), becomes(0, size, zeroTerminated); break;
     case 34: v.insert(i, v.c_str() + ri), becomes(i, 0, zeroTerminated); break;
-    case 37: v.append(v.c_str() + ri, size - ri + 1), becomes(size, 0, M(m, size_t(ri)) + T(0)); break;
+
+    case 35: v.replace(i, n, v.c_str() + ri), becomes(i, n, zeroTerminated); break;
     case 36: {
       const ssize_t k = std::min(n, rn);
       v.move(i, ri, k), becomes(i, k, m.substr(size_t(ri), size_t(k)));
       break;
     }
-    case 35: v.replace(i, n, v.c_str() + ri), becomes(i, n, zeroTerminated); break;
+    case 37: v.append(v.c_str() + ri, size - ri + 1), becomes(size, 0, M(m, size_t(ri)) + T(0)); break;
     }
     ASSERT_EQ(Std(v), m) << "edit " << what;
     ASSERT_TRUE(v.size() <= v.capacity() && v.empty() == m.empty() && v.end() - v.begin() == v.size());

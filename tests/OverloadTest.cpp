@@ -84,20 +84,19 @@ TYPED_TEST(Overload, LiteralZeroIsANumber) {
   static_assert(!std::is_constructible_v<S, std::nullptr_t>);
 }
 
-// Calls with a string and a null pointer, to be asked whether they would compile.
-#define CALL(EXPRESSION)                                                                                     \
-  [](auto&& s, auto null) -> decltype(EXPRESSION, void()) { static_cast<void>(s), null; }
+// Calls with a string and a pointer, to be asked whether they would compile.
+#define CALL(EXPRESSION) [](auto&& s, auto p) -> decltype(EXPRESSION, void()) { static_cast<void>(s), p; }
 
 TYPED_TEST(Overload, LiteralNullIsNoString) {
-  const auto some = [](auto... calls) {
-    return (std::is_invocable_v<decltype(calls), basic_xstring<TypeParam>, std::nullptr_t> || ...);
+  const auto check = [](auto... calls) {
+    using S = basic_xstring<TypeParam>;
+    EXPECT_TRUE((std::is_invocable_v<decltype(calls), S, const TypeParam*> && ...));
+    EXPECT_FALSE((std::is_invocable_v<decltype(calls), S, std::nullptr_t> || ...));
   };
-  EXPECT_TRUE(some(CALL(s.insert(0, null, 0))));
-  EXPECT_FALSE(some(CALL(s = null), CALL(s += null), CALL(s.assign(null)), CALL(s.append(null)),
-                    CALL(s._Eq(null)), CALL(s.insert(0, null)), CALL(s.replace(0, 0, null)),
-                    CALL(s.compare(null)), CALL(s._Lt(null)), CALL(s.compare(0, 0, null)), CALL(s.find(null)),
-                    CALL(s.rfind(null, 0)), CALL(s.find_first_of(null)), CALL(s.find_last_of(null)),
-                    CALL(s.find_first_not_of(null)), CALL(s.find_last_not_of(null, 0))));
+  check(CALL(s = p), CALL(s += p), CALL(s.assign(p)), CALL(s.append(p)), CALL(s._Eq(p)), CALL(s.insert(0, p)),
+        CALL(s.replace(0, 0, p)), CALL(s.compare(p)), CALL(s._Lt(p)), CALL(s.compare(0, 0, p)),
+        CALL(s.find(p)), CALL(s.rfind(p, 0)), CALL(s.find_first_of(p)), CALL(s.find_last_of(p)),
+        CALL(s.find_first_not_of(p)), CALL(s.find_last_not_of(p, 0)));
 }
 
 TYPED_TEST(Overload, AnyIteratorIsASource) {

@@ -26,13 +26,10 @@ TEST(Utf, EveryScalarValueBothWays) {
 
 TEST(Utf, EverySequenceOfUpToThreeBytes) {
   for (unsigned bytes = 0; bytes < 1u << 24; ++bytes) {
-    char8 text[] = {0, 0, 0, 'm', 'o', 'r', 'e'}; // no more than may be read
-    for (int k = 0; k < 3; ++k)
-      text[k] = static_cast<char8>(bytes >> (16 - 8 * k));
-    const View<char8> all(text, 7);
+    const char8 text[] = {static_cast<char8>(bytes >> 16), static_cast<char8>(bytes >> 8),
+                          static_cast<char8>(bytes)};
     const std::size_t zeros = bytes < 0x100 ? 2 : bytes < 0x10000; // they were seen before
-    ASSERT_NO_FATAL_FAILURE(CheckUtf8(all.substr(zeros, 3 - zeros)));
-    ASSERT_NO_FATAL_FAILURE(CheckUtf8(all)); // what is near the end is converted in another way
+    ASSERT_NO_FATAL_FAILURE(CheckAmongLetters(View<char8>(text, 3).substr(zeros)));
   }
 }
 
@@ -42,11 +39,9 @@ TEST(Utf, FourBytes) {
     for (unsigned second = 0; second < 0x100; ++second)
       for (const unsigned c : tails)
         for (const unsigned d : tails) {
-          char8 text[] = {0, 0, 0, 0, 'm', 'o', 'r', 'e'};
-          text[0] = static_cast<char8>(lead), text[1] = static_cast<char8>(second);
-          text[2] = static_cast<char8>(c), text[3] = static_cast<char8>(d);
-          for (const std::size_t size : {4u, 8u})
-            ASSERT_NO_FATAL_FAILURE(CheckUtf8({text, size}));
+          const char8 text[] = {static_cast<char8>(lead), static_cast<char8>(second), static_cast<char8>(c),
+                                static_cast<char8>(d)};
+          ASSERT_NO_FATAL_FAILURE(CheckAmongLetters(View<char8>(text, 4)));
         }
 }
 
@@ -56,17 +51,15 @@ TEST(Utf, SurrogatesMustPair) {
   for (const char16 a : values)
     for (const char16 b : values)
       for (const char16 c : values)
-        for (const std::size_t size : {3u, 43u}) {
-          Text<char16> units{a, b, c};
-          units.resize(size, 'z');
-          ASSERT_NO_FATAL_FAILURE(CheckUtf16(units));
-        }
+        ASSERT_NO_FATAL_FAILURE(CheckAmongLetters(Text<char16>{a, b, c}));
 }
 
 TEST(Utf, OneThatIsDifferentInARun) {
-  const char8* const bytes[] = {"a",        "\xC3\xA9",     "\xE2\x82\xAC", "\xF0\x9F\x98\x80",
-                                "\xFF",     "\xC3",         "\xC1\xA9",     "\xDF\xBF",
-                                "\xE1\x82", "\xED\xA0\x80", "\xEF\xBC\x8C", "\xE0\x9F\xBF"};
+  const char8* const bytes[] = {
+      "a", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xDF\xBF", "\xEF\xBC\x8C",
+      // overlong, surrogates, cut off or wrong in one byte
+      "\xC1\xA9", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xC3", "\xE1", "\xE1\x82", "\xFF", "\xC3 ", "\x82\xAC",
+      "\xC3\xA9\xA9", "\xE1 \xAC", "\xE1\x82 ", "\xF0\xA0\x80\x80"};
   const Text<char16> units[] = {{'a'},    {0xE9},   {0x20AC},         {0x7F},   {0x80},  {0x7FF},
                                 {0x0800}, {0xFF0C}, {0xD83D, 0xDE00}, {0xD83D}, {0xDE00}};
   const auto run = [](const auto& one, std::size_t n) {

@@ -118,7 +118,7 @@ def coverage(row):
 
 
 def threads(row):
-    """The tests of threads, many times: a race isn't seen each time that it is there."""
+    """The tests of threads, many times: a race doesn't show in every run."""
     row.build("mirel_tests", cxx="clang++", flags="-O1 -g -fsanitize=thread")
     row.run(row.dir / "tests" / "mirel_tests", "--gtest_filter=Thread*", "--gtest_repeat=20")
 

@@ -212,8 +212,8 @@ using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T
 /// @cond
 
 template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T* i2, const T& v) {
-  const bool isInPlace = sizeof(T) > 1 && detail::IsShort(i1, i2); // for bytes there is the C library
-  return isInPlace ? detail::FindByFour(i1, i2, v) : detail::ByBlock<T>::Find(i1, i2, v);
+  const bool isInline = sizeof(T) > 1 && detail::IsShort(i1, i2); // for bytes there is the C library
+  return isInline ? detail::FindByFour(i1, i2, v) : detail::ByBlock<T>::Find(i1, i2, v);
 }
 template <class T, detail::IfCodeUnit<T> = 0> const T* FindLast(const T* i1, const T* i2, const T& v) {
   return detail::IsShort(i1, i2) ? detail::FindLastByFour(i1, i2, v)

@@ -907,8 +907,8 @@ private:
   void ReplaceRun(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRun(ssize_t i, ssize_t n, ssize_t count, T x);
 
-  /// Appends the pn elements at p: the most frequent edit, with no call to the library where there is room.
-  /// Then they may also be some of this vector, even of its spare part, since nothing else moves.
+  /// Appends the pn elements at p: the most frequent edit, inline where there is room. Then they may also lie
+  /// in this vector, even in its spare part: the storage stays, and memmove takes runs that overlap.
   void Append(const T* p, ssize_t pn) {
     const ssize_t oldSize = size();
     if (pn > capacity() - oldSize)

@@ -20,8 +20,8 @@ extern "C" int LLVMFuzzerTestOneInput(const unsigned char* data, std::size_t siz
   GTEST_FLAG_SET(throw_on_failure, true);
   if (size == 0 || size > 128)
     return 0;
-  // Up to where blocks are tried, up to the end of one, and seldom, since that takes long, up to that of a
-  // chunk.
+  // As much ASCII as leads into each way of converting it: single units, words, blocks and the end of one,
+  // and seldom, since that takes long, the end of a chunk.
   static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 1, 2, 5, 20, 31, 34, 1000};
   const std::size_t before = kBefore[data[0] % std::size(kBefore)];
   ++data, --size;

@@ -29,22 +29,20 @@ template <class F> void ForAll(const char* what, const F& check) {
 
 TEST(Exhaustive, FourBytes) {
   ForAll("four bytes", [](char16 high) {
-    char8 text[] = {static_cast<char8>(high >> 8), static_cast<char8>(high), 0, 0, 'm', 'o', 'r', 'e'};
+    char8 text[] = {static_cast<char8>(high >> 8), static_cast<char8>(high), 0, 0};
     for (unsigned low = 0; low <= 0xFFFF; ++low) {
       text[2] = static_cast<char8>(low >> 8), text[3] = static_cast<char8>(low);
-      oracle::CheckUtf8({text, 4});
-      oracle::CheckUtf8({text, 8}); // what is near the end is converted in another way
+      oracle::CheckAmongLetters(oracle::View<char8>(text, 4));
     }
   });
 }
 
 TEST(Exhaustive, TwoUnits) {
   ForAll("two units", [](char16 first) {
-    char16 units[] = {first, 0, 'm', 'o', 'r', 'e'};
+    char16 units[] = {first, 0};
     for (unsigned second = 0; second <= 0xFFFF; ++second) {
       units[1] = static_cast<char16>(second);
-      oracle::CheckUtf16({units, 2});
-      oracle::CheckUtf16({units, 6});
+      oracle::CheckAmongLetters(oracle::View<char16>(units, 2));
     }
   });
 }

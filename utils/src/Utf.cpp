@@ -37,10 +37,10 @@ template <class CharOut> constexpr ssize_t kExpansion = sizeof(CharOut) == 1 ? 3
 /// Units of ASCII that are converted at once: more than compilers unroll, so that they use wide instructions.
 constexpr ssize_t kBlock = 32;
 
-/// A step of a conversion begins before a pointer that is called stop here, and can read so many units from
-/// its own beginning on. It may end behind stop, but ends within the text.
+/// A step of a conversion begins before a pointer that is called stop here, and may read so many units from
+/// its own beginning on. It may end past stop, but never past the end of the text.
 constexpr ssize_t kLookahead = 4;
-static_assert(kWord<char16> <= kLookahead);
+static_assert(kWord<char16> >= kLookahead); // or ConvertRun() could take a step where none may begin
 
 /// The bits that no unit of ASCII has, in a word.
 template <class T> constexpr uint64_t kNotAscii = InEach<T>(sizeof(T) == 1 ? 0x80 : 0xFF80);
@@ -54,8 +54,8 @@ template <class CharOut, class CharIn> struct Progress {
 // Below, a block or word that has something other than ASCII in it is written whole, but out goes behind its
 // ASCII only.
 
-/// Converts ASCII from p on, up to something else or until less than a block is left. It isn't inlined: there
-/// one compiler forgets that out isn't where p is, and takes the blocks apart into single units.
+/// Converts ASCII from p on, up to something else or until less than a block is left. It isn't inlined: then
+/// one compiler no longer sees that out and p are apart, and takes the blocks apart into single units.
 template <class CharOut, class CharIn>
 [[gnu::noinline]] Progress<CharOut, CharIn> ConvertBlocks(const CharIn* __restrict p, const CharIn* stop,
                                                           CharOut* __restrict out) {
@@ -122,13 +122,17 @@ constexpr char8 Tail(unsigned bits) { return static_cast<char8>(0x80 | (bits & k
 
 constexpr bool IsSurrogate(unsigned unit) { return (unit & 0xF800) == 0xD800; }
 
-// The letters that take two, three and four bytes in UTF-8, to be converted to units of CharOut:
+// The code points that take two, three and four bytes in UTF-8, called letters whatever they are, to be
+// converted to units of CharOut:
 //
 // - kIn, kOut: how many units one takes in the input and in the output,
-// - IsAtMost(): whether no letter of more bytes begins with the unit, which isn't ASCII,
-// - MayBegin(): whether one may begin with the unit,
-// - Convert(): converts the one at p; false if none that is well-formed stands there,
-// - ConvertSome(): the same for kSome of them at once, where a word can be read.
+// - Convert(): converts the one at p; false if none that is well-formed stands there.
+//
+// Those of two and three bytes stand in runs, and have in addition
+//
+// - IsAtMost(): whether no letter that begins with the unit, which isn't ASCII, takes more bytes,
+// - MayBegin(): whether one of this kind may begin with the unit,
+// - ConvertSome(): Convert() for kSome of them at once, where a word can be read.
 
 template <class CharOut> struct TwoBytes;
 template <class CharOut> struct ThreeBytes;
@@ -204,8 +208,8 @@ template <> struct ThreeBytes<char16> {
     const uint64_t word = LoadWord(p);
     const uint64_t units =
         (word << 12 & InTwo(0xF000)) | (word >> 2 & InTwo(0x0FC0)) | (word >> 16 & InTwo(kTailBits));
-    // Where the highest bits are 0 the sequence is overlong, where they are 1B it stands for a surrogate. For
-    // all others both sums have the next bit.
+    // Where the highest bits are 0 the sequence is overlong, where they are 0x1B it stands for a surrogate.
+    // For all others both sums have the next bit.
     const uint64_t high = units >> 11 & InTwo(0x1F);
     const uint64_t sums = (high + InTwo(0x1F)) & ((high ^ InTwo(0x1B)) + InTwo(0x1F));
     if ((word & InTwo(0xC0C0F0)) != InTwo(0x8080E0) || (sums & InTwo(0x20)) != InTwo(0x20))
@@ -248,7 +252,7 @@ template <> struct FourBytes<char16> {
   static constexpr ssize_t kIn = 4, kOut = 2;
 
   static bool Convert(const char8* p, char16* out) {
-    const unsigned a = Unit(p[0]) & 0x0Fu, b = TailBits(p[1]), c = TailBits(p[2]), d = TailBits(p[3]);
+    const unsigned a = Unit(p[0]) ^ 0xF0u, b = TailBits(p[1]), c = TailBits(p[2]), d = TailBits(p[3]);
     const unsigned codePoint = a << 18 | b << 12 | c << 6 | d;
     if ((b | c | d) > kTailBits || codePoint < 0x10000 || codePoint > 0x10FFFF)
       return false;
@@ -274,10 +278,11 @@ template <> struct FourBytes<char8> {
   }
 };
 
-/// Converts letters of one kind from p on, and the single spaces between words of them.
+/// Converts letters of one kind from p on, and single units of ASCII between them, which mostly are spaces.
 template <class Letters, class CharOut, class CharIn>
 [[gnu::noinline]] Progress<CharOut, CharIn> ConvertRun(const CharIn* p, const CharIn* stop, CharOut* out) {
   for (;;) {
+    // A word may reach past stop, as any step, but not further than kLookahead - 1 units.
     for (; stop - p > kWord<CharIn> - kLookahead;
          p += Letters::kSome * Letters::kIn, out += Letters::kSome * Letters::kOut)
       if (!Letters::ConvertSome(p, out))
@@ -332,7 +337,7 @@ template <class CharOut, class CharIn>
   return {p, out};
 }
 
-/// The code point at p, which goes behind it, or what Boost has for malformed and for cut off ones.
+/// The code point at p, which is moved past it, or what Boost has for malformed and for cut off ones.
 template <class CharIn> utf::code_point Decode(const CharIn*& p, const CharIn* end) {
   // As unsigned units: with char the traits convert negative values without saying so.
   using Unsigned = std::make_unsigned_t<CharIn>;
@@ -352,7 +357,7 @@ bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen)
   const CharIn* const end = src + srcLen;
   bool isWellFormed = true;
   for (const CharIn* p = src; p != end && isWellFormed;) {
-    // A step may end behind chunkEnd, and a store be wider than what counts of it.
+    // A step may end past chunkEnd, and a store be wider than what counts of it.
     CharOut chunk[kExpansion<CharOut> * (kChunk + kLookahead)];
     CharOut* out = chunk;
     const CharIn* const chunkEnd = end - p < kChunk ? end : p + kChunk;
