@@ -54,8 +54,8 @@ template <class CharOut, class CharIn> struct Progress {
 // Below, a block or word that has something other than ASCII in it is written whole, but out goes behind its
 // ASCII only.
 
-/// Converts ASCII from p on, up to something else or until less than a block is left. It isn't inlined: then
-/// one compiler no longer sees that out and p are apart, and takes the blocks apart into single units.
+/// Converts ASCII from p on, up to something else or until less than a block is left. It isn't inlined:
+/// where it was, one compiler didn't see that out and p are apart, and took the blocks apart into units.
 template <class CharOut, class CharIn>
 [[gnu::noinline]] Progress<CharOut, CharIn> ConvertBlocks(const CharIn* __restrict p, const CharIn* stop,
                                                           CharOut* __restrict out) {
