@@ -103,7 +103,6 @@ public:
     case 32: v.append(v.c_str() + ri), becomes(size, 0, zeroTerminated); break;
     case 33: v.assign(v.c_str() + ri), becomes(0, size, zeroTerminated); break;
     case 34: v.insert(i, v.c_str() + ri), becomes(i, 0, zeroTerminated); break;
-
     case 35: v.replace(i, n, v.c_str() + ri), becomes(i, n, zeroTerminated); break;
     case 36: {
       const ssize_t k = std::min(n, rn);
