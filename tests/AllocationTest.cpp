@@ -28,6 +28,8 @@ extern "C" void* WRAPPED_REALLOC(void* p, std::size_t n) noexcept {
 
 namespace {
 
+const volatile ssize_t kMax = std::numeric_limits<ssize_t>::max(); // unknown to the compiler
+
 template <class T> class Allocation : public testing::Test {};
 TYPED_TEST_SUITE(Allocation, CodeUnits);
 
@@ -94,7 +96,6 @@ TYPED_TEST(Allocation, NoneWhereThereIsRoomAndNothingAliases) {
 TYPED_TEST(Allocation, AFailureChangesNothing) {
   using S = basic_xstring<TypeParam>;
   const S r = Of<TypeParam>("0123456789");
-  static const volatile ssize_t kMax = std::numeric_limits<ssize_t>::max(); // unknown to the compiler
   const std::vector<std::function<void(S&)>> edits = {
       [](S& s) { s.reserve(100); }, [](S& s) { s.resize(100, 'x'); }, [](S& s) { s.c_str(); },
       [](S& s) { s.push_back('x'); }, [](S& s) { s.insert(1, 5, 'x'); }, [&](S& s) { s = r; },
@@ -163,6 +164,8 @@ TYPED_TEST(Allocation, AFailedConversionThrowsAndKeepsTheBeginning) {
   EXPECT_THROW(mirel::Utf16FromAscii(wide, "abcdef", 6), std::bad_alloc);
   allocation::failAfter = -1;
   EXPECT_EQ(Std(wide), (std::basic_string<char16>(3, 'x')));
+  EXPECT_THROW(mirel::Utf16FromAscii(wide, "a", kMax), std::bad_alloc);
+  EXPECT_THROW(mirel::Utf16FromUtf8(wide, "a", kMax), std::bad_alloc);
 }
 
 } // namespace

@@ -4,7 +4,10 @@
 #pragma once
 
 #include <string_view>
+#include <type_traits>
+#include <vector>
 
+#include "../utils/src/KernelTable.h"
 #include "Support.h"
 
 namespace oracle {
@@ -81,16 +84,40 @@ inline bool Convert(Text<char8>& out, View<char16> source) {
   return true;
 }
 
-/// Converts source, from a destination that held text, and expects what the oracle says.
+/// Calls f with each way to convert on this processor: a function like UtfToUtf(), and its name.
+template <class CharOut, class CharIn, class F> void ForEachWay(const F& f) {
+#ifdef MIREL_SHARED // the others are hidden in the library
+  f(mirel::UtfToUtf<CharOut, CharIn>, "as chosen");
+#else
+  const mirel::detail::Kernels* kernels = nullptr;
+  int k = 0;
+  do {
+    kernels = mirel::detail::KernelsAt(k++);
+    f([=](auto&... arguments) { return mirel::detail::UtfToUtf(kernels, arguments...); },
+      kernels != nullptr ? kernels->name : "scalar");
+  } while (kernels != nullptr);
+#endif
+}
+
+/// Converts source in every way, from a destination that held text, and expects what the oracle says.
 template <class CharOut, class CharIn> void Check(View<CharIn> source) {
   static thread_local Text<CharOut> expected;
-  basic_xstring<CharOut> dst(3, 'x'); // without room, so that it grows meanwhile
   const bool isWellFormed = Convert(expected, source);
-  const bool ok = mirel::UtfToUtf(dst, source.data(), static_cast<ssize_t>(source.size()));
-  const View<CharOut> units(dst.data(), static_cast<std::size_t>(dst.size()));
-  if (ok != isWellFormed || units != expected) // a macro for each would take too long for billions of them
-    FAIL() << testing::PrintToString(source) << (ok ? " is " : " is not ")
-           << "converted: " << testing::PrintToString(units);
+  ForEachWay<CharOut, CharIn>([&](const auto& convert, const char* name) {
+    basic_xstring<CharOut> dst(3, 'x'); // without room, so that it grows meanwhile
+    const CharIn* const src = source.data();
+    const ssize_t srcLen = static_cast<ssize_t>(source.size());
+    const bool ok = convert(dst, src, srcLen);
+    const View<CharOut> units(dst.data(), static_cast<std::size_t>(dst.size()));
+    if (ok != isWellFormed || units != expected) // a macro for each would take too long for billions of them
+      FAIL() << name << ": " << testing::PrintToString(source) << (ok ? " is " : " is not ")
+             << "converted: " << testing::PrintToString(units);
+  });
+}
+/// Checks source where reading past either end of it is a fault that the sanitizers see.
+template <class CharIn> void CheckExactly(View<CharIn> source) {
+  const std::vector<CharIn> exact(source.begin(), source.end());
+  Check<std::conditional_t<sizeof(CharIn) == 1, char16, char8>>(View<CharIn>(exact.data(), exact.size()));
 }
 inline void CheckUtf8(View<char8> source) { Check<char16>(source); }
 inline void CheckUtf16(View<char16> source) { Check<char8>(source); }

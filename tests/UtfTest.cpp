@@ -1,7 +1,9 @@
-// The conversions beside their oracle, on all short inputs and on those that change between the ways in which
-// plain text, text near the end and everything else are converted.
+// The conversions beside their oracle: all short inputs, and those in which kinds of sequences, ends of
+// blocks and malformed sequences meet, by every kernel that the processor has and by the scalar path.
 #include "Oracle.h"
 
+#include <algorithm>
+#include <random>
 #include <vector>
 
 namespace {
@@ -54,29 +56,27 @@ TEST(Utf, SurrogatesMustPair) {
         ASSERT_NO_FATAL_FAILURE(CheckAmongLetters(Text<char16>{a, b, c}));
 }
 
-TEST(Utf, OneThatIsDifferentInARun) {
-  const char8* const bytes[] = {
-      "a", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xDF\xBF", "\xEF\xBC\x8C",
-      // overlong, surrogates, cut off or wrong in one byte
-      "\xC1\xA9", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xC3", "\xE1", "\xE1\x82", "\xFF", "\xC3 ", "\x82\xAC",
-      "\xC3\xA9\xA9", "\xE1 \xAC", "\xE1\x82 ", "\xF0\xA0\x80\x80"};
-  const Text<char16> units[] = {{'a'},    {0xE9},   {0x20AC},         {0x7F},   {0x80},  {0x7FF},
-                                {0x0800}, {0xFF0C}, {0xD83D, 0xDE00}, {0xD83D}, {0xDE00}};
-  const auto run = [](const auto& one, std::size_t n) {
-    auto text = one;
-    for (text.clear(); n > 0; --n)
-      text += one;
-    return text;
-  };
-  std::vector<std::size_t> lengths{1020, 1023, 1024, 5000};
-  for (std::size_t n = 0; n < 72; ++n)
-    lengths.push_back(n);
-  for (const std::size_t n : lengths)
-    for (int filler = 0; filler < 3; ++filler) {
+/// One sequence between n of another kind on both sides: kinds of blocks, places in them, and blocks' ends.
+TEST(Utf, OneThatIsDifferent) {
+  const char8* const bytes[] = {"a", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xDF\xBF",
+                                "\xEF\xBC\x8C", "\xED\x9F\xBF", "\xF4\x8F\xBF\xBF",
+                                // overlong, surrogates, beyond U+10FFFF, cut off or wrong in one byte
+                                "\xC1\xA9", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xF0\x8F\xBF\xBF",
+                                "\xF4\x90\x80\x80", "\xF5\x80\x80\x80", "\xC3", "\xE1", "\xE1\x82",
+                                "\xF0\x9F\x98", "\xFF", "\xC3 ", "\x82\xAC", "\xC3\xA9\xA9", "\xE1 \xAC",
+                                "\xE1\x82 ", "\xE2\xC0\xAC", "\xF0\xA0\x80 "};
+  const Text<char16> units[] = {{'a'},   {0xE9},   {0x20AC}, {0xD83D, 0xDE00}, {0x7F},   {0x80},
+                                {0x7FF}, {0x0800}, {0xFF0C}, {0xDBFF, 0xDFFF}, {0xD83D}, {0xDE00}};
+  for (std::size_t n = 0; n < 135; ++n)
+    for (int filler = 0; filler < 4; ++filler) {
+      Text<char8> text8;
+      Text<char16> text16;
+      for (std::size_t k = 0; k < n; ++k)
+        text8 += bytes[filler], text16 += units[filler];
       for (const char8* one : bytes)
-        CheckUtf8(run(Text<char8>(bytes[filler]), n) + one + run(Text<char8>(bytes[filler]), n));
+        ASSERT_NO_FATAL_FAILURE(CheckExactly<char8>(text8 + one + text8));
       for (const Text<char16>& one : units)
-        CheckUtf16(run(units[filler], n) + one + run(units[filler], n));
+        ASSERT_NO_FATAL_FAILURE(CheckExactly<char16>(text16 + one + text16));
     }
 }
 
@@ -84,12 +84,129 @@ TEST(Utf, CutOffAtEveryPlace) {
   Text<char8> text;
   Text<char16> units;
   for (int i = 0; i < 3; ++i)
-    text += "a\u00E9\u20AC\U0001F600\U0001F600\u20AC\u20AC\u00E9\u00E9\u00E9\u00E9\u00E9\u20AC";
+    text += "a\u00E9\u20AC\U0001F600\U0001F600\u20AC\u20AC\u00E9\u00E9\u00E9\u00E9\u00E9\u20ACabc";
   ASSERT_TRUE(Convert(units, text));
-  for (std::size_t size = 0; size <= text.size(); ++size) // what is behind the end would be well-formed
-    CheckUtf8(View<char8>(text).substr(0, size));
-  for (std::size_t size = 0; size <= units.size(); ++size)
-    CheckUtf16(View<char16>(units).substr(0, size));
+  for (std::size_t from = 0; from <= text.size(); ++from) // what is outside would be well-formed
+    for (std::size_t size = 0; size <= text.size() - from; ++size)
+      ASSERT_NO_FATAL_FAILURE(CheckExactly(View<char8>(text).substr(from, size)));
+  for (std::size_t from = 0; from <= units.size(); ++from)
+    for (std::size_t size = 0; size <= units.size() - from; ++size)
+      ASSERT_NO_FATAL_FAILURE(CheckExactly(View<char16>(units).substr(from, size)));
+}
+
+TEST(Utf, RandomMixtures) {
+  std::mt19937 random(5);
+  for (int round = 0; round < 4000; ++round) {
+    Text<char8> text;
+    Text<char16> units;
+    const std::size_t size = random() % 400;
+    const auto kinds = 1 + random() % 15; // which lengths of sequences there are
+    while (text.size() < size) {
+      static constexpr char32_t kLimits[] = {0, 0x80, 0x800, 0x10000, 0x110000};
+      const auto kind = random() % 4;
+      const char32_t c =
+          kLimits[kind] + static_cast<char32_t>(random()) % (kLimits[kind + 1] - kLimits[kind]);
+      if ((kinds >> kind & 1) != 0 && !IsLead(c) && !IsTrail(c))
+        Put(text, c), Put(units, c);
+    }
+    ASSERT_NO_FATAL_FAILURE(CheckExactly<char8>(text));
+    ASSERT_NO_FATAL_FAILURE(CheckExactly<char16>(units));
+    if (size != 0) {
+      text[random() % text.size()] = static_cast<char8>(random());
+      units[random() % units.size()] = static_cast<char16>(0xD800 + random() % 0x800);
+      ASSERT_NO_FATAL_FAILURE(CheckExactly<char8>(text));
+      ASSERT_NO_FATAL_FAILURE(CheckExactly<char16>(units));
+    }
+  }
+}
+
+#ifndef MIREL_SHARED
+/// Converts source by every kernel into every room: nothing is written past its end, and what is written
+/// is the beginning of the result.
+template <class CharOut, class CharIn, class F> void CheckEveryRoom(View<CharIn> source, const F& convert) {
+  Text<CharOut> expected;
+  ASSERT_TRUE(Convert(expected, source));
+  const CharIn* const end = source.data() + source.size();
+  for (int k = 0; const mirel::detail::Kernels* const kernels = mirel::detail::KernelsAt(k); ++k)
+    for (std::size_t room = 0; room < expected.size() + 3; ++room) {
+      std::vector<CharOut> out(room);
+      const auto at = convert(*kernels, source.data(), end, out.data(), out.data() + room);
+      const View<CharOut> written(out.data(), static_cast<std::size_t>(at.out - out.data()));
+      ASSERT_EQ(written, View<CharOut>(expected).substr(0, written.size()))
+          << kernels->name << ", room for " << room;
+      ASSERT_EQ(at.stop == mirel::detail::Stop::kEnd, room >= expected.size())
+          << kernels->name << ", room for " << room;
+      ASSERT_EQ(at.p == end, at.stop == mirel::detail::Stop::kEnd);
+    }
+}
+
+TEST(Utf, StaysWithinItsRoom) {
+  const char8* const sequences[] = {"a", "\u00E9", "\u20AC", "\U0001F600", "a\u20AC", "\u00E9\U0001F600b"};
+  for (const char8* const sequence : sequences)
+    for (int n = 0; n < 70; ++n) {
+      Text<char8> bytes;
+      for (int k = 0; k < n; ++k)
+        bytes += sequence;
+      Text<char16> units;
+      ASSERT_TRUE(Convert(units, bytes));
+      const auto to16 = [](const auto& kernels, auto... arguments) {
+        return kernels.utf16FromUtf8(arguments...);
+      };
+      const auto to8 = [](const auto& kernels, auto... arguments) {
+        return kernels.utf8FromUtf16(arguments...);
+      };
+      ASSERT_NO_FATAL_FAILURE(CheckEveryRoom<char16>(View<char8>(bytes), to16));
+      ASSERT_NO_FATAL_FAILURE(CheckEveryRoom<char8>(View<char16>(units), to8));
+    }
+}
+#endif
+
+/// The destination keeps what it had, and of what a conversion obtains no more than the result and its
+/// terminator.
+TEST(Utf, CapacityIsGivenBack) {
+  Text<char8> bytes;
+  Text<char16> units;
+  for (int n = 0; n < 200; ++n)
+    bytes += n % 3 == 0 ? "a" : "\u20AC", units += n % 3 == 0 ? char16{'a'} : char16{0x20AC};
+  bytes += "\xFF", units += 0xD800;
+  const auto check = [](auto& dst, const auto& source, std::size_t n, bool isWellFormed) {
+    ForEachWay<std::decay_t<decltype(dst[0])>, std::decay_t<decltype(source[0])>>(
+        [&](const auto& convert, const char* name) {
+          for (const ssize_t before : {0, 1, 30, 400, 2000}) {
+            std::decay_t<decltype(dst)> fresh;
+            fresh.reserve(before);
+            dst.swap(fresh);
+            const auto* const src = source.data();
+            const ssize_t srcLen = static_cast<ssize_t>(n);
+            EXPECT_EQ(convert(dst, src, srcLen), isWellFormed) << name;
+            EXPECT_EQ(dst.capacity(), std::max(before, dst.size() + 1)) << name << " from " << before;
+            const auto* const data = dst.data();
+            EXPECT_EQ(dst.c_str(), data) << name << " from " << before;
+          }
+        });
+  };
+  mirel::string16 wide;
+  mirel::string8 narrow;
+  for (const std::size_t n : {1u, 5u, 20u, 97u, 300u}) // at boundaries of sequences
+    check(wide, bytes, n - n % 7 + 1, true);
+  check(wide, bytes, bytes.size(), false);
+  for (const std::size_t n : {1u, 5u, 20u, 97u, 200u})
+    check(narrow, units, n, true);
+  check(narrow, units, units.size(), false);
+  mirel::Utf16FromAscii(wide = {}, bytes.data(), 100);
+  EXPECT_EQ(wide.c_str(), wide.data());
+}
+
+TEST(Utf, AsciiOfEveryLength) {
+  for (std::size_t n = 0; n < 100; ++n)
+    for (std::size_t at = 0; at < n; ++at) {
+      std::vector<char8> text(n, 'a');
+      Text<char16> expected(n, 'a');
+      text[at] = static_cast<char8>(0x80 + at), expected[at] = '?';
+      mirel::string16 wide;
+      mirel::Utf16FromAscii(wide, text.data(), static_cast<ssize_t>(n));
+      ASSERT_EQ(Std(wide), expected);
+    }
 }
 
 TEST(Utf, EntryPoints) {

@@ -1,10 +1,14 @@
 #include "Support.h"
 
+#include <algorithm>
+#include <chrono>
 #include <list>
 #include <random>
 #include <vector>
 
 #include <utils/VectorOfByte.h>
+
+#include "../utils/src/KernelTable.h"
 
 using namespace mirel;
 
@@ -37,73 +41,261 @@ TYPED_TEST(RangeAlgorithms, FailedSearchesReturnTheEnd) {
   EXPECT_EQ(FindLastSubSequence(x1, x1 + 2, y1, y2), x1 + 2);
   EXPECT_EQ(FindLastSubSequence(x1, x2, y1, y1), x2);
   EXPECT_TRUE(FindLast(x1, x1 + 1, 'b') == x1 + 1 && FindFirstNotOf(y1, y2, y1, y2) == y2);
-  const std::list<TypeParam> list(x1, x2); // forward traversal is enough
-  EXPECT_EQ(std::distance(list.begin(), FindFirstSubSequence(list.begin(), list.end(), y1, y2)), 1);
 }
 
-/// Whether the order, and all searches for a pattern or set, or its first unit, come to what the plain
-/// templates come to.
-template <class T> bool Agree(const T* x1, const T* x2, const T* y1, const T* y2) {
+/// The templates, for iterators of other containers: those of a list, and random-access ones.
+template <class Container> void SearchAnyContainer() {
+  const Container text = {'a', 'b', 'c', 'b', 'c'}, less = {'a', 'a'}, bc = {'b', 'c'}, cc = {'c', 'c'},
+                  empty;
+  const auto b = text.begin(), e = text.end();
+  const auto at = [&](auto found) { return std::distance(b, found); };
+  EXPECT_EQ(at(Find(b, e, 'c')), 2);
+  EXPECT_EQ(at(Find(b, e, 'd')), 5);
+  EXPECT_EQ(at(FindLast(b, e, 'b')), 3);
+  EXPECT_EQ(at(FindLast(b, e, 'd')), 5);
+  const std::pair<const Container*, std::pair<int, int>> needles[] = {
+      {&bc, {1, 3}}, {&cc, {5, 5}}, {&empty, {0, 5}}};
+  for (const auto& [needle, where] : needles) {
+    EXPECT_EQ(at(FindFirstSubSequence(b, e, needle->begin(), needle->end())), where.first);
+    EXPECT_EQ(at(FindLastSubSequence(b, e, needle->begin(), needle->end())), where.second);
+  }
+  EXPECT_EQ(FindLastSubSequence(b, b, empty.begin(), empty.end()), b);
+  EXPECT_EQ(at(FindFirstOf(b, e, bc.begin(), bc.end())), 1);
+  EXPECT_EQ(at(FindFirstNotOf(b, e, less.begin(), less.end())), 1);
+  EXPECT_EQ(at(FindFirstNotOf(b, e, b, e)), 5);
+  EXPECT_EQ(at(FindLastOf(b, e, less.begin(), less.end())), 0);
+  EXPECT_EQ(at(FindLastOf(b, e, empty.begin(), empty.end())), 5);
+  EXPECT_EQ(at(FindLastNotOf(b, e, bc.begin(), bc.end())), 0);
+  EXPECT_EQ(at(FindLastNotOf(b, e, b, e)), 5);
+  EXPECT_EQ(LexicographicalCompareX(less.begin(), less.end(), b, e), -1);
+  EXPECT_EQ(LexicographicalCompareX(b, e, less.begin(), less.end()), 1);
+  EXPECT_EQ(LexicographicalCompareX(b, e, b, e), 0);
+  EXPECT_EQ(LexicographicalCompareX(b, std::next(b), b, e), -1);
+  EXPECT_EQ(LexicographicalCompareX(b, e, b, std::next(b)), 1);
+}
+TYPED_TEST(RangeAlgorithms, TakeAnyIterators) {
+  SearchAnyContainer<std::list<TypeParam>>();
+  SearchAnyContainer<std::vector<TypeParam>>();
+}
+
+/// A way to search, and its name.
+template <class T> struct Way {
+  std::string name;
+  mirel::detail::SearchKernels<T> searches;
+};
+
+/// Those that a program gets, the scalar path, and each of the processor's kernels.
+template <class T> std::vector<Way<T>> Ways() {
   using P = const T*;
-  const auto sign = [](int x) { return (x > 0) - (x < 0); };
-  return sign(LexicographicalCompareX(x1, x2, y1, y2)) == LexicographicalCompareX<P, P>(x1, x2, y1, y2) &&
-         sign(LexicographicalCompareX(y1, y2, x1, x2)) == LexicographicalCompareX<P, P>(y1, y2, x1, x2) &&
-         Find(x1, x2, *y1) == Find<P, T>(x1, x2, *y1) &&
-         FindLast(x1, x2, *y1) == FindLast<P, T>(x1, x2, *y1) &&
-         FindFirstSubSequence(x1, x2, y1, y2) == FindFirstSubSequence<P, P>(x1, x2, y1, y2) &&
-         FindLastSubSequence(x1, x2, y1, y2) == FindLastSubSequence<P, P>(x1, x2, y1, y2) &&
-         FindFirstOf(x1, x2, y1, y2) == FindFirstOf<P, P>(x1, x2, y1, y2) &&
-         FindFirstNotOf(x1, x2, y1, y2) == FindFirstNotOf<P, P>(x1, x2, y1, y2) &&
-         FindLastOf(x1, x2, y1, y2) == FindLastOf<P, P>(x1, x2, y1, y2) &&
-         FindLastNotOf(x1, x2, y1, y2) == FindLastNotOf<P, P>(x1, x2, y1, y2);
+  using namespace mirel::detail;
+  std::vector<Way<T>> ways = {
+      {"as chosen",
+       {[](P x1, P x2, T v) { return Find(x1, x2, v); }, [](P x1, P x2, T v) { return FindLast(x1, x2, v); },
+        [](P x1, P x2, P y1, P y2) { return FindFirstSubSequence(x1, x2, y1, y2); },
+        [](P x1, P x2, P y1, P y2) { return FindLastSubSequence(x1, x2, y1, y2); },
+        [](P x1, P x2, P y1, P y2) { return FindFirstOf(x1, x2, y1, y2); },
+        [](P x1, P x2, P y1, P y2) { return FindFirstNotOf(x1, x2, y1, y2); },
+        [](P x1, P x2, P y1, P y2) { return FindLastOf(x1, x2, y1, y2); },
+        [](P x1, P x2, P y1, P y2) { return FindLastNotOf(x1, x2, y1, y2); },
+        BestSearches(P()).findDifference}}};
+#ifndef MIREL_SHARED // it hides the others
+  ways.push_back({"scalar", ScalarSearches<T>()});
+  for (int k = 0; const Kernels* const kernels = KernelsAt(k); ++k)
+    if constexpr (sizeof(T) == 1)
+      ways.push_back({kernels->name, kernels->search8});
+    else
+      ways.push_back({kernels->name, kernels->search16});
+#endif
+  return ways;
 }
 
-TYPED_TEST(RangeAlgorithms, AgreeWithThePlainTemplates) {
+TEST(RangeAlgorithmsTest, EachKernelIsTested) {
+  std::string names;
+  for (const auto& way : Ways<char8>())
+    names += " " + way.name;
+  RecordProperty("searches", names);
+  if (Ways<char8>().size() < 3)
+    GTEST_SKIP() << "no kernels by themselves, in this build or on this processor; searches:" << names;
+}
+
+TYPED_TEST(RangeAlgorithms, NothingIsInNothing) {
   using T = TypeParam;
+  const T text[] = {'a', 'b'}, *const x2 = text + 2, *const null = nullptr;
+  for (const auto& [name, s] : Ways<T>()) {
+    EXPECT_EQ(s.find(null, null, 'a'), null) << name;
+    EXPECT_EQ(s.findLast(null, null, 'a'), null) << name;
+    EXPECT_EQ(s.findFirstSubSequence(null, null, text, x2), null) << name;
+    EXPECT_EQ(s.findLastSubSequence(null, null, text, x2), null) << name;
+    EXPECT_EQ(s.findLastNotOf(null, null, text, x2), null) << name;
+    EXPECT_EQ(s.findFirstOf(text, x2, null, null), x2) << name;
+    EXPECT_EQ(s.findFirstNotOf(text, x2, null, null), text) << name;
+    EXPECT_EQ(s.findLastNotOf(text, x2, null, null), text + 1) << name;
+    EXPECT_EQ(s.findDifference(nullptr, nullptr, 0), 0) << name;
+  }
+}
+
+/// Expects of every way to search what the standard library says. Both vectors end where what may be read
+/// does.
+template <class T> void Check(const std::vector<T>& text, const std::vector<T>& what) {
+  static const std::vector<Way<T>> ways = Ways<T>();
+  const T *const x1 = text.data(), *const x2 = x1 + text.size(), *const y1 = what.data(),
+                 *const y2 = y1 + what.size();
+  const auto isIn = [=](T x) { return std::find(y1, y2, x) != y2; };
+  const auto last = [=](auto found) { return found.base() == x1 ? x2 : found.base() - 1; };
+  const std::reverse_iterator<const T*> r1(x2), r2(x1);
+  const T* const expected[] = {std::find(x1, x2, *y1),           last(std::find(r1, r2, *y1)),
+                               std::search(x1, x2, y1, y2),      std::find_end(x1, x2, y1, y2),
+                               std::find_if(x1, x2, isIn),       std::find_if_not(x1, x2, isIn),
+                               last(std::find_if(r1, r2, isIn)), last(std::find_if_not(r1, r2, isIn))};
+  for (const auto& [name, s] : ways) {
+    const T* const found[] = {s.find(x1, x2, *y1),
+                              s.findLast(x1, x2, *y1),
+                              s.findFirstSubSequence(x1, x2, y1, y2),
+                              s.findLastSubSequence(x1, x2, y1, y2),
+                              s.findFirstOf(x1, x2, y1, y2),
+                              s.findFirstNotOf(x1, x2, y1, y2),
+                              s.findLastOf(x1, x2, y1, y2),
+                              s.findLastNotOf(x1, x2, y1, y2)};
+    for (std::size_t k = 0; k < 8; ++k) // a macro for each would take most of the time
+      if (found[k] != expected[k])
+        FAIL() << name << ", search " << k << " of " << text.size() << " units: " << found[k] - x1 << ", not "
+               << expected[k] - x1 << "; " << testing::PrintToString(what);
+  }
+}
+
+TYPED_TEST(RangeAlgorithms, OneHitAtEveryPlace) {
+  using T = TypeParam;
+  using Units = std::vector<T>;
+  using Texts = std::vector<Units>;
   const T high = static_cast<T>('a' + (1u << (8 * sizeof(T) - 1))); // the highest bit is all that differs
-  std::mt19937 random(3);
-  for (std::size_t size = 0; size < 420; size += size < 150 ? 1 : 7) {
-    // A vector of exactly that size, and so its end is the end of what may be read.
+  Texts sets = {{'a', 'b'}, {'b', 'c', 'd', 'a', high}, Units(70, high), Units(70, 'a'), {}, {}, {}};
+  for (unsigned k = 0; k < 26; ++k) // of few rows of 16, and of many
+    sets[4].push_back(static_cast<T>('b' + k)), sets[5].push_back(static_cast<T>(0xA0 + 17 * k));
+  for (unsigned k = 0; k < 72; ++k) // of nine rows, the last of which shares its bit with the one of 'a'
+    sets[6].push_back(static_cast<T>(k % 9 < 8 ? 0x62 + k % 9 * 16 : 0xE1));
+  for (std::size_t size = 0; size < 420; size += size < 150 ? 1 : 29) {
     std::vector<T> text(size, 'a');
-    const std::vector<T> other = text;
-    const auto agree = [&](std::initializer_list<T> what) {
-      return Agree<T>(text.data(), text.data() + size, what.begin(), what.end());
-    };
-    for (std::size_t at = 0; at < size; ++at) { // one hit, or one unit that isn't a member, at every place
-      text[at] = high;
-      ASSERT_TRUE(agree({high}) && agree({high, 'a'}) && agree({'b', high}) && agree({'a', high, 'a'}))
-          << size << at;
-      ASSERT_TRUE(agree({'a', 'b'}) && agree({'b', 'c', 'd', 'a', 'e', 'f'}) && agree({'a', 'a', high}))
-          << size << at;
-      const T* const x = text.data();
-      ASSERT_EQ(LexicographicalCompareX(x, x + size, other.data(), other.data() + size) > 0, true)
-          << size << at;
-      ASSERT_LT(LexicographicalCompareX(x, x + at, other.data(), other.data() + size), 0) << size << at;
-      text[at] = 'a';
-    }
-    ASSERT_TRUE(agree({high}) && agree({high, 'b'}) && agree({'a', 'b', 'c', 'd', 'e'}) &&
-                agree({'a', 'a', 'b'}));
-    for (int round = 0; round < 20; ++round) {
-      for (T& unit : text)
-        unit = random() % 16 == 0 ? high : static_cast<T>('a' + random() % 3);
-      ASSERT_TRUE(agree({'a', 'b', 'c', 'a'}) && agree({high, 'b', 'c'}) && agree({'a', 'b', 'c'}) &&
-                  agree({'c', high}));
+    for (std::size_t at = 0; at <= size; ++at) { // in the last round there is none
+      if (at < size)
+        text[at] = high;
+      for (const auto& what : Texts{{high}, {high, 'a'}, {'b', high}, {'a', high, 'a'}, sets[at % 7]})
+        ASSERT_NO_FATAL_FAILURE(Check(text, what));
+      if (at < size)
+        text[at] = 'a';
     }
   }
 }
 
-TYPED_TEST(RangeAlgorithms, AgreeOnLongPatternsAndOnFirstUnitsThatAreRare) {
-  using T = TypeParam;
-  std::vector<T> text(4000, 'a');
-  const std::vector<T> pattern(40, 'a');
-  for (const std::size_t size : {20u, 39u, 40u, 41u, 200u})
-    ASSERT_TRUE(Agree<T>(text.data(), text.data() + size, pattern.data(), pattern.data() + 40)) << size;
-  for (std::size_t at = 5; at < text.size(); at += 190)
-    text[at] = 'b', text[at + 1] = at == 3805 ? 'c' : 'd';
-  for (const char* what : {"bc", "be", "ba", "bda"}) {
-    const auto y = Of<T>(what);
-    ASSERT_TRUE(Agree<T>(text.data(), text.data() + text.size(), y.begin(), y.end())) << what;
+TEST(RangeAlgorithmsTest, OneDifferenceAtEveryPlace) {
+  for (std::size_t size = 0; size < 420; size += size < 150 ? 1 : 29) {
+    const std::vector<char16> text(size, 'a');
+    auto other = text;
+    const char16 *const x = text.data(), *const y = other.data();
+    for (std::size_t at = 0; at < size; ++at) {
+      other[at] = 0x8061;
+      for (const auto& way : Ways<char16>())
+        ASSERT_EQ(way.searches.findDifference(x, y, ssize_t(size)), ssize_t(at)) << way.name << ' ' << size;
+      ASSERT_LT(LexicographicalCompareX(x, x + size, y, y + size), 0) << size << ' ' << at;
+      ASSERT_GT(LexicographicalCompareX(y, y + size, x, x + at), 0) << size << ' ' << at;
+      other[at] = 'a';
+    }
+    ASSERT_EQ(LexicographicalCompareX(x, x + size, y, y + size), 0) << size;
   }
+}
+
+/// A unit that the tables of a set can't tell from a member, and a member so near an end that smaller vectors
+/// are left: it was missed once.
+TEST(RangeAlgorithmsTest, MembersBehindAFalseHit) {
+  std::vector<char16> set; // of nine rows, so that the first and the last share a bit
+  for (int row = 0; row < 9; ++row)
+    set.push_back(static_cast<char16>(0x1009 + row * 0x1110));
+  for (std::size_t between = 0; between < 20; ++between) {
+    std::vector<char16> text(2000, 'a');
+    text.push_back(0x1089);
+    text.insert(text.end(), between, 'a');
+    text.push_back(set[3]);
+    ASSERT_NO_FATAL_FAILURE(Check(text, set));
+    std::reverse(text.begin(), text.end());
+    ASSERT_NO_FATAL_FAILURE(Check(text, set));
+  }
+}
+
+TYPED_TEST(RangeAlgorithms, RandomTextsNeedlesAndSets) {
+  using T = TypeParam;
+  std::mt19937 random(3);
+  const auto units = [&](std::size_t size, unsigned kinds, unsigned distance) {
+    std::vector<T> result(size);
+    for (T& unit : result)
+      unit = static_cast<T>(0x50 + random() % kinds * distance);
+    return result;
+  };
+  for (int round = 0; round < 4000; ++round) {
+    const auto kinds = unsigned(1 + random() % 40), distance = unsigned(1 + random() % (1u << random() % 14));
+    const auto text = units(random() % 700, kinds, distance);
+    ASSERT_NO_FATAL_FAILURE(Check(text, units(1 + random() % 6, kinds, distance)));
+    ASSERT_NO_FATAL_FAILURE(Check(text, units(1 + random() % 100, 60, distance))) << "a large set";
+  }
+}
+
+/// Needles that are found late or not at all, and are much like the text before: of the Fibonacci word, of
+/// a unit repeated with another in it, and of a period that fails behind its 40th unit.
+TYPED_TEST(RangeAlgorithms, PeriodicNeedles) {
+  using T = TypeParam;
+  std::string fibonacci = "ab", before = "a", period;
+  while (fibonacci.size() < 3000)
+    before.swap(fibonacci), fibonacci = before + fibonacci;
+  while (period.size() < 3000)
+    period += "aabab";
+  const auto check = [](const std::string& text, std::string needle) {
+    for (int direction = 0; direction < 2; ++direction, std::reverse(needle.begin(), needle.end()))
+      Check(std::vector<T>(text.begin(), text.end()), std::vector<T>(needle.begin(), needle.end()));
+  };
+  for (const std::size_t n : {1u, 2u, 5u, 40u, 63u, 64u, 200u, 700u})
+    for (const std::size_t m : {0u, 1u, 3u, 21u, 55u, 300u}) {
+      const std::string a(n, 'a'), b = a + 'b' + std::string(m, 'a');
+      check(std::string(2000, 'a'), b), check(std::string(1500, 'a') + 'b' + std::string(m + 9, 'a'), b);
+      check(fibonacci, fibonacci.substr(m, n)), check(fibonacci, fibonacci.substr(m, n) + "bb");
+      check(period + fibonacci, period.substr(m, n + 45) + 'b'),
+          check(period + 'b', period.substr(0, m + 45) + 'b');
+    }
+}
+
+TEST(RangeAlgorithmsTest, TwoWayOnAllShortNeedles) {
+  std::mt19937 random(5);
+  for (unsigned bits = 2; bits < 1u << 9; ++bits) { // the highest one ends the needle
+    std::vector<short> needle;
+    for (unsigned b = bits; b > 1; b /= 2)
+      needle.push_back(b % 2 != 0);
+    for (int round = 0; round < 40; ++round) {
+      std::vector<int> text(random() % 30);
+      for (int& unit : text)
+        unit = random() % 8 == 0 ? 2 : int(random() % 2);
+      const auto expected = std::search(text.begin(), text.end(), needle.begin(), needle.end());
+      const mirel::detail::TwoWay<const short*> twoWay(needle.data(), needle.data() + needle.size());
+      ASSERT_EQ(twoWay.Find(text.begin(), text.end()), expected) << bits;
+      ASSERT_EQ(FindLastSubSequence(text.begin(), text.end(), needle.begin(), needle.end()),
+                std::find_end(text.begin(), text.end(), needle.begin(), needle.end()));
+    }
+  }
+}
+
+TYPED_TEST(RangeAlgorithms, NoNeedleIsSlow) {
+  using T = TypeParam;
+  const std::vector<T> text(1 << 20, 'a');
+  std::vector<T> first(1 << 18, 'a'), last = first;
+  first.end()[-2] = last[1] = 'b';
+  const T *const x1 = text.data(), *const x2 = x1 + text.size();
+  const auto start = std::chrono::steady_clock::now();
+  for (const auto& way : Ways<T>()) {
+    ASSERT_EQ(way.searches.findFirstSubSequence(x1, x2, first.data(), first.data() + first.size()), x2);
+    ASSERT_EQ(way.searches.findLastSubSequence(x1, x2, last.data(), last.data() + last.size()), x2);
+  }
+  const std::vector<int> integers(text.begin(), text.end());
+  EXPECT_EQ(FindFirstSubSequence(integers.begin(), integers.end(), first.begin(), first.end()),
+            integers.end());
+  EXPECT_EQ(FindLastSubSequence(integers.begin(), integers.end(), last.begin(), last.end()), integers.end());
+  const std::chrono::duration<double> time = std::chrono::steady_clock::now() - start;
+  EXPECT_LT(time.count(), 8) << "seconds; with the product of the lengths one search takes longer";
 }
 
 TEST(VectorOfByteTest, EditsAtAnyPlace) {

@@ -96,18 +96,28 @@ def layout(row):
 
 
 def emulated(processor):
-    """The suite for another processor, under emulation. Boost's headers are shown to the cross compiler without
-    the host's."""
+    """The suite for another processor, under emulation. The headers that the library is built with are shown to the
+    cross compiler without the host's."""
     def work(row):
-        boost = OUT / f"boost-{processor}"
-        boost.mkdir(exist_ok=True)
-        if not (boost / "boost").exists():
-            (boost / "boost").symlink_to("/usr/include/boost")
+        headers = OUT / f"headers-{processor}"
+        headers.mkdir(exist_ok=True)
+        for name in ("boost", "hwy"):
+            if not (headers / name).exists():
+                (headers / name).symlink_to(f"/usr/include/{name}")
         suite(cxx=f"{processor}-linux-gnu-g++", flags="-O2", options=(
-            "-DCMAKE_SYSTEM_NAME=Linux", f"-DCMAKE_SYSTEM_PROCESSOR={processor}", f"-DBoost_INCLUDE_DIRS={boost}",
+            "-DCMAKE_SYSTEM_NAME=Linux", f"-DCMAKE_SYSTEM_PROCESSOR={processor}", f"-DBoost_INCLUDE_DIRS={headers}",
+            f"-DMIREL_HIGHWAY_INCLUDE_DIR={headers}",
             f"-DCMAKE_CROSSCOMPILING_EMULATOR=qemu-{processor};-L;/usr/{processor}-linux-gnu",
             f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", NO_FMT))(row)
     return work
+
+
+def older_processors(row):
+    """What x86-64 processors choose, from one with every instruction set of the kernels to one without any."""
+    row.build("mirel_tests", flags="-O2")
+    for processor, kernels in ("Haswell", "AVX2"), ("Nehalem", "SSE4"), ("core2duo", "none"):
+        row.run("qemu-x86_64", "-cpu", processor, row.dir / "tests" / "mirel_tests", "--gtest_brief=1",
+                "--gtest_filter=-Utf.Every*", MIREL_EXPECTED_KERNELS=kernels)
 
 
 def coverage(row):
@@ -161,12 +171,14 @@ def libcxx(std, flags, *options):
 ROWS = [
     Row("AArch64 under emulation", emulated("aarch64")),
     Row("s390x under emulation, big-endian", emulated("s390x")),
+    Row("older x86-64 processors under emulation", older_processors),
     Row("valgrind", valgrind),
     Row("headers alone", headers),
     Row("clang-format, clang-tidy", layout),
     Row("g++ C++17 -O2", suite(flags="-O2")),
     Row("g++ C++20 -O3 NDEBUG unsigned char", suite(std=20, flags="-O3 -DNDEBUG -funsigned-char")),
     Row("g++ C++23 -O0 signed char", suite(std=23, flags="-O0 -fsigned-char")),
+    Row("g++ C++17 -O2 without kernels", suite(flags="-O2", options=("-DMIREL_KERNELS=OFF",))),
     Row("g++ C++17 shared hardened", suite(flags=HARDENING, options=(
         SHARED, "-DCMAKE_SHARED_LINKER_FLAGS=-Wl,-z,relro,-z,now", "-DCMAKE_EXE_LINKER_FLAGS=-Wl,-z,relro,-z,now -pie"))),
     Row("g++ C++20 -O2 NDEBUG in the program only", suite(std=20, flags="-O2", program="-DNDEBUG")),

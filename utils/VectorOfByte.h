@@ -13,15 +13,14 @@
 #include <utility>
 
 #include <utils/Precondition.h>
+#include <utils/TwoWay.h>
 #include <utils/xchar.h>
 
 namespace mirel {
 
 namespace detail {
 
-/// The value by which a code unit compares. Plain char may be signed, the order of text may not.
-inline unsigned char UnitValue(char x) { return static_cast<unsigned char>(x); }
-template <class T> const T& UnitValue(const T& x) { return x; }
+struct Storage; // what the conversions know of a vector's storage
 
 /// Lets an overload take part only for integers. An integer argument of any type matches such an overload
 /// exactly, which is how a literal 0 stays an index or a count where a pointer could be meant too.
@@ -71,7 +70,7 @@ inline int LexicographicalCompareX(const char* x1, const char* x2, const char* y
   return LexicographicalCompareX(bytes(x1), bytes(x2), bytes(y1), bytes(y2));
 }
 
-/// Whether the range [x1, x2) and the run of the same length at y1 hold the same elements.
+/// Whether the range [x1, x2) and the one of the same length at y1 hold the same elements.
 inline bool IsEqual(const char8* x1, const char8* x2, const char8* y1) {
   return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1)) == 0;
 }
@@ -90,10 +89,11 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 
 /// @}
 /// @name Searching ranges
-/// Each search returns a position in the searched range, or that range's end when nothing is found. None
-/// prepares anything: at worst the cost is the length searched for one element, and the product of the two
-/// lengths for a range. Pointers to code units have overloads of the same names and results, found several
-/// times as fast in longer ranges.
+/// Each search returns a position in the haystack, or its end when nothing is found. Nothing is allocated. At
+/// worst the cost is linear in the haystack for one element, and the product of both lengths for a needle or
+/// a set. It is linear in the sum of the lengths for needles of integers that both sides reach by
+/// random-access iterators, and for all that pointers to code units look for: these have overloads of the
+/// same names and results, which go by wide instructions where the processor has them.
 /// @{
 
 /// The first element equal to v, or i2.
@@ -103,11 +103,15 @@ template <class It, class T> It Find(It i1, It i2, const T& v) {
   return i1;
 }
 
-/// The start of the first occurrence of [y1, y2) in [x1, x2), or x2. An empty pattern is found at x1.
+/// The start of the first occurrence of [y1, y2) in [x1, x2), or x2. An empty needle is found at x1.
 template <class It1, class It2> It1 FindFirstSubSequence(It1 x1, It1 x2, It2 y1, It2 y2) {
-  while (x1 != x2 && !IsPrefix(x1, x2, y1, y2))
-    ++x1;
-  return x1;
+  if constexpr (detail::kAreIntegers<It1, It2>) {
+    return detail::FindNeedle(x1, x2, y1, y2);
+  } else {
+    while (x1 != x2 && !IsPrefix(x1, x2, y1, y2))
+      ++x1;
+    return x1;
+  }
 }
 
 /// The first element of [x1, x2) that occurs in [y1, y2), or x2.
@@ -132,13 +136,15 @@ template <class It, class T> It FindLast(It i1, It i2, const T& v) {
   return i2;
 }
 
-/// The start of the last occurrence of [y1, y2) in [x1, x2), or x2. An empty pattern is found at x2.
+/// The start of the last occurrence of [y1, y2) in [x1, x2), or x2. An empty needle is found at x2.
 template <class It1, class It2> It1 FindLastSubSequence(It1 x1, It1 x2, It2 y1, It2 y2) {
-  for (It1 p = x2;; --p) {
-    if (IsPrefix(p, x2, y1, y2))
-      return p;
-    if (p == x1)
-      return x2;
+  if constexpr (detail::kAreIntegers<It1, It2>) {
+    return detail::FindLastNeedle(x1, x2, y1, y2);
+  } else {
+    It1 p = x2;
+    while (p != x1 && !IsPrefix(p, x2, y1, y2))
+      --p;
+    return IsPrefix(p, x2, y1, y2) ? p : x2;
   }
 }
 
@@ -162,22 +168,26 @@ template <class It1, class It2> It1 FindLastNotOf(It1 x1, It1 x2, It2 y1, It2 y2
 
 namespace detail {
 
-/// The searches above for code units, by blocks of them.
-template <class T> struct MIREL_API ByBlock {
-  static const T* Find(const T* i1, const T* i2, T v);
-  static const T* FindLast(const T* i1, const T* i2, T v);
-  static const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2);
-  static const T* FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2);
-  static const T* FindFirstOf(const T* x1, const T* x2, const T* y1, const T* y2);
-  static const T* FindFirstNotOf(const T* x1, const T* x2, const T* y1, const T* y2);
-  static const T* FindLastOf(const T* x1, const T* x2, const T* y1, const T* y2);
-  static const T* FindLastNotOf(const T* x1, const T* x2, const T* y1, const T* y2);
+/// The searches above for pointers to code units, as functions for one instruction set. They return i2 or x2
+/// when nothing is found. Needles aren't empty.
+template <class T> struct SearchKernels {
+  using P = const T*;
+  P (*find)(P i1, P i2, T v);
+  P (*findLast)(P i1, P i2, T v);
+  P (*findFirstSubSequence)(P x1, P x2, P y1, P y2);
+  P (*findLastSubSequence)(P x1, P x2, P y1, P y2);
+  P (*findFirstOf)(P x1, P x2, P y1, P y2);
+  P (*findFirstNotOf)(P x1, P x2, P y1, P y2);
+  P (*findLastOf)(P x1, P x2, P y1, P y2);
+  P (*findLastNotOf)(P x1, P x2, P y1, P y2);
+  /// The number of equal units before the first difference of the n units at x and at y, n if there is none.
+  ssize_t (*findDifference)(P x, P y, ssize_t n);
 };
-extern template struct ByBlock<char8>;
-extern template struct ByBlock<char16>;
 
-/// The order above, by blocks; neither range is empty.
-MIREL_API int CompareByBlock(const char16* x1, const char16* x2, const char16* y1, const char16* y2);
+/// The best ones for such units that this processor has, or the scalar path. The result is always the same,
+/// so that a loop needs to ask only once.
+[[gnu::const]] MIREL_API const SearchKernels<char8>& BestSearches(const char8*);
+[[gnu::const]] MIREL_API const SearchKernels<char16>& BestSearches(const char16*);
 
 /// In so short a range the loops in this file are done before a call to the others has begun.
 template <class T> bool IsShort(const T* x1, const T* x2) { return x2 - x1 <= 16; }
@@ -212,19 +222,28 @@ using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T
 /// @cond
 
 template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T* i2, const T& v) {
-  const bool isInline = sizeof(T) > 1 && detail::IsShort(i1, i2); // for bytes there is the C library
-  return isInline ? detail::FindByFour(i1, i2, v) : detail::ByBlock<T>::Find(i1, i2, v);
+  if constexpr (sizeof(T) == 1) {
+    // The C library is as fast. Even for no bytes memchr may not be given null pointers.
+    const void* const p = i1 == i2 ? nullptr : std::memchr(i1, v, static_cast<std::size_t>(i2 - i1));
+    return p != nullptr ? static_cast<const T*>(p) : i2;
+  } else {
+    return detail::IsShort(i1, i2) ? detail::FindByFour(i1, i2, v) : detail::BestSearches(i1).find(i1, i2, v);
+  }
 }
 template <class T, detail::IfCodeUnit<T> = 0> const T* FindLast(const T* i1, const T* i2, const T& v) {
   return detail::IsShort(i1, i2) ? detail::FindLastByFour(i1, i2, v)
-                                 : detail::ByBlock<T>::FindLast(i1, i2, v);
+                                 : detail::BestSearches(i1).findLast(i1, i2, v);
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
   if (y1 == y2)
     return x1;
-  if (!detail::IsShort(x1, x2))
-    return detail::ByBlock<T>::FindFirstSubSequence(x1, x2, y1, y2);
+  if (!detail::IsShort(x1, x2)) {
+    const ssize_t length = y2 - y1;
+    if (sizeof(T) == 1 && x2 - x1 >= length) // where the first byte is rare, memchr is all that it takes
+      x1 = Find(x1, x2 - (length - 1), *y1);
+    return x2 - x1 < length ? x2 : detail::BestSearches(x1).findFirstSubSequence(x1, x2, y1, y2);
+  }
   for (const T* p = x1; x2 - p >= y2 - y1; ++p)
     if (*p == *y1 && IsEqual(y1, y2, p))
       return p;
@@ -235,7 +254,7 @@ const T* FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2)
   if (y1 == y2)
     return x2;
   if (!detail::IsShort(x1, x2))
-    return detail::ByBlock<T>::FindLastSubSequence(x1, x2, y1, y2);
+    return detail::BestSearches(x1).findLastSubSequence(x1, x2, y1, y2);
   for (ssize_t i = (x2 - x1) - (y2 - y1); i >= 0; --i)
     if (x1[i] == *y1 && IsEqual(y1, y2, x1 + i))
       return x1 + i;
@@ -243,29 +262,28 @@ const T* FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2)
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindFirstOf(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return detail::ByBlock<T>::FindFirstOf(x1, x2, y1, y2);
+  return detail::BestSearches(x1).findFirstOf(x1, x2, y1, y2);
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindFirstNotOf(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return detail::ByBlock<T>::FindFirstNotOf(x1, x2, y1, y2);
+  return detail::BestSearches(x1).findFirstNotOf(x1, x2, y1, y2);
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindLastOf(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return detail::ByBlock<T>::FindLastOf(x1, x2, y1, y2);
+  return detail::BestSearches(x1).findLastOf(x1, x2, y1, y2);
 }
 template <class T, detail::IfCodeUnit<T> = 0>
 const T* FindLastNotOf(const T* x1, const T* x2, const T* y1, const T* y2) {
-  return detail::ByBlock<T>::FindLastNotOf(x1, x2, y1, y2);
+  return detail::BestSearches(x1).findLastNotOf(x1, x2, y1, y2);
 }
 inline int LexicographicalCompareX(const char16* x1, const char16* x2, const char16* y1, const char16* y2) {
   const ssize_t lenX = x2 - x1;
   const ssize_t lenY = y2 - y1;
   const ssize_t len = lenX < lenY ? lenX : lenY;
-  if (!detail::IsShort(x1, x1 + len))
-    return detail::CompareByBlock(x1, x2, y1, y2);
-  for (ssize_t i = 0; i < len; ++i)
-    if (x1[i] != y1[i])
-      return x1[i] < y1[i] ? -1 : 1;
+  const ssize_t i = detail::IsShort(x1, x1 + len) ? detail::EqualElements(x1, y1, len)
+                                                  : detail::BestSearches(x1).findDifference(x1, y1, len);
+  if (i < len)
+    return x1[i] < y1[i] ? -1 : 1;
   return lenX < lenY ? -1 : lenX > lenY;
 }
 
@@ -514,6 +532,9 @@ private:
   // By value, so that a buffer whose address nobody takes can live in registers through a loop of appends.
   static value_type* Reallocate(value_type* buffer, ssize_t n);
   static void Release(value_type* buffer) noexcept;
+  /// Gives back the storage behind the first n bytes, at least size() and 1; keeps it where that fails.
+  void Shrink(ssize_t n) noexcept;
+  friend struct detail::Storage;
 
 public:
   mutable value_type* m_buffer; ///< The storage, or null while there is none.

@@ -20,4 +20,12 @@ typedef char8 xchar;
 /// Points at a run of char8 that ends before its first zero.
 typedef const char8* ConstString8Z;
 
+namespace detail {
+
+/// The value by which a code unit compares. Plain char may be signed, the order of text may not.
+inline unsigned char UnitValue(char x) { return static_cast<unsigned char>(x); }
+template <class T> const T& UnitValue(const T& x) { return x; }
+
+} // namespace detail
+
 } // namespace mirel

@@ -268,9 +268,10 @@ extern template class basic_xstring<char16>;
 /// Replace the contents of the destination with those of the run of srcLen units at src, in one pass and in
 /// linear time. UTF-16 is in the machine's own byte order; a byte order mark is a code point like any other,
 /// and so is a zero. What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition
-/// D91 for UTF-16. Memory that can't be had is std::bad_alloc: a UTF conversion then leaves the beginning
-/// of the result in the destination, the one from ASCII what was there before. The source may not lie in the
-/// destination; a null pointer may come with a count of 0.
+/// D91 for UTF-16. A failed allocation throws std::bad_alloc: a UTF conversion then leaves the beginning of
+/// the result in the destination, the one from ASCII what was there before. On return the destination has the
+/// capacity that it had, or as much as the result and the terminator of c_str() need if that is more. The
+/// source may not lie in the destination; a null pointer may come with a count of 0.
 /// @{
 
 /// One unit for each byte: its value, or "?" for bytes from 0x80 on. @pre "newSize >= 0", of srcLen

@@ -716,8 +716,9 @@ public:
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   /// @pre "r1 <= r2"
   ///
-  /// Nothing is allocated. At worst the cost is the length searched for one element, and its product with the
-  /// length of the range or set otherwise.
+  /// Nothing is allocated. At worst the cost is linear in the length searched for one element; in the sum of
+  /// both lengths for needles and sets of code units, and for needles of integers by random-access iterators;
+  /// and their product otherwise.
   /// @{
 
   /// The first element that is c.
@@ -926,6 +927,8 @@ private:
       return npos;
     return result - begin();
   }
+
+  friend struct detail::Storage;
 
   VectorOfByte m_buffer;
 };

@@ -16,7 +16,7 @@ import tempfile
 WHOLE = {
     "text": r'"Grüße\t\"😀\u202e" (size 16, capacity 16)',
     "alias": r'"Grüße\t\"😀\u202e" (size 16, capacity 16)',
-    "wide": r'u"Grüße\t\"😀\u202e" (size 10, capacity 16)',
+    "wide": r'u"Grüße\t\"😀\u202e" (size 10, capacity 11)',
     "malformed": r'"a\377\355\240\200z\342\202" (size 8, capacity 8)',
     "lone": r'u"a\udc00b\ud83d" (size 4, capacity 4)',
     "bytes": r'"\0001\033" (size 3, capacity 3)',

@@ -79,6 +79,13 @@ void VectorOfByte::reserve(ssize_t n) const {
   m_capacity = n;
 }
 
+void VectorOfByte::Shrink(ssize_t n) noexcept {
+  if (void* const moved = std::realloc(m_buffer, static_cast<std::size_t>(n)); moved != nullptr) {
+    m_buffer = static_cast<value_type*>(moved);
+    m_capacity = n;
+  }
+}
+
 void VectorOfByte::resize(ssize_t n) {
   MIREL_ASSERT(0 <= n);
   GrowTo(*this, n);

@@ -1,0 +1,38 @@
+// Which kernels the library chooses. That each of them is right is tested where the work is: UtfTest.cpp and
+// VectorOfByteTest.cpp.
+#include "Support.h"
+
+#include <cstdio>
+#include <cstdlib>
+
+#include <utils/Kernels.h>
+
+namespace {
+
+/// Converted by whatever is chosen before main() begins.
+const mirel::string16 kBeforeMain = [] {
+  mirel::string16 wide;
+  mirel::Utf16FromUtf8(wide, "Gr\u00FC\u00DFe, \u4E16\u754C, before anything is initialised");
+  return wide;
+}();
+
+TEST(Kernels, AreChosenBeforeMain) {
+  ASSERT_EQ(kBeforeMain.size(), 41);
+  EXPECT_EQ(kBeforeMain[2], 0xFC);
+  EXPECT_EQ(kBeforeMain[7], 0x4E16);
+  EXPECT_EQ(kBeforeMain.find(u'z'), kNpos);
+}
+
+/// The environment may say which ones an emulated processor has.
+TEST(Kernels, AreThoseOfTheProcessor) {
+  std::printf("kernels: %s\n", mirel::KernelName());
+  const char* const expected = std::getenv("MIREL_EXPECTED_KERNELS");
+  EXPECT_STREQ(mirel::KernelName(), expected != nullptr ? expected : mirel::KernelName());
+#if defined(__AVX2__) && defined(MIREL_KERNELS)
+  EXPECT_STREQ(mirel::KernelName(), "AVX2");
+#elif defined(__aarch64__) && defined(MIREL_KERNELS)
+  EXPECT_STREQ(mirel::KernelName(), "NEON");
+#endif
+}
+
+} // namespace

@@ -1,0 +1,582 @@
+// The conversions in wide instructions, compiled once for each instruction set by Kernels.cpp.
+//
+// A text is converted by blocks. For every position of a block it is computed what a code point beginning
+// there would give, also where none begins. A byte shuffle from a table then drops the positions where none
+// begins. No branch depends on where code points begin. Masks with one bit for each position tell whether the
+// block is well-formed; one that isn't is left to the scalar path. A block ends before a code point that its
+// end would cut off, so no state passes from one block to the next. The last block ends where the text ends.
+// It overlaps what is converted already, and may store that part again.
+//
+// There is no include guard: the file is included once for each instruction set.
+
+#include <cstring>
+
+#include <hwy/highway.h>
+
+#include "KernelTable.h"
+
+HWY_BEFORE_NAMESPACE();
+namespace mirel::detail::HWY_NAMESPACE {
+namespace {
+
+namespace hn = hwy::HWY_NAMESPACE;
+
+using Wide = hn::ScalableTag<uint8_t>;    // as wide as the instruction set has them
+using Narrow = hn::FixedTag<uint8_t, 16>; // for short texts, and for shuffles, which go by 16 bytes
+template <class D> using ToUnits = hn::Repartition<uint16_t, D>;
+template <class D> constexpr ssize_t kLanes = static_cast<ssize_t>(hn::MaxLanes(D()));
+
+// Bits and bytes ----------
+
+HWY_INLINE ssize_t Count(uint64_t bits) { return static_cast<ssize_t>(hwy::PopCount(bits)); }
+constexpr uint64_t FirstBits(ssize_t n) { return n < 64 ? (uint64_t{1} << n) - 1 : ~uint64_t{0}; }
+
+/// The highest bit of each byte; that of the first byte is the lowest.
+template <class D> HWY_INLINE uint64_t HighBits(D, hn::Vec<D> v) {
+  const hn::RebindToSigned<D> di;
+  uint64_t bits = 0;
+  hn::StoreMaskBits(di, hn::Lt(hn::BitCast(di, v), hn::Zero(di)), reinterpret_cast<uint8_t*>(&bits));
+  return bits;
+}
+template <class D> HWY_INLINE uint64_t BitsOf(D, hn::Mask<D> mask) {
+  return HighBits(D(), hn::VecFromMask(D(), mask));
+}
+
+template <class D> HWY_INLINE hn::Vec<D> Repeat(D d, uint8_t x) { return hn::Load(d, kRepeats.rows[x]); }
+
+// Bytes have no shifts of their own: these shift units of two bytes, and keep bits that stay in their byte.
+template <int kBits, class D> HWY_INLINE hn::Vec<D> Left(D d, hn::Vec<D> v, uint8_t kept) {
+  return hn::And(hn::BitCast(d, hn::ShiftLeft<kBits>(hn::BitCast(ToUnits<D>(), v))), Repeat(d, kept));
+}
+template <int kBits, class D> HWY_INLINE hn::Vec<D> Right(D d, hn::Vec<D> v, uint8_t kept) {
+  return hn::And(hn::BitCast(d, hn::ShiftRight<kBits>(hn::BitCast(ToUnits<D>(), v))), Repeat(d, kept));
+}
+
+template <class D> HWY_INLINE hn::Mask<D> IsEqual(D d, hn::Vec<D> v, uint8_t x) {
+  return hn::Eq(v, Repeat(d, x));
+}
+template <class D> HWY_INLINE hn::Mask<D> IsAtLeast(D d, hn::Vec<D> v, uint8_t x) {
+  return hn::Eq(hn::Max(v, Repeat(d, x)), v);
+}
+/// Which bytes are in [80, x), in hexadecimal; 0 stands for 100.
+template <class D> HWY_INLINE hn::Mask<D> IsFrom80Below(D d, hn::Vec<D> v, uint8_t x) {
+  const hn::RebindToSigned<D> di;
+  return hn::RebindMask(d, hn::Lt(hn::BitCast(di, v), hn::BitCast(di, Repeat(d, x))));
+}
+template <class D> HWY_INLINE hn::Mask<D> IsNonAscii(D d, hn::Vec<D> v) { return IsFrom80Below(d, v, 0); }
+
+/// yes where the mask is set, no elsewhere. Where plain char is unsigned, g++ 12 takes a blend of bytes for
+/// one that never blends, since it compares the mask with 0 as char.
+template <class M, class V> HWY_INLINE V Select(M mask, V yes, V no) {
+#if defined(__CHAR_UNSIGNED__) && HWY_ARCH_X86
+  return hn::Or(hn::IfThenElseZero(mask, yes), hn::IfThenZeroElse(mask, no));
+#else
+  return hn::IfThenElse(mask, yes, no);
+#endif
+}
+
+/// The k-th 16 bytes of a vector.
+template <int k, class D> HWY_INLINE hn::Vec<Narrow> SixteenBytes(D, hn::Vec<D> v) {
+  if constexpr (kLanes<D> == 16)
+    return v;
+  else if constexpr (k == 0)
+    return hn::LowerHalf(hn::Half<D>(), v);
+  else
+    return hn::UpperHalf(hn::Half<D>(), v);
+}
+
+/// The vector's bytes from the n-th on, and zeros behind them.
+template <int n, class D> HWY_INLINE hn::Vec<D> Shifted(D d, hn::Vec<D> v) {
+  if constexpr (n == 0)
+    return v;
+  else if constexpr (kLanes<D> == 16)
+    return hn::ShiftRightBytes<n>(d, v);
+  else
+    return hn::CombineShiftRightBytes<n>(d, hn::ConcatUpperUpper(d, hn::Zero(d), v), v);
+}
+
+template <class Word> HWY_INLINE uint64_t LoadWord(const uint8_t* p) {
+  Word word;
+  std::memcpy(&word, p, sizeof(word));
+  return word;
+}
+
+/// The n bytes at p, up to 16, and zeros behind them.
+HWY_INLINE hn::Vec<Narrow> LoadPart(const uint8_t* p, ssize_t n) {
+  const hn::Repartition<uint64_t, Narrow> d;
+  uint64_t low = 0, high = 0;
+  if (n >= 8) {
+    low = LoadWord<uint64_t>(p);
+    // Two shifts, by 64 bits in all if n is 8.
+    high = LoadWord<uint64_t>(p + n - 8) >> 4 * (16 - n) >> 4 * (16 - n);
+  } else if (n >= 4) {
+    low = LoadWord<uint32_t>(p) | LoadWord<uint32_t>(p + n - 4) << 8 * (n - 4);
+  } else if (n > 0) {
+    low = p[0] | uint64_t{p[n / 2]} << 8 * (n / 2) | uint64_t{p[n - 1]} << 8 * (n - 1);
+  }
+  return hn::BitCast(Narrow(), hn::InterleaveLower(hn::Set(d, low), hn::Set(d, high)));
+}
+
+/// Copies n bytes, up to a few vectors, without a call. Most of its loads lie within one earlier store: one
+/// that spans two waits for both.
+HWY_INLINE void CopyShort(const uint8_t* from, ssize_t n, uint8_t* out) {
+  const Narrow d;
+  ssize_t k = 0;
+  for (; k < n - 16; k += 16)
+    hn::StoreU(hn::LoadU(d, from + k), d, out + k);
+  if (n - k >= 8) {
+    std::memcpy(out + k, from + k, 8);
+    std::memcpy(out + n - 8, from + n - 8, 8);
+  } else if (k > 0) {
+    hn::StoreU(hn::LoadU(d, from + n - 16), d, out + n - 16);
+  } else {
+    for (; k < n; ++k)
+      out[k] = from[k];
+  }
+}
+
+/// Stores what the shuffle for a mask keeps of 16 bytes: kLeast of them, and kEach for each of the mask's
+/// bits. All 16 bytes at out are written. The lowest 12 bits of mask16 are 16 times the mask, which is the
+/// offset of its row. Returns the end of what is kept.
+template <int kLeast, int kEach>
+HWY_INLINE uint8_t* StoreKept(hn::Vec<Narrow> v, const Shuffles& shuffles, uint64_t mask16, uint8_t* out) {
+  const Narrow d;
+  hn::StoreU(hn::TableLookupBytes(v, hn::Load(d, &shuffles.rows[0][0] + (mask16 & 0xFF0))), d, out);
+  return out + kLeast + kEach * Count(mask16 & 0xFF0);
+}
+
+/// Stores what the mask keeps of positions of two bytes, the first one of which comes from even.
+template <int kLeast, int kEach, class D>
+HWY_INLINE uint8_t* StorePairs(D d, hn::Vec<D> even, hn::Vec<D> odd, const Shuffles& shuffles, uint64_t mask,
+                               uint8_t* out) {
+  const auto lower = hn::InterleaveLower(d, even, odd), upper = hn::InterleaveUpper(d, even, odd);
+  out = StoreKept<kLeast, kEach>(SixteenBytes<0>(d, lower), shuffles, mask << 4, out);
+  out = StoreKept<kLeast, kEach>(SixteenBytes<0>(d, upper), shuffles, mask >> 4, out);
+  if constexpr (16 < kLanes<D>) {
+    out = StoreKept<kLeast, kEach>(SixteenBytes<1>(d, lower), shuffles, mask >> 12, out);
+    out = StoreKept<kLeast, kEach>(SixteenBytes<1>(d, upper), shuffles, mask >> 20, out);
+  }
+  return out;
+}
+
+// A conversion, whatever its direction ----------
+
+/// How much of a block was converted, in units of the source and of the result; 0 and 0 if it isn't
+/// well-formed.
+struct Converted {
+  ssize_t in, out;
+};
+
+/// A conversion under way. A Block has, beside the functions called here:
+/// - kUnits: how many units of the source it has,
+/// - kMost: the most units that its Convert() writes from out on, with those that are no part of the result.
+///   Before out it writes again only what the block's first units gave.
+template <class Out, class In> struct Conversion {
+  const In* p;
+  const In* end;
+  Out* out;
+  Out* outEnd;
+
+  HWY_INLINE Progress<Out, In> At(Stop stop) const { return {p, out, stop}; }
+
+  /// Converts the units of a block from the from-th, where p is, to before the to-th. What is before them is
+  /// converted already. kEnd: go on at p, which is before the to-th where the block's end cuts a code point
+  /// off.
+  template <class Block> HWY_INLINE Stop Convert(const Block& block, ssize_t from, ssize_t to) {
+    constexpr ssize_t kMostBytes = Block::kMost * ssize_t(sizeof(Out));
+    Converted n;
+    if (outEnd - out >= block.Room(from, to)) {
+      n = block.Convert(from, to, reinterpret_cast<uint8_t*>(out));
+    } else {
+      uint8_t copy[std::size_t(2 * kMostBytes)];
+      n = block.Convert(from, to, copy + kMostBytes);
+      if (n.out > outEnd - out)
+        return Stop::kNoRoom;
+      CopyShort(copy + kMostBytes, n.out * ssize_t(sizeof(Out)), reinterpret_cast<uint8_t*>(out));
+    }
+    p += n.in, out += n.out;
+    return n.in == 0 ? Stop::kMalformed : Stop::kEnd;
+  }
+
+  /// Converts a text of at least one block.
+  template <class Block> HWY_INLINE Stop ConvertAll() {
+    while (end - p >= Block::kUnits)
+      if (const Stop stop = Convert(Block::Load(p), 0, Block::kUnits); stop != Stop::kEnd)
+        return stop;
+    Stop stop = Stop::kEnd;
+    while (p != end && stop == Stop::kEnd) // a second time only for what the text's end cuts off
+      stop = Convert(Block::Load(end - Block::kUnits), Block::kUnits - (end - p), Block::kUnits);
+    return stop;
+  }
+
+  /// Converts a text that is shorter than a block.
+  template <class Block> HWY_INLINE Stop ConvertShort() {
+    if (p == end)
+      return Stop::kEnd;
+    const ssize_t n = end - p;
+    const Stop stop = Convert(Block::Load(p, n), 0, n);
+    return stop == Stop::kEnd && p != end ? Stop::kMalformed : stop; // the end cuts a code point off
+  }
+};
+
+// UTF-8 to UTF-16 ----------
+
+/// The low and the high bytes of UTF-16 units.
+template <class D> struct Planes { hn::Vec<D> low, high; };
+
+/// The units of the code points that would begin with the bytes of a, if b and c hold the ones behind them.
+template <int kMaxBytes, class D>
+HWY_INLINE Planes<D> UnitsOf(D d, hn::Vec<D> a, hn::Vec<D> b, hn::Vec<D> c) {
+  const auto isTwo = IsFrom80Below(d, a, 0xE0); // or a continuation byte
+  // The last six bits come from one byte, those before them from the byte before it.
+  auto last = b, beforeLast = a;
+  if constexpr (kMaxBytes > 2) {
+    last = Select(isTwo, b, c);
+    beforeLast = Select(isTwo, a, b);
+  }
+  const auto isContinuation = IsFrom80Below(d, a, 0xC0);
+  if constexpr (kMaxBytes > 3) {
+    // The second position of a four-byte sequence, where a continuation byte stands, gives the low surrogate.
+    last = Select(isContinuation, c, last);
+    beforeLast = Select(isContinuation, b, beforeLast);
+  }
+  auto low = hn::Or(Left<6>(d, beforeLast, 0xC0), hn::And(last, Repeat(d, 0x3F)));
+  auto high = Right<2>(d, beforeLast, 0x0F);
+  if constexpr (kMaxBytes > 2)
+    high = hn::Or(high, hn::IfThenZeroElse(isTwo, Left<4>(d, a, 0xF0)));
+  if constexpr (kMaxBytes > 3) {
+    high = Select(isContinuation, hn::Or(hn::And(high, Repeat(d, 0x03)), Repeat(d, 0xDC)), high);
+    // The bits from the 16th on, less 1 as UTF-16 has it.
+    const auto upper = hn::Sub(hn::Or(Left<2>(d, a, 0x1C), Right<4>(d, b, 0x03)), Repeat(d, 1));
+    const auto lower = hn::Or(Left<2>(d, b, 0x3C), Right<4>(d, c, 0x03));
+    const auto isFour = IsAtLeast(d, a, 0xF0);
+    low = Select(isFour, hn::Or(Left<6>(d, upper, 0xC0), lower), low);
+    high = Select(isFour, hn::Or(Right<2>(d, upper, 0x03), Repeat(d, 0xD8)), high);
+  }
+  const auto isNonAscii = IsNonAscii(d, a);
+  return {Select(isNonAscii, low, a), hn::IfThenElseZero(isNonAscii, high)};
+}
+
+/// Stores the bytes as units.
+template <class D> HWY_INLINE void StoreWidened(D d, hn::Vec<D> bytes, uint8_t* out) {
+  const ToUnits<D> du;
+  hn::StoreU(hn::BitCast(d, hn::PromoteTo(du, hn::LowerHalf(bytes))), d, out);
+  hn::StoreU(hn::BitCast(d, hn::PromoteTo(du, hn::UpperHalf(hn::Half<D>(), bytes))), d, out + kLanes<D>);
+}
+
+/// A block of kVectors vectors of UTF-8.
+template <int kVectors, class D> struct Utf8InMemory {
+  using Tag = D;
+  static constexpr int kCount = kVectors;
+  static constexpr ssize_t kUnits = kVectors * kLanes<D>;
+
+  const uint8_t* p;
+  /// The vector that begins at the n-th byte of the k-th one; the bytes behind the block are zeros.
+  template <int n> HWY_INLINE hn::Vec<D> Get(int k) const {
+    const uint8_t* const q = p + k * kLanes<D>;
+    return k + 1 < kVectors ? hn::LoadU(D(), q + n) : Shifted<n>(D(), hn::LoadU(D(), q));
+  }
+};
+
+/// A block of up to 16 bytes of UTF-8, which it has in a register.
+struct Utf8InRegister {
+  using Tag = Narrow;
+  static constexpr int kCount = 1;
+  static constexpr ssize_t kUnits = 16;
+
+  hn::Vec<Narrow> bytes;
+  template <int n> HWY_INLINE hn::Vec<Narrow> Get(int) const { return Shifted<n>(Narrow(), bytes); }
+};
+
+template <class Bytes> struct Utf8Block : Bytes {
+  using D = typename Bytes::Tag;
+  static constexpr ssize_t kMost = Bytes::kUnits;
+
+  // Not constructors: g++ compiles inherited ones for the processor that the library is built for.
+  static HWY_INLINE Utf8Block Load(const char8* p) { return {{reinterpret_cast<const uint8_t*>(p)}}; }
+  static HWY_INLINE Utf8Block Load(const char8* p, ssize_t n) {
+    return {{LoadPart(reinterpret_cast<const uint8_t*>(p), n)}};
+  }
+
+  HWY_INLINE bool IsAscii() const {
+    auto any = this->template Get<0>(0);
+    for (int k = 1; k < Bytes::kCount; ++k)
+      any = hn::Or(any, this->template Get<0>(k));
+    return HighBits(D(), any) == 0;
+  }
+  /// The room that Convert() needs. For ASCII it is exact.
+  HWY_INLINE ssize_t Room(ssize_t from, ssize_t to) const {
+    return to == Bytes::kUnits && IsAscii() ? to - from : kMost;
+  }
+
+  /// The n-th highest bit of each byte, n counted from 0.
+  template <int n> HWY_INLINE uint64_t BitsAt() const {
+    uint64_t bits = 0;
+    for (int k = 0; k < Bytes::kCount; ++k) {
+      auto v = this->template Get<0>(k);
+      for (int shifts = 0; shifts < n; ++shifts)
+        v = hn::Add(v, v);
+      bits |= HighBits(D(), v) << k * kLanes<D>;
+    }
+    return bits;
+  }
+
+  /// The positions of continuation bytes, and of C0 and C1, which are never well-formed.
+  HWY_INLINE uint64_t From80BelowC2() const {
+    uint64_t bits = 0;
+    for (int k = 0; k < Bytes::kCount; ++k)
+      bits |= BitsOf(D(), IsFrom80Below(D(), this->template Get<0>(k), 0xC2)) << k * kLanes<D>;
+    return bits;
+  }
+
+  /// The positions of lead bytes that may not stand before the byte behind them: the sequence would be
+  /// overlong, a surrogate, or beyond U+10FFFF.
+  template <bool kHasFourBytes> HWY_INLINE uint64_t BadLeads() const {
+    const D d;
+    uint64_t bits = 0;
+    for (int k = 0; k < Bytes::kCount; ++k) {
+      const auto lead = this->template Get<0>(k), next = this->template Get<1>(k);
+      // 80 to 9F may not follow E0, and nothing else may follow ED; xor with 0D turns one into the other.
+      const auto swap = hn::IfThenElseZero(IsFrom80Below(d, next, 0xA0), Repeat(d, 0x0D));
+      auto bad = IsEqual(d, hn::Xor(lead, swap), 0xED);
+      if constexpr (kHasFourBytes) {
+        // 80 to 8F may not follow F0, and nothing else may follow F4; xor with 04 turns one into the other.
+        const auto swap4 = hn::IfThenElseZero(IsFrom80Below(d, next, 0x90), Repeat(d, 0x04));
+        bad = hn::Or(bad, hn::Or(IsEqual(d, hn::Xor(lead, swap4), 0xF4), IsAtLeast(d, lead, 0xF5)));
+      }
+      bits |= BitsOf(d, bad) << k * kLanes<D>;
+    }
+    return bits;
+  }
+
+  /// Stores the units of the positions whose bits are set; their number.
+  template <int kMaxBytes> HWY_INLINE ssize_t Store(uint64_t keep, uint8_t* const out) const {
+    uint8_t* end = out;
+    for (int k = 0; k < Bytes::kCount; ++k) {
+      const auto a = this->template Get<0>(k), b = this->template Get<1>(k), c = this->template Get<2>(k);
+      const auto units = UnitsOf<kMaxBytes>(D(), a, b, c);
+      end = StorePairs<0, 2>(D(), units.low, units.high, kKeepUnits, keep, end);
+      keep = keep >> (kLanes<D> - 1) >> 1;
+    }
+    return static_cast<ssize_t>(static_cast<size_t>(end - out) / 2);
+  }
+
+  /// Converts the first 60 bytes, which are 20 three-byte sequences.
+  HWY_INLINE Converted ConvertThreeByteSequences(uint8_t* out) const {
+    const Narrow d;
+    const ToUnits<Narrow> du;
+    alignas(16) static constexpr uint8_t kLast[16] = {2, 1, 5, 4, 8, 7, 11, 10, 14, 13};
+    alignas(16) static constexpr uint8_t kFirst[16] = {0, 0, 3, 3, 6, 6, 9, 9, 12, 12};
+    for (int k = 0; k < 4; ++k) {
+      const auto bytes = hn::LoadU(d, this->p + 15 * k);
+      const auto last = hn::BitCast(du, hn::TableLookupBytes(bytes, hn::Load(d, kLast)));
+      const auto first = hn::BitCast(du, hn::TableLookupBytes(bytes, hn::Load(d, kFirst)));
+      const auto low =
+          hn::Or(hn::And(last, hn::Set(du, 0x3F)), hn::ShiftRight<2>(hn::And(last, hn::Set(du, 0x3F00))));
+      hn::StoreU(hn::BitCast(d, hn::Or(low, hn::ShiftLeft<12>(first))), d, out + 10 * k);
+    }
+    return {60, 20};
+  }
+
+  HWY_INLINE Converted Convert(ssize_t from, ssize_t to, uint8_t* out) const {
+    if (IsAscii()) {
+      for (int k = 0; k < Bytes::kCount; ++k)
+        StoreWidened(D(), this->template Get<0>(k), out - 2 * from + 2 * k * kLanes<D>);
+      return {to - from, to - from};
+    }
+    constexpr uint64_t kLast = uint64_t{1} << (Bytes::kUnits - 1);
+    // The positions to check, up to and including the lead byte of a sequence that is cut off: that byte too
+    // may stand where a continuation byte is missing.
+    const auto upTo = [from](uint64_t cutOff) { return (cutOff ^ (cutOff - 1)) & ~FirstBits(from); };
+    const uint64_t continuations = From80BelowC2(), bad = continuations & BitsAt<1>();
+    const uint64_t leads = BitsAt<0>() & ~continuations, leads3 = leads & BitsAt<2>();
+    if (leads3 == 0) {
+      const uint64_t cutOff = leads & kLast, checked = upTo(cutOff),
+                     positions = checked & ~cutOff & FirstBits(to);
+      if (((bad | (leads << 1 ^ continuations)) & checked) != 0)
+        return {0, 0};
+      return {Count(positions), Store<2>(positions & ~continuations, out)};
+    }
+    const uint64_t leads4 = leads3 & BitsAt<3>();
+    const uint64_t cutOff = (leads & kLast) | (leads3 & kLast >> 1) | (leads4 & kLast >> 2);
+    const uint64_t checked = upTo(cutOff), positions = checked & ~cutOff & FirstBits(to);
+    const uint64_t misplaced = continuations ^ (leads << 1 | leads3 << 2 | leads4 << 3);
+    if (((bad | misplaced) & checked) != 0 ||
+        ((leads4 == 0 ? BadLeads<false>() : BadLeads<true>()) & positions) != 0)
+      return {0, 0};
+    if (leads4 != 0)
+      return {Count(positions), Store<4>(positions & (~continuations | leads4 << 1), out)};
+    if constexpr (Bytes::kUnits == 64)
+      if ((continuations & FirstBits(60)) == 0xDB6DB6DB6DB6DB6 && from == 0)
+        return ConvertThreeByteSequences(out);
+    return {Count(positions), Store<3>(positions & ~continuations, out)};
+  }
+};
+
+Progress<char16, char8> Utf16FromUtf8(const char8* p, const char8* end, char16* out, char16* outEnd) {
+  Conversion<char16, char8> text{p, end, out, outEnd};
+  if (end - p >= 64)
+    return text.At(text.ConvertAll<Utf8Block<Utf8InMemory<64 / kLanes<Wide>, Wide>>>());
+  if (end - p >= 32)
+    return text.At(text.ConvertAll<Utf8Block<Utf8InMemory<32 / kLanes<Wide>, Wide>>>());
+  if (end - p >= 16)
+    return text.At(text.ConvertAll<Utf8Block<Utf8InMemory<1, Narrow>>>());
+  return text.At(text.ConvertShort<Utf8Block<Utf8InRegister>>());
+}
+
+// UTF-16 to UTF-8 ----------
+
+/// Units that take at least two, at least three bytes, a bit for each.
+struct UnitMasks {
+  uint64_t two, three;
+  /// The bytes of the first n units.
+  HWY_INLINE ssize_t Bytes(ssize_t n) const {
+    return n + Count(two & FirstBits(n)) + Count(three & FirstBits(n));
+  }
+};
+
+/// A block of UTF-16, of as many units as a vector has bytes.
+template <class Tag> struct Utf16Block {
+  using D = Tag;
+  static constexpr ssize_t kUnits = kLanes<D>;
+  static constexpr ssize_t kMost = 3 * kUnits + 4; // the last store is 16 bytes, of which 12 count at most
+  static constexpr D d{};
+  hn::Vec<D> low, high; ///< the bytes of the units
+
+  static HWY_INLINE Utf16Block Load(const char16* p) { return Of(LoadHalf(p), LoadHalf(p + kUnits / 2)); }
+  /// Of n units; the others are zeros.
+  static HWY_INLINE Utf16Block Load(const char16* p, ssize_t n) {
+    return Of(LoadHalf(p, 0, n), LoadHalf(p, 8, n));
+  }
+  static HWY_INLINE Utf16Block Of(hn::Vec<D> first, hn::Vec<D> second) {
+    return {hn::ConcatEven(d, second, first), hn::ConcatOdd(d, second, first)};
+  }
+  static HWY_INLINE hn::Vec<D> LoadHalf(const char16* p) {
+    return hn::LoadU(d, reinterpret_cast<const uint8_t*>(p));
+  }
+  static HWY_INLINE hn::Vec<D> LoadHalf(const char16* p, ssize_t i, ssize_t n) {
+    return n <= i ? hn::Zero(d)
+                  : LoadPart(reinterpret_cast<const uint8_t*>(p + i), n - i < 8 ? 2 * (n - i) : 16);
+  }
+
+  HWY_INLINE ssize_t Room(ssize_t, ssize_t) const { return kMost; }
+
+  /// Bytes from 80 on where the unit isn't ASCII, and where it takes three bytes.
+  HWY_INLINE hn::Vec<D> NonAscii() const { return hn::Or(hn::SaturatedAdd(high, Repeat(d, 0x7F)), low); }
+  HWY_INLINE hn::Vec<D> ThreeBytes() const { return hn::SaturatedAdd(high, Repeat(d, 0x78)); }
+  /// The units whose high byte is kind in the bits of mask.
+  HWY_INLINE hn::Mask<D> Is(uint8_t kind, uint8_t mask) const {
+    return IsEqual(d, hn::And(high, Repeat(d, mask)), kind);
+  }
+  /// The bits of the units from the sixth on, as many as are kept.
+  HWY_INLINE hn::Vec<D> UpperBits(uint8_t kept) const {
+    return hn::Or(Left<2>(d, high, kept & 0xFC), Right<6>(d, low, 0x03));
+  }
+
+  /// Stores a block without units from 800 on; past the end of the bytes.
+  HWY_INLINE uint8_t* StoreTwo(uint64_t two, uint8_t* out) const {
+    const auto lead = hn::Or(UpperBits(0x1F), Repeat(d, 0xC0));
+    const auto first = Select(IsNonAscii(d, NonAscii()), lead, low);
+    const auto last = hn::Or(hn::And(low, Repeat(d, 0x3F)), Repeat(d, 0x80));
+    return StorePairs<8, 1>(d, first, last, kKeepTwoBytes, two, out);
+  }
+
+  /// Stores any block; past the end of the bytes.
+  template <bool kHasSurrogates> HWY_INLINE uint8_t* StoreThree(const UnitMasks& masks, uint8_t* out) const {
+    const auto marker = Repeat(d, 0x80), lead3 = hn::Or(Right<4>(d, high, 0x0F), Repeat(d, 0xE0));
+    auto first = Select(IsNonAscii(d, ThreeBytes()), lead3, hn::Or(UpperBits(0x1F), Repeat(d, 0xC0)));
+    first = Select(IsNonAscii(d, NonAscii()), first, low);
+    auto middle = hn::Or(UpperBits(0x3F), marker), last = hn::Or(hn::And(low, Repeat(d, 0x3F)), marker);
+    if constexpr (kHasSurrogates) {
+      // A high surrogate gives three bytes, the third with bits of the low one, and the low one the last
+      // byte.
+      const auto isHigh = Is(0xD8, 0xFC), isLow = Is(0xDC, 0xFC);
+      const auto upper = hn::Add(UpperBits(0x0F), Repeat(d, 1)); // the bits from the 16th on
+      const auto lead4 = hn::Or(Right<2>(d, upper, 0x07), Repeat(d, 0xF0));
+      first = Select(isLow, last, Select(isHigh, lead4, first));
+      const auto second = hn::Or(Left<4>(d, upper, 0x30), Right<2>(d, low, 0x0F));
+      middle = Select(isHigh, hn::Or(second, marker), middle);
+      const auto third =
+          hn::Or(Left<4>(d, low, 0x30), hn::And(Shifted<1>(d, UpperBits(0x0F)), Repeat(d, 0x0F)));
+      last = Select(isHigh, hn::Or(third, marker), last);
+    }
+    // Four bytes for each unit: first, first, middle, last. The masks of even and of odd groups of four units
+    // are kept apart, so that both masks of a group stand side by side.
+    const ToUnits<D> du;
+    const auto leads0 = hn::BitCast(du, hn::InterleaveLower(d, first, first));
+    const auto leads1 = hn::BitCast(du, hn::InterleaveUpper(d, first, first));
+    const auto rests0 = hn::BitCast(du, hn::InterleaveLower(d, middle, last));
+    const auto rests1 = hn::BitCast(du, hn::InterleaveUpper(d, middle, last));
+    const auto units0 = hn::BitCast(d, hn::InterleaveLower(du, leads0, rests0));
+    const auto units1 = hn::BitCast(d, hn::InterleaveUpper(du, leads0, rests0));
+    const auto units2 = hn::BitCast(d, hn::InterleaveLower(du, leads1, rests1));
+    const auto units3 = hn::BitCast(d, hn::InterleaveUpper(du, leads1, rests1));
+    const uint64_t even = (masks.two & 0x0F0F0F0F) << 4 | (masks.three & 0x0F0F0F0F) << 8;
+    const uint64_t odd = (masks.two & 0xF0F0F0F0) | (masks.three & 0xF0F0F0F0) << 4;
+    out = StoreKept<4, 1>(SixteenBytes<0>(d, units0), kKeepThreeBytes, even, out);
+    out = StoreKept<4, 1>(SixteenBytes<0>(d, units1), kKeepThreeBytes, odd, out);
+    out = StoreKept<4, 1>(SixteenBytes<0>(d, units2), kKeepThreeBytes, even >> 8, out);
+    out = StoreKept<4, 1>(SixteenBytes<0>(d, units3), kKeepThreeBytes, odd >> 8, out);
+    if constexpr (kUnits > 16) {
+      out = StoreKept<4, 1>(SixteenBytes<1>(d, units0), kKeepThreeBytes, even >> 16, out);
+      out = StoreKept<4, 1>(SixteenBytes<1>(d, units1), kKeepThreeBytes, odd >> 16, out);
+      out = StoreKept<4, 1>(SixteenBytes<1>(d, units2), kKeepThreeBytes, even >> 24, out);
+      out = StoreKept<4, 1>(SixteenBytes<1>(d, units3), kKeepThreeBytes, odd >> 24, out);
+    }
+    return out;
+  }
+
+  HWY_INLINE Converted Convert(ssize_t from, ssize_t to, uint8_t* out) const {
+    const ssize_t n = to - from, behind = kUnits - to;
+    UnitMasks masks = {HighBits(d, NonAscii()), 0};
+    if (masks.two == 0) {
+      hn::StoreU(low, d, out - from);
+      return {n, n};
+    }
+    masks.three = HighBits(d, ThreeBytes());
+    if (masks.three == 0)
+      return {n, StoreTwo(masks.two, out - masks.Bytes(from)) - out - behind};
+    if (BitsOf(d, Is(0xD8, 0xF8)) == 0)
+      return {n, StoreThree<false>(masks, out - masks.Bytes(from)) - out - behind};
+    const uint64_t highs = BitsOf(d, Is(0xD8, 0xFC)), lows = BitsOf(d, Is(0xDC, 0xFC));
+    if (((highs << 1 ^ lows) & FirstBits(kUnits) & ~FirstBits(from)) != 0)
+      return {0, 0};
+    const ssize_t cutOff = static_cast<ssize_t>(highs >> (kUnits - 1));
+    masks = {masks.two & ~lows, masks.three & ~lows}; // a low surrogate gives one byte, a high one three
+    return {n - cutOff, StoreThree<true>(masks, out - masks.Bytes(from)) - out - behind - 3 * cutOff};
+  }
+};
+
+Progress<char8, char16> Utf8FromUtf16(const char16* p, const char16* end, char8* out, char8* outEnd) {
+  Conversion<char8, char16> text{p, end, out, outEnd};
+  if (end - p >= kLanes<Wide>)
+    return text.At(text.ConvertAll<Utf16Block<Wide>>());
+  if (end - p >= kLanes<Narrow>)
+    return text.At(text.ConvertAll<Utf16Block<Narrow>>());
+  return text.At(text.ConvertShort<Utf16Block<Narrow>>());
+}
+
+// ASCII to UTF-16 ----------
+
+/// The bytes, with ? in the place of those that aren't ASCII.
+template <class D> HWY_INLINE hn::Vec<D> AsAscii(D d, hn::Vec<D> bytes) {
+  return Select(IsNonAscii(d, bytes), Repeat(d, '?'), bytes);
+}
+
+void Utf16FromAscii(const char8* src, const char8* end, char16* dst) {
+  const uint8_t* p = reinterpret_cast<const uint8_t*>(src);
+  uint8_t* out = reinterpret_cast<uint8_t*>(dst);
+  ssize_t rest = end - src;
+  for (; rest >= kLanes<Wide>; rest -= kLanes<Wide>, p += kLanes<Wide>, out += 2 * kLanes<Wide>)
+    StoreWidened(Wide(), AsAscii(Wide(), hn::LoadU(Wide(), p)), out);
+  for (ssize_t n; rest > 0; rest -= n, p += n, out += 2 * n) {
+    n = rest < 16 ? rest : 16;
+    uint8_t units[32];
+    StoreWidened(Narrow(), AsAscii(Narrow(), LoadPart(p, n)), units);
+    CopyShort(units, 2 * n, out);
+  }
+}
+
+} // namespace
+} // namespace mirel::detail::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();

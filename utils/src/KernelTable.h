@@ -1,0 +1,76 @@
+// The conversions and searches in wide instructions: a table of functions for each instruction set.
+//
+// They are written once, in the vocabulary of Google Highway, and compiled once for each instruction set
+// (Kernels.cpp). Everything has a scalar path with the same results, for processors that have none of these
+// instruction sets.
+
+#pragma once
+
+#include <utils/xstring.h>
+
+namespace mirel::detail {
+
+/// Why a conversion stopped.
+enum class Stop {
+  kEnd,       ///< it has reached the end of the source
+  kMalformed, ///< what follows is malformed or cut off, as far as the kernel can tell
+  kNoRoom     ///< what follows may not fit in the destination
+};
+
+/// How far a conversion got.
+template <class CharOut, class CharIn> struct Progress {
+  const CharIn* p; ///< the first unit that isn't converted, where a code point begins
+  CharOut* out;    ///< past the end of the result
+  Stop stop;
+};
+
+/// What one instruction set offers. The conversions read nothing outside [p, end) and write nothing outside
+/// [out, outEnd), but may write more of it than they report.
+struct Kernels {
+  const char* name;
+  Progress<char16, char8> (*utf16FromUtf8)(const char8* p, const char8* end, char16* out, char16* outEnd);
+  Progress<char8, char16> (*utf8FromUtf16)(const char16* p, const char16* end, char8* out, char8* outEnd);
+  /// As Utf16FromAscii(): end - p units at out.
+  void (*utf16FromAscii)(const char8* p, const char8* end, char16* out);
+  SearchKernels<char8> search8;
+  SearchKernels<char16> search16;
+};
+
+// The tables of the conversions, once for all instruction sets. They are defined in a file of their own: g++
+// builds a vector whose value it sees anew each time it is used, with three instructions in the loop, where a
+// load is part of the instruction that uses it.
+
+/// A byte shuffle for each mask of positions: it drops positions, and moves together what it keeps.
+struct alignas(64) Shuffles {
+  uint8_t rows[256][16];
+};
+/// For 8 positions of two bytes: keeps those whose bit is set.
+extern const Shuffles kKeepUnits;
+/// For 8 positions of two bytes: keeps the first byte of each, and the second of those whose bit is set.
+extern const Shuffles kKeepTwoBytes;
+/// For 4 positions of four bytes, the second of them unused: keeps the first byte of each, the last of those
+/// whose bit is set in the lower half of the mask, and the third of those whose bit is set in the upper half.
+extern const Shuffles kKeepThreeBytes;
+
+/// Each byte, as often as the widest vector has bytes.
+struct alignas(64) Repeats {
+  uint8_t rows[256][32];
+};
+extern const Repeats kRepeats;
+
+/// The k-th best kernels that this processor has, counted from 0; null if there are fewer. It asks the
+/// processor each time: there is no state to initialise, so that it also works before main() and from any
+/// thread.
+const Kernels* KernelsAt(int k);
+
+/// The best kernels that this processor has, or null. About 1 ns.
+inline const Kernels* BestKernels() { return KernelsAt(0); }
+
+/// The scalar path of the searches.
+template <class T> const SearchKernels<T>& ScalarSearches();
+
+/// UtfToUtf() by the given kernels, and without any if they are null.
+template <class CharOut, class CharIn>
+bool UtfToUtf(const Kernels* kernels, basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen);
+
+} // namespace mirel::detail

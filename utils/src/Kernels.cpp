@@ -1,0 +1,89 @@
+// The choice of the kernels at run time. This file is compiled once for each instruction set, by Highway's
+// foreach_target.h, and the kernels with it; each lands in a namespace of its own, N_AVX2 for example.
+
+#include "KernelTable.h"
+
+#include <utils/Kernels.h>
+#include <utils/VectorOfByte.h>
+
+// The kernels take the first byte of a unit or word for its lowest.
+#if defined(MIREL_KERNELS) && __BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__
+
+// The kernels use neither AES nor conversions of floating-point numbers, so no processor has to have them.
+// The targets that are left out weren't found to gain a third over the others.
+#define HWY_DISABLE_PCLMUL_AES
+#define HWY_DISABLE_F16C
+#define HWY_DISABLED_TARGETS                                                                                 \
+  (HWY_SSSE3 | HWY_AVX3 | HWY_AVX3_DL | HWY_SVE | HWY_SVE2 | HWY_SVE_256 | HWY_SVE2_128)
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "utils/src/Kernels.cpp"
+#include <hwy/foreach_target.h>
+#include <hwy/highway.h>
+
+#if HWY_TARGET == HWY_AVX2 || HWY_TARGET == HWY_SSE4 || (HWY_TARGET == HWY_NEON && HWY_ARCH_ARM_A64)
+
+#include "ConversionKernels-inl.h"
+#include "SearchKernels-inl.h"
+
+namespace mirel::detail::HWY_NAMESPACE {
+namespace {
+
+constexpr Kernels kKernels = {
+    &HWY_STR(HWY_NAMESPACE)[2], // without "N_"
+    Utf16FromUtf8,
+    Utf8FromUtf16,
+    Utf16FromAscii,
+    kSearchKernels<char8>,
+    kSearchKernels<char16>,
+};
+
+} // namespace
+} // namespace mirel::detail::HWY_NAMESPACE
+
+#endif
+
+#else
+#define HWY_ONCE 1
+#define HWY_TARGETS 0
+#endif
+
+#if HWY_ONCE
+
+// As a number, so that all of them are asked without branches.
+#define HAS(feature) static_cast<unsigned>(__builtin_cpu_supports(feature) != 0)
+
+namespace mirel {
+
+const detail::Kernels* detail::KernelsAt([[maybe_unused]] int k) {
+#if HWY_TARGETS & HWY_NEON && HWY_ARCH_ARM_A64
+  if (k-- == 0)
+    return &N_NEON::kKernels;
+#endif
+#if HWY_TARGETS & HWY_AVX2
+  if (HAS("avx2") & HAS("bmi") & HAS("bmi2") & HAS("fma") & HAS("popcnt") && k-- == 0)
+    return &N_AVX2::kKernels;
+#endif
+#if HWY_TARGETS & HWY_SSE4
+  if (HAS("sse4.2") & HAS("popcnt") && k-- == 0)
+    return &N_SSE4::kKernels;
+#endif
+  return nullptr;
+}
+
+const char* KernelName() {
+  const detail::Kernels* const kernels = detail::BestKernels();
+  return kernels != nullptr ? kernels->name : "none";
+}
+
+const detail::SearchKernels<char8>& detail::BestSearches(const char8*) {
+  const Kernels* const kernels = BestKernels();
+  return kernels != nullptr ? kernels->search8 : ScalarSearches<char8>();
+}
+const detail::SearchKernels<char16>& detail::BestSearches(const char16*) {
+  const Kernels* const kernels = BestKernels();
+  return kernels != nullptr ? kernels->search16 : ScalarSearches<char16>();
+}
+
+} // namespace mirel
+
+#endif
