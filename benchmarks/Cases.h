@@ -1,10 +1,15 @@
-// A case is one piece of work that we and others do on the same data in the same run.
+// A case is one benchmark: what we and others do on the same data in the same run.
 
 #pragma once
 
+#include <cstddef>
 #include <cstdio>
 #include <cstdlib>
+#include <functional>
+#include <memory>
+#include <optional>
 #include <string>
+#include <vector>
 
 #include <benchmark/benchmark.h>
 
@@ -14,43 +19,83 @@ using mirel::char16;
 using mirel::char8;
 using mirel::ssize_t;
 
-/// Registers what one party does in a case. The work returns what can be compared between the parties (an
-/// index, a size, a checksum), and they must agree: only equal work can be set against each other.
-template <class Work> class Case {
-public:
-  Case(const std::string& name, Work ours) : m_name(name), m_expected(ours()) { Register("ours", ours); }
+/// What one party does in a case: once, for its result, and in the loop that is timed.
+struct Party {
+  std::function<long long()> once;
+  std::function<void(benchmark::State&)> loop;
+};
 
-  template <class Peer> Case& Against(const std::string& peer, Peer work) {
-    if (static_cast<long long>(work()) != static_cast<long long>(m_expected)) {
-      std::fprintf(stderr, "%s: %s gives another result\n", m_name.c_str(), peer.c_str());
-      std::exit(1);
-    }
-    Register(peer, work);
+/// The work returns what can be compared between the parties: an index, a size, a checksum.
+template <class Work> Party Of(Work work) {
+  return {[work] { return static_cast<long long>(work()); },
+          [work](benchmark::State& state) {
+            for (auto _ : state) {
+              // Some functions, memchr and strcspn among them, are pure to the compiler: it would call them
+              // once.
+              benchmark::ClobberMemory();
+              benchmark::DoNotOptimize(work());
+            }
+          }};
+}
+
+/// Does the same with each of the texts, which live as long as the program.
+template <class Text, class Work> Party Over(const std::vector<Text>& texts, Work work) {
+  return Of([&texts, work] {
+    long long sum = 0;
+    for (const Text& text : texts)
+      sum += static_cast<long long>(work(text));
+    return sum;
+  });
+}
+
+/// The parties' results must agree: only equal work can be set against each other.
+class Case {
+public:
+  Case(const std::string& area, const std::string& work, const std::string& data, std::size_t size,
+       const std::string& unit)
+      : m_name(area + ";" + work + ";" + data + ";" + std::to_string(size) + ";" + unit),
+        m_isLong(size >= std::size_t(1) << 19) {}
+
+  Case& Against(const std::string& who, const Party& party) {
+    const std::string name = m_name + ";" + who;
+    auto run = [name, party, expected = m_expected, checked = false](benchmark::State& state) mutable {
+      if (!checked) {
+        const long long result = party.once();
+        if (expected->value_or(result) != result) {
+          std::fprintf(stderr, "%s: %lld, others %lld\n", name.c_str(), result, **expected);
+          std::exit(1);
+        }
+        *expected = result;
+        checked = true;
+      }
+      party.loop(state);
+    };
+    auto* const registered = benchmark::RegisterBenchmark(name.c_str(), run);
+    if (m_isLong)
+      registered->Repetitions(9); // of milliseconds each
     return *this;
   }
+  template <class Work> Case& Against(const std::string& who, Work work) { return Against(who, Of(work)); }
+  template <class Work> Case& Ours(Work work) { return Against("ours", work); }
 
 private:
-  template <class W> void Register(const std::string& who, W work) {
-    benchmark::RegisterBenchmark((m_name + ";" + who).c_str(), [work](benchmark::State& state) {
-      for (auto _ : state)
-        benchmark::DoNotOptimize(work());
-    });
-  }
-
   std::string m_name;
-  decltype(std::declval<Work>()()) m_expected;
+  bool m_isLong;
+  std::shared_ptr<std::optional<long long>> m_expected = std::make_shared<std::optional<long long>>();
 };
 
 /// The standard library's character for a code unit, and the names of the types.
 template <class T> struct Width;
 template <> struct Width<char8> {
   using Std = char;
-  static constexpr const char* kBits = "8-bit";
+  static constexpr const char* kUnit = "bytes";
+  static constexpr const char* kArea = "Searches in bytes";
   static constexpr const char* kPeer = "std::string";
 };
 template <> struct Width<char16> {
   using Std = char16_t;
-  static constexpr const char* kBits = "16-bit";
+  static constexpr const char* kUnit = "16-bit units";
+  static constexpr const char* kArea = "Searches in 16-bit units";
   static constexpr const char* kPeer = "std::u16string";
 };
 
@@ -58,15 +103,8 @@ template <class T> using StdString = std::basic_string<typename Width<T>::Std>;
 
 template <class T> StdString<T> StdOf(const std::string& text) { return {text.begin(), text.end()}; }
 
-template <class T> mirel::basic_xstring<T> OurOf(const std::string& text) {
-  mirel::basic_xstring<T> result;
-  result.assign(text.begin(), text.end());
-  return result;
-}
-
-inline std::string CaseName(const std::string& work, const std::string& data, ssize_t size,
-                            const char* bits) {
-  return work + ";" + data + ";" + std::to_string(size) + ";" + bits;
+template <class T> mirel::basic_xstring<T> OurOf(const StdString<T>& text) {
+  return {reinterpret_cast<const T*>(text.data()), static_cast<ssize_t>(text.size())};
 }
 
 void RegisterSearches();

@@ -2,6 +2,7 @@
 #include "Cases.h"
 
 #include <algorithm>
+#include <map>
 #include <vector>
 
 #ifdef HAVE_ABSEIL
@@ -24,12 +25,17 @@ template <class T> void RegisterBuilding(ssize_t count) {
   const auto ours = [] { return mirel::basic_xstring<T>(); };
   const auto theirs = [] { return StdString<T>(); };
   const auto vector = [] { return std::vector<Std>(); };
-  Case(CaseName("push_back", "from empty", count, Width<T>::kBits), pushBack(ours, T('x')))
+  const auto edits = [count](const char* work, const char* data) {
+    return Case("Building", work, data, static_cast<std::size_t>(count),
+                std::string("edits, ") + Width<T>::kUnit);
+  };
+  edits("push_back", "from empty")
+      .Ours(pushBack(ours, T('x')))
       .Against(Width<T>::kPeer, pushBack(theirs, Std('x')))
       .Against("std::vector", pushBack(vector, Std('x')));
 
-  static const auto ourRun = OurOf<T>("seventeen units..");
-  static const auto theirRun = StdOf<T>("seventeen units..");
+  static const auto theirRange = StdOf<T>("seventeen units..");
+  static const auto ourRange = OurOf<T>(theirRange);
   const auto append = [count](auto make, auto add) {
     return [=] {
       auto s = make();
@@ -38,26 +44,26 @@ template <class T> void RegisterBuilding(ssize_t count) {
       return s.size();
     };
   };
-  auto appends = Case(CaseName("append of 17 units", "from empty", count, Width<T>::kBits),
-                      append(ours, [](auto& s) { s.append(ourRun); }));
-  appends.Against(Width<T>::kPeer, append(theirs, [](auto& s) { s.append(theirRun); }))
+  Case appends = edits("append of 17 units", "from empty");
+  appends.Ours(append(ours, [](auto& s) { s.append(ourRange); }))
+      .Against(Width<T>::kPeer, append(theirs, [](auto& s) { s.append(theirRange); }))
       .Against("std::vector",
-               append(vector, [](auto& v) { v.insert(v.end(), theirRun.begin(), theirRun.end()); }));
+               append(vector, [](auto& v) { v.insert(v.end(), theirRange.begin(), theirRange.end()); }));
 #ifdef HAVE_ABSEIL
   if constexpr (sizeof(T) == 1)
-    appends.Against("absl::StrAppend", append(theirs, [](auto& s) { absl::StrAppend(&s, theirRun); }));
+    appends.Against("absl::StrAppend", append(theirs, [](auto& s) { absl::StrAppend(&s, theirRange); }));
 #endif
   if (count > 1000)
     return;
-  const auto appendAndRead = [](auto& run) {
-    return [&run](auto& s) {
-      s.append(run);
+  const auto appendAndRead = [](auto& range) {
+    return [&range](auto& s) {
+      s.append(range);
       benchmark::DoNotOptimize(s.c_str());
     };
   };
-  Case(CaseName("append and c_str()", "in turn, 17 units", count, Width<T>::kBits),
-       append(ours, appendAndRead(ourRun)))
-      .Against(Width<T>::kPeer, append(theirs, appendAndRead(theirRun)));
+  edits("append and c_str()", "in turn, 17 units")
+      .Ours(append(ours, appendAndRead(ourRange)))
+      .Against(Width<T>::kPeer, append(theirs, appendAndRead(theirRange)));
 }
 
 template <class T> void RegisterChanging(ssize_t size) {
@@ -67,12 +73,12 @@ template <class T> void RegisterChanging(ssize_t size) {
     text += "the change of text in place ";
   text.resize(usize);
   // The cases live as long as the program, and so do their texts.
-  const auto& ours = *new mirel::basic_xstring<T>(OurOf<T>(text));
   const auto& theirs = *new StdString<T>(StdOf<T>(text));
+  const auto& ours = *new mirel::basic_xstring<T>(OurOf<T>(theirs));
   auto& ourTarget = *new mirel::basic_xstring<T>(ours);
   auto& theirTarget = *new StdString<T>(theirs);
   const auto pair = [&](const char* work, const char* data, auto ourWork, auto theirWork) {
-    Case(CaseName(work, data, size, Width<T>::kBits), ourWork).Against(Width<T>::kPeer, theirWork);
+    Case("Editing", work, data, usize, Width<T>::kUnit).Ours(ourWork).Against(Width<T>::kPeer, theirWork);
   };
   pair(
       "copy", "construction", [&] { return mirel::basic_xstring<T>(ours).size(); },
@@ -119,9 +125,87 @@ template <class T> void RegisterChanging(ssize_t size) {
       });
 }
 
+/// Strings of 10 units, which the standard ones hold without an allocation if they are of bytes.
+template <class T> void RegisterShortStrings() {
+  static const auto theirs = StdOf<T>("ten units.");
+  static const auto ours = OurOf<T>(theirs);
+  const auto pair = [](const char* work, const char* data, std::size_t count, auto ourWork, auto theirWork) {
+    Case("Short strings", work, data, count, std::string("strings of 10 ") + Width<T>::kUnit)
+        .Ours(ourWork)
+        .Against(Width<T>::kPeer, theirWork);
+  };
+  const auto each = [pair](const char* work, auto workWith) {
+    pair(
+        work, "of one, and destruction", 1, [workWith] { return workWith(ours); },
+        [workWith] { return workWith(theirs); });
+  };
+  each("construction", [](auto& s) {
+    std::decay_t<decltype(s)> made(s.data(), s.size());
+    benchmark::DoNotOptimize(made);
+    return made.size();
+  });
+  each("copy construction", [](auto& s) {
+    std::decay_t<decltype(s)> made(s);
+    benchmark::DoNotOptimize(made);
+    return made.size();
+  });
+  each("copy and c_str()", [](auto& s) {
+    std::decay_t<decltype(s)> made(s);
+    benchmark::DoNotOptimize(made.c_str());
+    return made.size();
+  });
+  each("substr of 5 units", [](auto& s) {
+    auto made = s.substr(2, 5);
+    benchmark::DoNotOptimize(made);
+    return made.size();
+  });
+
+  // 1,000 strings that differ in their middle, in no order.
+  constexpr std::size_t kCount = 1000;
+  static std::vector<StdString<T>> theirWords;
+  static std::vector<mirel::basic_xstring<T>> ourWords;
+  for (std::size_t i = 0; i < kCount; ++i) {
+    theirWords.push_back(StdOf<T>("w" + std::to_string(1000000 + i * 7919 % kCount) + ".."));
+    ourWords.push_back(OurOf<T>(theirWords.back()));
+  }
+  const auto less = [](const auto& a, const auto& b) {
+    if constexpr (std::is_same_v<decltype(a), const StdString<T>&>)
+      return a < b;
+    else
+      return a._Lt(b);
+  };
+  const auto grow = [](auto& words) {
+    std::decay_t<decltype(words)> grown;
+    for (const auto& word : words)
+      grown.push_back(word);
+    return grown.size();
+  };
+  const auto sort = [less](auto& words) {
+    auto sorted = words;
+    std::sort(sorted.begin(), sorted.end(), less);
+    return sorted[kCount / 2][7];
+  };
+  const auto insert = [less](auto& words) {
+    std::map<std::decay_t<decltype(words[0])>, int, decltype(less)> counts(less);
+    for (const auto& word : words)
+      ++counts[word];
+    return counts.size();
+  };
+  const auto all = [pair](const char* work, const char* data, auto workWith) {
+    pair(
+        work, data, kCount, [workWith] { return workWith(ourWords); },
+        [workWith] { return workWith(theirWords); });
+  };
+  all("push_back of strings", "std::vector, from empty", grow);
+  all("copy and sort", "std::vector", sort);
+  all("insertion of keys", "std::map, from empty", insert);
+}
+
 } // namespace
 
 void RegisterEdits() {
+  RegisterShortStrings<char8>();
+  RegisterShortStrings<char16>();
   for (const ssize_t count : {1000, 200000}) {
     RegisterBuilding<char8>(count);
     RegisterBuilding<char16>(count);

@@ -1,6 +1,10 @@
-// Searches and comparisons, in English-like text of lower-case words.
-#include "Cases.h"
+// Searches and comparisons, in English-like text of lower-case words and its like in other scripts.
+#include "Library.h"
+#include "Simdutf.h"
 
+#include <algorithm>
+#include <cstdint>
+#include <cstring>
 #include <random>
 
 #ifdef HAVE_QT
@@ -10,9 +14,7 @@
 
 namespace {
 
-constexpr std::size_t kNpos = std::string::npos;
-
-/// Words of the letters of English at about their frequencies; q stands alone about once in 1,000 units.
+/// Words of the letters of English at about their frequencies; q occurs about once in 1,000 units.
 std::string Words(std::size_t size) {
   static const std::string kLetters =
       "eeeeeeeeeeeetttttttttaaaaaaaaooooooooiiiiiiinnnnnnnsssssshhhhhhrrrrrrddddllllcccuuu"
@@ -24,101 +26,255 @@ std::string Words(std::size_t size) {
   return text;
 }
 
-template <class T> struct Texts {
-  explicit Texts(const std::string& text) : ours(OurOf<T>(text)), theirs(StdOf<T>(text)) {}
-  mirel::basic_xstring<T> ours;
-  StdString<T> theirs;
-};
+/// Cases live as long as the program, and so does what they work on.
+template <class T> const StdString<T>& Kept(const StdString<T>& text) { return *new StdString<T>(text); }
+template <class T> const StdString<T>& KeptOf(const std::string& text) { return Kept<T>(StdOf<T>(text)); }
 
-/// One search for one thing by both.
-template <class T, class Ours, class Theirs>
-auto Pair(const std::string& work, const std::string& data, std::size_t size, Ours ours, Theirs theirs) {
-  return Case(CaseName(work, data, static_cast<ssize_t>(size), Width<T>::kBits), ours)
-      .Against(Width<T>::kPeer, theirs);
+/// A pointer as an index, null as for nothing.
+template <class Unit> long long IndexOf(const std::basic_string<Unit>& text, const void* at) {
+  return at ? static_cast<const Unit*>(at) - text.data() : -1;
 }
 
-template <class T> void RegisterSearchesIn(std::size_t size) {
-  // The cases live as long as the program, and so do their texts.
-  const auto& text = *new Texts<T>(Words(size));
-  const auto& equal = *new Texts<T>(Words(size));
-  const auto search = [&, size](const std::string& work, const std::string& data, const std::string& what,
-                                const Texts<T>& in, auto ours, auto theirs) {
-    const auto& pattern = *new Texts<T>(what);
-    return Pair<T>(
-        work, data, size, [&in, &pattern, ours] { return ours(in.ours, pattern.ours); },
-        [&in, &pattern, theirs] { return static_cast<ssize_t>(theirs(in.theirs, pattern.theirs)); });
-  };
-  const auto find = [](auto& s, auto& p) { return s.find(p); };
-  const auto rfind = [](auto& s, auto& p) { return s.rfind(p); };
-  const auto firstOf = [](auto& s, auto& p) { return s.find_first_of(p.data(), 0, p.size()); };
-  const auto lastOf = [](auto& s, auto& p) {
-    return s.find_last_of(p.data(), decltype(p.size())(-1), p.size());
-  };
-  const auto firstNotOf = [](auto& s, auto& p) { return s.find_first_not_of(p.data(), 0, p.size()); };
-  const auto lastNotOf = [](auto& s, auto& p) {
-    return s.find_last_not_of(p.data(), decltype(p.size())(-1), p.size());
-  };
-  const auto findUnit = [](auto& s, auto& p) { return s.find(p[0]); };
-  const auto rfindUnit = [](auto& s, auto& p) { return s.rfind(p[0]); };
+/// A size as an index, the whole size as for nothing.
+long long IndexOf(const std::string& text, std::size_t size) {
+  return size == text.size() ? -1 : static_cast<long long>(size);
+}
 
-  auto forward = search("find(c)", "absent", "Z", text, findUnit, findUnit);
-  search("rfind(c)", "absent", "Z", text, rfindUnit, rfindUnit);
-  auto frequent = search("find(run)", "first letter frequent, absent", "ethnologist", text, find, find);
-  auto rare = search("find(run)", "first letter rare, absent", "quaternary", text, find, find);
-  search("rfind(run)", "first letter frequent, absent", "ethnologist", text, rfind, rfind);
-  search("rfind(run)", "first letter rare, absent", "quaternary", text, rfind, rfind);
+template <class T>
+Party OurSearch(const Library& library, Op op, const StdString<T>& text, const StdString<T>& what) {
+  if constexpr (sizeof(T) == 1)
+    return library.search8(op, text, what);
+  else
+    return library.search16(op, text, what);
+}
+
+/// One search by us, by the standard string, and if it is short or isBesideBefore by the earlier version.
+template <class T>
+Case Search(Op op, const std::string& work, const std::string& data, const StdString<T>& text,
+            const StdString<T>& what, bool isBesideBefore = false) {
+  Case search(Width<T>::kArea, work, data, text.size(), Width<T>::kUnit);
+  AddLibrary(search, isBesideBefore || text.size() <= 64,
+             [&](const Library& library) { return OurSearch<T>(library, op, text, what); });
+  return search.Against(Width<T>::kPeer, Searching(op, text, what));
+}
+
+/// The unit, which isn't there.
+template <class T> void RegisterUnit(const StdString<T>& text) {
+  const auto& unit = KeptOf<T>("Z");
+  Case find = Search<T>(Op::kFindUnit, "find(c)", "absent", text, unit);
+  Case rfind = Search<T>(Op::kRfindUnit, "rfind(c)", "absent", text, unit);
+  if constexpr (sizeof(T) == 1) {
+    find.Against("memchr", [&] { return IndexOf(text, std::memchr(text.data(), 'Z', text.size())); });
+    rfind.Against("memrchr", [&] { return IndexOf(text, ::memrchr(text.data(), 'Z', text.size())); });
+  }
+#ifdef HAVE_SIMDUTF
+  if constexpr (sizeof(T) == 2)
+    for (const SimdutfParty& party : Simdutf())
+      find.Against(party.first, [&text, kernels = party.second] {
+        const char16_t* const end = text.data() + text.size();
+        const char16_t* const at = kernels->find(text.data(), end, u'Z');
+        return IndexOf(text, at == end ? nullptr : at);
+      });
+#endif
 #ifdef HAVE_QT
-  if constexpr (sizeof(T) == 2) {
-    const auto& qt = *new QString(reinterpret_cast<const QChar*>(text.theirs.data()), qsizetype(size));
-    forward.Against("QString", [&qt] { return qt.indexOf(u'Z'); });
-    frequent.Against("QString", [&qt] { return qt.indexOf(u"ethnologist"); });
-    rare.Against("QString", [&qt] { return qt.indexOf(u"quaternary"); });
+  if constexpr (sizeof(T) == 1) {
+    const auto& qt = *new QByteArray(text.data(), qsizetype(text.size()));
+    find.Against("QByteArray", [&qt] { return qt.indexOf('Z'); });
   } else {
-    const auto& qt = *new QByteArray(text.theirs.data(), qsizetype(size));
-    forward.Against("QByteArray", [&qt] { return qt.indexOf('Z'); });
-    frequent.Against("QByteArray", [&qt] { return qt.indexOf("ethnologist"); });
-    rare.Against("QByteArray", [&qt] { return qt.indexOf("quaternary"); });
+    const auto& qt = *new QString(reinterpret_cast<const QChar*>(text.data()), qsizetype(text.size()));
+    find.Against("QString", [&qt] { return qt.indexOf(u'Z'); });
   }
 #endif
-  if (size >= 200) {
-    const auto& endsWithRun = *new Texts<T>(Words(size - 11) + "ethnologist");
-    search("find(run)", "first letter frequent, at the end", "ethnologist", endsWithRun, find, find);
-  }
-  for (const char* set : {"ZX", "ZXJQKWVY"}) {
-    const std::string data = "set of " + std::to_string(std::string(set).size()) + ", absent";
-    search("find_first_of", data, set, text, firstOf, firstOf);
-    search("find_last_of", data, set, text, lastOf, lastOf);
-  }
-  const auto& members = *new Texts<T>([&] {
-    std::string all = Words(size); // only of the 18 units of the set
-    for (char& c : all)
-      if (std::string("fgypbvkq").find(c) != kNpos)
-        c = 'e';
-    return all;
-  }());
-  const char* const set18 = "zxetaoinshrdlcumw ";
-  search("find_first_not_of", "set of 18, all members", set18, members, firstNotOf, firstNotOf);
-  search("find_last_not_of", "set of 18, all members", set18, members, lastNotOf, lastNotOf);
+}
 
-  Pair<T>(
-      "compare", "equal", size, [&] { return text.ours.compare(equal.ours); },
-      [&] { return text.theirs.compare(equal.theirs); });
-  Pair<T>(
-      "_Eq", "equal", size, [&] { return text.ours._Eq(equal.ours); },
-      [&] { return text.theirs == equal.theirs; });
-  Pair<T>(
-      "[]", "all elements", size,
+template <class T>
+void RegisterNeedle(const StdString<T>& text, const std::string& needle, const char* first) {
+  const std::string data = std::to_string(needle.size()) + " units, first one " + first;
+  const auto& what = KeptOf<T>(needle);
+  Case find = Search<T>(Op::kFind, "find(needle)", data + ", absent", text, what);
+  Search<T>(Op::kRfind, "rfind(needle)", data + ", absent", text, what);
+  if constexpr (sizeof(T) == 1)
+    find.Against("memmem",
+                 [&] { return IndexOf(text, ::memmem(text.data(), text.size(), what.data(), what.size())); });
+  if (needle.size() != 12)
+    return;
+#ifdef HAVE_QT
+  if constexpr (sizeof(T) == 1) {
+    const auto& qt = *new QByteArray(text.data(), qsizetype(text.size()));
+    find.Against("QByteArray", [&] { return qt.indexOf(what.c_str()); });
+  } else {
+    const auto& qt = *new QString(reinterpret_cast<const QChar*>(text.data()), qsizetype(text.size()));
+    find.Against("QString", [&] { return qt.indexOf(QStringView(what.data(), qsizetype(what.size()))); });
+  }
+#endif
+  StdString<T> end = text;
+  std::copy(what.begin(), what.end(), end.end() - 12);
+  Search<T>(Op::kFind, "find(needle)", data + ", at the end", Kept<T>(end), what);
+}
+
+/// Members that don't occur; in both directions where the set is of ASCII.
+template <class T>
+void RegisterSet(const StdString<T>& text, const StdString<T>& set, const std::string& members) {
+  const std::string data = "set of " + std::to_string(set.size()) + members + ", absent";
+  const auto& kept = Kept<T>(set);
+  const bool isBesideBefore = sizeof(T) == 2 && set.size() == 40;
+  Case first = Search<T>(Op::kFirstOf, "find_first_of", data, text, kept, isBesideBefore);
+  if constexpr (sizeof(T) == 1)
+    first.Against("strcspn", [&] { return IndexOf(text, std::strcspn(text.c_str(), kept.c_str())); });
+  if (members.empty())
+    Search<T>(Op::kLastOf, "find_last_of", data, text, kept, isBesideBefore);
+}
+
+template <class T> void RegisterComplement(const StdString<T>& text, const StdString<T>& set) {
+  const std::string data = "set of " + std::to_string(set.size()) + ", all members";
+  Case first = Search<T>(Op::kFirstNotOf, "find_first_not_of", data, text, set);
+  if constexpr (sizeof(T) == 1)
+    first.Against("strspn", [&] { return IndexOf(text, std::strspn(text.c_str(), set.c_str())); });
+  Search<T>(Op::kLastNotOf, "find_last_not_of", data, text, set);
+}
+
+template <class T> void RegisterComparisons(const StdString<T>& text) {
+  const auto& other = Kept<T>(text);
+  const auto& ours = *new mirel::basic_xstring<T>(OurOf<T>(text));
+  const auto& ourOther = *new mirel::basic_xstring<T>(ours);
+  const auto pair = [&](const char* work, const char* data, auto ourWork, auto theirWork) {
+    Case(Width<T>::kArea, work, data, text.size(), Width<T>::kUnit)
+        .Ours(ourWork)
+        .Against(Width<T>::kPeer, theirWork);
+  };
+  pair(
+      "compare", "equal", [&] { return ours.compare(ourOther); }, [&] { return text.compare(other); });
+  pair(
+      "_Eq", "equal", [&] { return ours._Eq(ourOther); }, [&] { return text == other; });
+  pair(
+      "[]", "all elements",
       [&] {
         unsigned sum = 0;
-        for (ssize_t i = 0; i < text.ours.size(); ++i)
-          sum += static_cast<unsigned>(text.ours[i]);
+        for (ssize_t i = 0; i < ours.size(); ++i)
+          sum += static_cast<unsigned>(ours[i]);
         return sum;
       },
       [&] {
         unsigned sum = 0;
-        for (std::size_t i = 0; i < text.theirs.size(); ++i)
-          sum += static_cast<unsigned>(text.theirs[i]);
+        for (std::size_t i = 0; i < text.size(); ++i)
+          sum += static_cast<unsigned>(text[i]);
         return sum;
+      });
+}
+
+const std::string& Set40() {
+  static const std::string kSet = "0123456789ABCDEFGHIJKLMNOPQRSTUVWXYZ.,;:";
+  return kSet;
+}
+
+template <class T> void RegisterSearchesIn(std::size_t size) {
+  const auto& text = KeptOf<T>(Words(size));
+  RegisterUnit<T>(text);
+  RegisterNeedle<T>(text, "ejt", "frequent");
+  RegisterNeedle<T>(text, "qjt", "rare");
+  if (size >= 64) {
+    RegisterNeedle<T>(text, "ethnologists", "frequent");
+    RegisterNeedle<T>(text, "quaternaries", "rare");
+    RegisterNeedle<T>(text, "ethnologists in the north tell old tales", "frequent");
+    RegisterNeedle<T>(text, "quaternaries in the north hold old tales", "rare");
+  }
+  for (const char* set : {"ZX", "ZXJW", "ZXJQKWVY"})
+    RegisterSet<T>(text, StdOf<T>(set), "");
+  RegisterSet<T>(text, StdOf<T>(Set40()), "");
+
+  std::string members = Words(size);
+  for (char& c : members) // only those of the set of 18
+    if (std::strchr("fgypbvkq", c))
+      c = 'e';
+  RegisterComplement<T>(KeptOf<T>(members), KeptOf<T>("zxetaoinshrdlcumw "));
+  std::string printable = "\n";
+  for (char c = ' '; c <= '~'; ++c)
+    printable += c;
+  RegisterComplement<T>(text, KeptOf<T>(printable));
+  RegisterComparisons<T>(text);
+}
+
+/// Sets of one script and of several, in a text of the same scripts.
+void RegisterScripts(std::size_t size) {
+  std::u16string cyrillic, mixed;
+  int word = 0;
+  for (const char c : Words(size)) {
+    const auto letter = static_cast<char16_t>(c - 'a');
+    cyrillic += c == ' ' ? u' ' : char16_t(u'\u0430' + letter);
+    const char16_t scripts[] = {u'a', u'\u03B1', u'\u0430', u'\u4E00'}; // by words
+    mixed += c == ' ' ? u' ' : char16_t(scripts[word % 4] + letter);
+    word += c == ' ';
+  }
+  const auto& cyrillicText = Kept<char16>(cyrillic);
+  const auto& mixedText = Kept<char16>(mixed);
+  for (const int count : {4, 40}) {
+    std::u16string ofOne, ofAll;
+    for (int i = 0; i < count; ++i) {
+      ofOne += char16_t(u'\u0460' + i);
+      const char16_t scripts[] = {u'A', u'\u0391', u'\u0460', u'\u5000'};
+      ofAll += char16_t(scripts[i % 4] + i / 4);
+    }
+    RegisterSet<char16>(cyrillicText, ofOne, " of Cyrillic");
+    RegisterSet<char16>(mixedText, ofAll, " of four scripts");
+  }
+}
+
+/// Every fifth unit is one of the set: what is prepared for a search must be worth it at once.
+template <class T> void RegisterSplitting(std::size_t size) {
+  for (const std::string set : {" ,.;", " ,.;:!?()-\n\t"}) {
+    std::string words;
+    for (std::size_t i = 0; i < size; ++i)
+      words += i % 5 == 4 ? set[i / 5 % set.size()] : 'a';
+    const auto& text = KeptOf<T>(words);
+    const auto& kept = KeptOf<T>(set);
+    const std::string data = "set of " + std::to_string(set.size()) + ", a hit at every fifth unit";
+    Case split = Search<T>(Op::kSplit, "splitting", data, text, kept, true);
+    if constexpr (sizeof(T) == 1)
+      split.Against("strcspn", [&] {
+        long long hits = 0;
+        for (const char* at = text.c_str(); *(at += std::strcspn(at, kept.c_str())) != '\0'; ++at)
+          ++hits;
+        return hits;
+      });
+  }
+}
+
+/// What takes the product of two sizes unless something is done about it.
+void RegisterWorstCases() {
+  const auto& text = Kept<char8>(std::string(1 << 20, 'a'));
+  const std::string many((1 << 18) - 2, 'a');
+  const auto& forward = Kept<char8>(many + "ba");
+  const auto& backward = Kept<char8>("ab" + many);
+  const std::string data = "needle of 256 Ki units, all but one as in the haystack";
+  Case("Worst cases", "find(needle)", data, text.size(), "bytes")
+      .Against("ours", kOurs.search8(Op::kFind, text, forward))
+      .Against("memmem", [&] {
+        return IndexOf(text, ::memmem(text.data(), text.size(), forward.data(), forward.size()));
+      });
+  Case("Worst cases", "rfind(needle)", data, text.size(), "bytes")
+      .Against("ours", kOurs.search8(Op::kRfind, text, backward))
+      .Against("our find", kOurs.search8(Op::kFind, text, forward));
+
+  // Even units are members, odd ones are searched.
+  std::mt19937 random(13);
+  std::u16string set, odd;
+  for (int i = 0; i < 10000; ++i)
+    set += char16_t(0x4E00 + 2 * i);
+  std::shuffle(set.begin(), set.end(), random);
+  while (odd.size() < std::size_t(1) << 19)
+    odd += char16_t(0x4E01 + 2 * (random() % 10000));
+  const auto& haystack = Kept<char16>(odd);
+  const auto& members = Kept<char16>(set);
+  Case("Worst cases", "find_first_of", "set of 10,000, absent", haystack.size(), "16-bit units")
+      .Against("ours", kOurs.search16(Op::kFirstOf, haystack, members))
+      .Against("a bitmap loop", [&]() -> long long {
+        std::uint8_t bits[1 << 13] = {};
+        for (const char16_t unit : members)
+          bits[unit >> 3] = static_cast<std::uint8_t>(bits[unit >> 3] | 1 << (unit & 7));
+        for (std::size_t i = 0; i < haystack.size(); ++i)
+          if ((bits[haystack[i] >> 3] >> (haystack[i] & 7) & 1) != 0)
+            return static_cast<long long>(i);
+        return -1;
       });
 }
 
@@ -126,8 +282,14 @@ template <class T> void RegisterSearchesIn(std::size_t size) {
 
 void RegisterSearches() {
   for (const std::size_t size :
-       {std::size_t(12), std::size_t(200), std::size_t(1) << 16, std::size_t(4) << 20}) {
+       {std::size_t(12), std::size_t(64), std::size_t(1000), std::size_t(1) << 16, std::size_t(4) << 20}) {
     RegisterSearchesIn<char8>(size);
     RegisterSearchesIn<char16>(size);
+    RegisterScripts(size);
+    if (size <= std::size_t(1) << 16) {
+      RegisterSplitting<char8>(size);
+      RegisterSplitting<char16>(size);
+    }
   }
+  RegisterWorstCases();
 }

@@ -1,10 +1,13 @@
-// Sentences in ten kinds of text, from which the benchmarks make longer ones.
+// Sentences in fifteen kinds of text, from which the benchmarks make longer ones.
 
 #pragma once
 
+#include <cstddef>
 #include <random>
 #include <string>
 #include <vector>
+
+#include <boost/locale/encoding_utf.hpp>
 
 struct Language {
   const char* name;
@@ -60,6 +63,30 @@ inline const std::vector<Language>& Languages() {
       {"emoji",
        {"See you at the port ⛵🌊🐟 ", "🎉🎉🎉 happy birthday 🥳🎂🕯️ ", "👍🏽 ok 😀😅 ",
         "🏠➡️🚲➡️🌅 ", "👩‍🍳🥐☕😋 yes! "}},
+      {"chat",
+       {"Running ten minutes late, the bus is stuck behind a tractor again 🚜 sorry! ",
+        "Did you remember the tickets? They should be in the blue folder. ",
+        "Haha no way 😂 tell me everything tonight, I will bring the soup. ", "ok see you there 👍 ",
+        "The garden looks lovely after all that rain, thanks for watering 🌱 "}},
+      {"Arabic",
+       {"تغادر العبّارة في الساعة السابعة ولا ينتظر أحد المتأخرين. ",
+        "بعد العاصفة امتلأ الشاطئ بالخشب والأعشاب. ", "اشترى خريطة للجزيرة ومصباحا ورغيفين من الخبز. ",
+        "هطل المطر طوال العصر بهدوء ولم يتوقف. ", "تحب الجدة أن تحكي عن السنوات التي عاشتها قرب النهر. "}},
+      {"Thai",
+       {"เรือข้ามฟากออกตอนเจ็ดโมง และไม่มีใครรอคนที่มาสาย ", "หลังพายุผ่านไป ชายหาดเต็มไปด้วยเศษไม้และสาหร่าย ",
+        "เขาซื้อแผนที่ของเกาะ ตะเกียงหนึ่งดวง และขนมปังสองก้อน ", "ฝนตกเบาๆตลอดบ่ายโดยไม่หยุดเลย ",
+        "คุณยายชอบเล่าเรื่องสมัยที่อยู่ริมแม่น้ำ "}},
+      {"markup",
+       {"<p class=\"lead\">Το πλοίο φεύγει στις επτά και κανείς δεν περιμένει.</p>\n",
+        "<li><a href=\"/karta.html\" title=\"Χάρτης\">Ο χάρτης του νησιού</a></li>\n",
+        "<h2 id=\"kairos\">Ο καιρός σήμερα</h2>\n<br>\n",
+        "<td align=\"right\">12</td><td>ψωμί &amp; τυρί</td>\n",
+        "<img src=\"limani.jpg\" alt=\"Το λιμάνι μετά τη θύελλα\" width=\"640\">\n"}},
+      {"source",
+       {"  // 港に着いた船を数える\n  for (const auto& ship : ships)\n    count += ship.arrived;\n",
+        "  if (tide < kLowest) return false; // 浅すぎる\n", "/* 灯台の光は二十秒ごとに見える */\n",
+        "static double Distance(Point a, Point b) { return std::hypot(a.x - b.x, a.y - b.y); }\n",
+        "  log << \"出港: \" << ship.name << '\\n';\n\n"}},
   };
   return kLanguages;
 }
@@ -71,4 +98,32 @@ inline std::string TextIn(const Language& language, std::size_t size) {
   while (text.size() < size)
     text += language.sentences[random() % language.sentences.size()];
   return text;
+}
+
+inline bool IsInsideCodePoint(char unit) { return (unit & 0xC0) == 0x80; }
+inline bool IsInsideCodePoint(char16_t unit) { return unit >= 0xDC00 && unit <= 0xDFFF; }
+
+/// The boundary of code points that is nearest to an index of the text.
+template <class Unit> std::size_t BoundaryNear(const std::basic_string<Unit>& text, std::size_t index) {
+  for (std::size_t distance = 0;; ++distance)
+    for (const std::size_t at : {index - distance, index + distance})
+      if (at >= text.size() || !IsInsideCodePoint(text[at]))
+        return at;
+}
+
+/// Texts of about size units: one, or where it would be short eight from different places, since few units
+/// may have little of what makes the language.
+template <class Unit>
+std::vector<std::basic_string<Unit>> TextsIn(const Language& language, std::size_t size) {
+  constexpr std::size_t kStep = 97;
+  const std::size_t count = size < 100 ? 8 : 1;
+  const std::size_t units = size + kStep * count; // with no more than three bytes for each
+  const auto text =
+      boost::locale::conv::utf_to_utf<Unit>(TextIn(language, sizeof(Unit) == 1 ? units : 3 * units));
+  std::vector<std::basic_string<Unit>> texts;
+  for (std::size_t i = 0; i < count; ++i) {
+    const std::size_t begin = BoundaryNear(text, i * kStep);
+    texts.push_back(text.substr(begin, BoundaryNear(text, begin + size) - begin));
+  }
+  return texts;
 }

@@ -63,7 +63,7 @@ def measure(transcode, source, target, path, directory, repetitions):
 
 def main():
     transcode = str(pathlib.Path(sys.argv[1]).resolve())
-    size = int(sys.argv[2] if len(sys.argv) > 2 else 100) * 1000 * 1000
+    size = int(sys.argv[2] if len(sys.argv) > 2 else 40) * 1000 * 1000
     repetitions = int(sys.argv[3] if len(sys.argv) > 3 else 9)
     print("# transcode beside iconv\n")
     print(f"The C library's iconv command's time divided by ours, on {size // 10**6} MB of each text, {repetitions} "

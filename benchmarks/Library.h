@@ -1,0 +1,76 @@
+// What the library does in the cases that an earlier version of it may take part in as well.
+
+#pragma once
+
+#include "Cases.h"
+
+/// A search through a haystack for a needle, for its first unit, or for the members of a set. Splitting looks
+/// for every occurrence of a member in turn.
+enum class Op { kFindUnit, kRfindUnit, kFind, kRfind, kFirstOf, kLastOf, kFirstNotOf, kLastNotOf, kSplit };
+
+/// Works for our strings and the standard ones, which live as long as the program.
+template <class String> Party Searching(Op op, const String& s, const String& what) {
+  using Size = decltype(s.size());
+  constexpr Size kLast = static_cast<Size>(-1);
+  switch (op) {
+  case Op::kFindUnit: return Of([&s, unit = what[0]] { return s.find(unit); });
+  case Op::kRfindUnit: return Of([&s, unit = what[0]] { return s.rfind(unit); });
+  case Op::kFind: return Of([&s, &what] { return s.find(what); });
+  case Op::kRfind: return Of([&s, &what] { return s.rfind(what); });
+  case Op::kFirstOf: return Of([&s, &what] { return s.find_first_of(what.data(), 0, what.size()); });
+  case Op::kLastOf: return Of([&s, &what] { return s.find_last_of(what.data(), kLast, what.size()); });
+  case Op::kFirstNotOf: return Of([&s, &what] { return s.find_first_not_of(what.data(), 0, what.size()); });
+  case Op::kLastNotOf: return Of([&s, &what] { return s.find_last_not_of(what.data(), kLast, what.size()); });
+  case Op::kSplit: break;
+  }
+  return Of([&s, &what] {
+    long long words = 0;
+    for (Size at = 0; (at = s.find_first_of(what.data(), at, what.size())) != kLast; ++at)
+      ++words;
+    return words;
+  });
+}
+
+/// The parts of a malformed text that begin with the indices given and reach to its end.
+struct Malformed {
+  std::string text;
+  std::vector<std::size_t> starts;
+};
+
+/// How many parts the conversion reports as malformed, given a pointer and a size.
+template <class IsMalformed> Party Reporting(const Malformed& malformed, IsMalformed isMalformed) {
+  return Of([&malformed, isMalformed] {
+    const std::string& text = malformed.text;
+    int reports = 0;
+    for (const std::size_t start : malformed.starts)
+      reports += isMalformed(text.data() + start, text.size() - start);
+    return reports;
+  });
+}
+
+/// One version of the library. What its functions are given lives as long as the program. A conversion goes
+/// into a string that is used again, or into a new one, of which c_str() is then asked.
+struct Library {
+  Party (*search8)(Op op, const std::string& text, const std::string& what);
+  Party (*search16)(Op op, const std::u16string& text, const std::u16string& what);
+  Party (*toUtf16)(const std::vector<std::string>& texts, bool isFresh);
+  Party (*toUtf8)(const std::vector<std::u16string>& texts, bool isFresh);
+  Party (*reportMalformed)(const Malformed& malformed);
+};
+
+extern const Library kOurs;
+#ifdef HAVE_BEFORE
+extern const Library kBefore;
+#endif
+
+/// Adds this library to a case, and where isBesideBefore the earlier version.
+template <class Make> Case& AddLibrary(Case& to, bool isBesideBefore, Make make) {
+  to.Against("ours", make(kOurs));
+#ifdef HAVE_BEFORE
+  if (isBesideBefore)
+    to.Against("earlier version", make(kBefore));
+#else
+  static_cast<void>(isBesideBefore);
+#endif
+  return to;
+}

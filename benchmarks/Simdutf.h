@@ -1,0 +1,33 @@
+// The two sets of simdutf's kernels that take part.
+
+#pragma once
+
+#ifdef HAVE_SIMDUTF
+#include <string>
+#include <utility>
+#include <vector>
+
+#include <simdutf.h>
+#include <utils/Kernels.h>
+
+using SimdutfParty = std::pair<std::string, const simdutf::implementation*>;
+
+/// simdutf's kernels for the instructions that ours use, where there are such, and its best ones on this
+/// processor.
+inline const std::vector<SimdutfParty>& Simdutf() {
+  static const auto kParties = [] {
+    const std::string ours = mirel::KernelName();
+    const char* const same = ours == "AVX2"   ? "haswell"
+                             : ours == "SSE4" ? "westmere"
+                             : ours == "NEON" ? "arm64"
+                                              : "fallback";
+    const auto& all = simdutf::get_available_implementations();
+    std::vector<SimdutfParty> parties;
+    if (const auto* const kernels = all[same]; kernels && kernels->supported_by_runtime_system())
+      parties.emplace_back("simdutf, same level", kernels);
+    parties.emplace_back("simdutf, best", all.detect_best_supported());
+    return parties;
+  }();
+  return kParties;
+}
+#endif
