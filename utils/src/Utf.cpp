@@ -3,6 +3,7 @@
 // Kernels convert what is well-formed, straight into the destination's storage. What they don't take, and all
 // text on processors without kernels, goes through the traits of Boost, one code point at a time.
 
+#include <utils/Storage.h>
 #include <utils/xstring.h>
 
 #include <algorithm>
@@ -14,19 +15,6 @@
 #include "KernelTable.h"
 
 namespace mirel {
-
-/// Sets what follows from having written into unused capacity. Callers of the library can't do this.
-struct detail::Storage {
-  /// Makes the first size elements of the storage the contents; they have been written.
-  template <class T> static void SetSize(xvector<T>& v, ssize_t size) {
-    v.m_buffer.size_ = size * ssize_t(sizeof(T));
-  }
-  /// Gives back what is more than capacity elements, of which there are at least as many as v has.
-  template <class T> static void GiveBack(xvector<T>& v, ssize_t capacity) {
-    if (capacity < v.capacity())
-      v.m_buffer.Shrink(capacity * ssize_t(sizeof(T)));
-  }
-};
 
 namespace {
 
