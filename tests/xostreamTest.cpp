@@ -1,7 +1,11 @@
 #include "Support.h"
 
+#include <algorithm>
 #include <locale>
+#include <numeric>
+#include <random>
 #include <stdexcept>
+#include <vector>
 
 #include <utils/xostream.h>
 
@@ -9,16 +13,17 @@ using namespace mirel;
 
 namespace {
 
+/// Takes all bytes of a call, or throws and takes none.
 struct Sink : IOutputStream {
   void WriteStream(const void* address, ssize_t count) override {
-    if (broken)
+    EXPECT_GT(count, 0);
+    if (calls++ == failing)
       throw std::runtime_error("full");
     text.append(static_cast<const char*>(address), static_cast<std::size_t>(count));
   }
   void FlushStream() override { ++flushes; }
   std::string text;
-  int flushes = 0;
-  bool broken = false;
+  int calls = 0, failing = -1, flushes = 0;
 };
 
 TEST(XOStream, WritesStringsAsTheyAre) {
@@ -47,6 +52,7 @@ TEST(XOStream, FormatsValues) {
   EXPECT_EQ(put(3.14159) + put(2.5f) + put(1e30L), "3.142.51e+30");
   EXPECT_EQ(put("text") + put("text", 2) + put(reinterpret_cast<const void*>(0x1A)), "textte0x1a");
   EXPECT_EQ(put(L'\u00E9') + put(u'\u20AC') + put(U'\U0001F600'), "\u00E9\u20AC\U0001F600");
+  EXPECT_EQ(put(L'\uFFFF') + put(u'\uFFFF') + put(U'\uFFFF'), "\uFFFF\uFFFF\uFFFF");
   for (const char32_t c : {0xD800u, 0x110000u, 0x4010000u, 0xFFFFFFFFu})
     EXPECT_EQ(put(c) + put(static_cast<wchar_t>(c)), "\uFFFD\uFFFD");
   os.width(3);
@@ -66,7 +72,7 @@ TEST(XOStream, KeepsToTheClassicLocale) {
   EXPECT_EQ(sink.text, "1234567");
 }
 
-TEST(XOStream, IndentsAndCloses) {
+TEST(XOStream, IndentsWhatFollowsANewline) {
   Sink sink;
   xostream os(sink);
   os.Indent(18);
@@ -78,18 +84,92 @@ TEST(XOStream, IndentsAndCloses) {
   const std::string spaces(18, ' ');
   EXPECT_EQ(sink.text, "a\n" + spaces + "b\n 5\n " + std::string(1, '\0'));
   EXPECT_EQ(sink.flushes, 1);
-  sink.broken = true;
-  EXPECT_THROW(os << "x", std::runtime_error);
-  EXPECT_THROW(os.put(1), std::runtime_error);
-  sink.broken = false;
-  os.put(2);
-  EXPECT_EQ(sink.text.back(), '2');
-  Sink other;
-  xostream closed(other);
-  closed.close();
-  closed << "x";
-  closed.endl();
-  EXPECT_TRUE(other.text.empty() && other.flushes == 1);
+}
+
+TEST(XOStream, WritesNothingOnceClosed) {
+  Sink sink;
+  xostream os(sink);
+  os.close();
+  os << "x", os.put(1), os.endl();
+  EXPECT_EQ(sink.text, "");
+  EXPECT_EQ(sink.flushes, 1);
+}
+
+TEST(XOStream, CallsTheSinkSeldom) {
+  const auto line = [](std::size_t size) { return std::string(size, 'x') + '\n'; };
+  std::string lines;
+  for (int i = 0; i < 20000; ++i)
+    lines += line(4);
+  const struct {
+    std::string text;
+    ssize_t indent, width;
+    int calls;
+  } rows[] = {{lines, 0, 0, 1},
+              {lines, 3, 0, (20000 * 8 - 3) / 512 + 1},
+              {line(100000), 3, 0, 1},
+              {"a\nb\nc", 3, 0, 1},
+              {line(600) + line(600), 3, 0, 3},
+              {"a", 0, 300, 1},
+              {line(400), 0, 511, 1},
+              {line(400), 0, 600, 2},
+              {"", 3, 0, 0}};
+  for (const auto& [text, indent, width, calls] : rows) {
+    Sink sink;
+    xostream os(sink);
+    os.Indent(indent), os.put_internal(text.data(), ssize_t(text.size()), width);
+    EXPECT_EQ(sink.calls, calls) << text.substr(0, 9) << " indented by " << indent << ", in " << width;
+  }
+}
+
+/// What the stream should make of text without spaces.
+std::string Indented(const std::string& text, std::size_t indent) {
+  std::string result;
+  for (const char c : text)
+    result.append(!result.empty() && result.back() == '\n' ? indent : 0, ' ') += c;
+  return result;
+}
+
+TEST(XOStream, IndentsEachLineOnceWhicheverCallThrows) {
+  std::mt19937 random(7);
+  const std::size_t indents[] = {0, 1, 4, 17, 511, 512, 513, 1500}, sizes[] = {1, 3, 40, 600, 2000};
+  for (int round = 0; round < 200; ++round) {
+    std::vector<std::string> texts(1 + random() % 5);
+    for (auto& text : texts)
+      for (auto lines = random() % 6; lines > 0; --lines)
+        text += std::string(random() % sizes[random() % 5], 'x') + (random() % 4 == 0 ? "" : "\n");
+    const std::size_t indent = indents[random() % 8];
+    const std::string all = std::accumulate(texts.begin(), texts.end(), std::string());
+    for (int failing = 0, calls = 0; failing <= calls; ++failing) { // in the last round no call throws
+      Sink sink;
+      sink.failing = failing;
+      xostream os(sink);
+      os.Indent(ssize_t(indent));
+      for (const auto& text : texts)
+        try {
+          os.put(text.data(), ssize_t(text.size()));
+        } catch (const std::runtime_error&) {
+        }
+      calls = sink.calls;
+      sink.failing = -1;
+      os << "end";
+      std::string taken = sink.text;
+      taken.erase(std::remove(taken.begin(), taken.end(), ' '), taken.end());
+      ASSERT_EQ(sink.text, Indented(taken, indent)) << "call " << failing << " has thrown";
+      ASSERT_EQ(taken == all + "end", failing == calls) << taken << "\nof\n" << all;
+    }
+  }
+}
+
+TEST(XOStream, GoesOnAfterAnException) {
+  Sink sink;
+  xostream os(sink);
+  for (const ssize_t width : {0, 600}) { // the longer number fails in the middle
+    sink.failing = sink.calls;
+    os.width(width);
+    EXPECT_THROW(os.put(1), std::runtime_error);
+    os.width(0), os.put(2), os << "x";
+  }
+  EXPECT_EQ(sink.text, "2x2x");
 }
 
 } // namespace

@@ -1,8 +1,8 @@
 /// @file
 /// xostream, the formatted text output stream.
 ///
-/// It formats as the standard library's streams do, in the classic locale, and hands every byte to its sink
-/// at once. It knows no containers: strings write themselves to it.
+/// It formats as the standard library's streams do, in the classic locale, and keeps no byte back: what a
+/// member writes is with the sink when it returns. It knows no containers: strings write themselves to it.
 
 #pragma once
 
@@ -18,9 +18,16 @@ typedef int64 streamsize;
 
 class IndentingOutputStreamToOStream;
 
-/// Writes text to an IOutputStream, which must outlive it. What the sink throws leaves the member that was
-/// called; the next one tries again. Bad arguments stop the process with the text given after "@pre", before
-/// anything is written. One thread at a time may use a stream.
+/// Writes text to an IOutputStream, which must outlive it. Bad arguments stop the process with the text given
+/// after "@pre", before anything is written. One thread at a time may use a stream.
+///
+/// @par Calls of the sink
+/// Text that needs no indent reaches the sink in one call, text with indents in one for each 512 bytes or for
+/// each line that is longer.
+/// @par A sink that throws
+/// ends the member that was called, and its exception goes to the caller. The bytes of the throwing call
+/// count as not written, and what the member had still to write is dropped. The next member calls the sink
+/// again; spaces of an indent that the sink has already taken aren't repeated.
 class MIREL_API xostream {
 public:
   /// A function that does something to a stream, for use with <<.

@@ -1,10 +1,12 @@
 #include <utils/xostream.h>
 
+#include <algorithm>
 #include <cstring>
+#include <limits>
 #include <locale>
 #include <ostream>
 #include <streambuf>
-#include <string_view>
+#include <utility>
 
 #include <utils/Precondition.h>
 #include <utils/xstring.h>
@@ -13,10 +15,14 @@ namespace mirel {
 
 namespace {
 
-/// Hands bytes on without keeping any, with the indent between a newline and the next byte.
+/// Gathers text in a block, with the indent between a newline and the next byte, so that the sink is called
+/// seldom. A long line goes to the sink from where it stands.
 class IndentingBuffer : public std::streambuf {
 public:
   explicit IndentingBuffer(IOutputStream& os) : sink(&os) {}
+
+  /// Hands what has been gathered to the sink: the end of every member that writes.
+  void Deliver() { HandOver(block, filled); }
 
   IOutputStream* sink; ///< null once closed
   ssize_t indent = 0;
@@ -25,37 +31,81 @@ protected:
   int_type overflow(int_type c) override {
     const char byte = traits_type::to_char_type(c);
     xsputn(&byte, 1);
-    return c;
+    return traits_type::not_eof(c);
   }
 
   std::streamsize xsputn(const char* p, std::streamsize n) override {
-    const char* const end = p + n;
-    while (sink && p != end) {
-      if (atLineStart)
-        WriteIndent();
-      const char* const newline = Find(p, end, '\n');
+    for (const char* const end = p + n; p != end;) {
+      AddIndent();
+      const char* const newline = indent == 0 ? end : Find(p, end, '\n');
       const char* const lineEnd = newline == end ? end : newline + 1;
-      atLineStart = newline != end;
-      sink->WriteStream(p, lineEnd - p);
+      Add(p, lineEnd - p);
       p = lineEnd;
     }
     return n;
   }
 
   int sync() override {
-    if (sink)
+    Deliver();
+    if (sink != nullptr)
       sink->FlushStream();
     return 0;
   }
 
 private:
-  void WriteIndent() {
-    static constexpr std::string_view kSpaces = "                ";
-    for (ssize_t n = indent; n > 0; n -= ssize_t(kSpaces.size()))
-      sink->WriteStream(kSpaces.data(), n < ssize_t(kSpaces.size()) ? n : ssize_t(kSpaces.size()));
+  static constexpr ssize_t kBlockSize = 512;
+  static constexpr ssize_t kInLine = std::numeric_limits<ssize_t>::max();
+
+  void AddIndent() {
+    while (gathered < indent) {
+      if (filled == kBlockSize)
+        Deliver();
+      const ssize_t n = std::min(indent - gathered, kBlockSize - filled);
+      std::memset(block + filled, ' ', static_cast<std::size_t>(n));
+      filled += n;
+      gathered += n;
+    }
   }
 
-  bool atLineStart = false;
+  /// Adds text that needs no indent.
+  void Add(const char* p, ssize_t n) {
+    if (n >= kBlockSize) {
+      Deliver();
+      gathered = After(p, n);
+      return HandOver(p, n);
+    }
+    const ssize_t fitting = std::min(n, kBlockSize - filled);
+    Copy(p, fitting);
+    if (fitting < n) {
+      Deliver();
+      Copy(p + fitting, n - fitting);
+    }
+  }
+
+  void Copy(const char* p, ssize_t n) {
+    if (n <= 0)
+      return;
+    std::memcpy(block + filled, p, static_cast<std::size_t>(n));
+    filled += n;
+    gathered = After(p, n);
+  }
+
+  static ssize_t After(const char* p, ssize_t n) { return p[n - 1] == '\n' ? 0 : kInLine; }
+
+  /// Bytes that the sink throws at count as not written: the next ones get the part of the indent that is
+  /// still missing. The bytes themselves are dropped, because the caller learns of them from the exception.
+  void HandOver(const char* p, ssize_t n) {
+    const ssize_t after = std::exchange(gathered, written);
+    filled = 0;
+    if (sink != nullptr && n > 0)
+      sink->WriteStream(p, n);
+    gathered = written = after;
+  }
+
+  char block[kBlockSize];
+  ssize_t filled = 0;
+  ssize_t written = kInLine;  ///< spaces of the line's indent that the sink has; kInLine behind the indent
+  ssize_t gathered = kInLine; ///< the same number after the bytes in the block
 };
 
 } // namespace
@@ -78,12 +128,22 @@ public:
     PutText(text.data(), text.size());
   }
 
-  void PutText(const char* p, ssize_t pn) { *this << std::string_view(p, static_cast<std::size_t>(pn)); }
+  void PutText(const char* p, ssize_t pn) {
+    for (streamsize padded = width(0); padded > pn; --padded)
+      buffer.sputc(' ');
+    PutBytes(p, pn);
+  }
 
-  /// Forgets that the sink has failed: it has been told, and may have recovered.
-  IndentingOutputStreamToOStream& Ready() {
+  void PutBytes(const char* p, ssize_t pn) {
+    buffer.sputn(p, pn);
+    buffer.Deliver();
+  }
+
+  /// Numbers and addresses. A long one may have failed in the middle last time, which the stream remembers.
+  template <class X> void Put(X x) {
     clear();
-    return *this;
+    *this << x;
+    buffer.Deliver();
   }
 
   IndentingBuffer buffer;
@@ -101,46 +161,46 @@ void xostream::close() {
 
 void xostream::write(const xchar* p, ssize_t pn) {
   MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
-  m_os->Ready().write(p, pn);
+  m_os->PutBytes(p, pn);
 }
 void xostream::writebytes(const uint8* p, ssize_t pn) { write(reinterpret_cast<const xchar*>(p), pn); }
 
-void xostream::put(bool x) { m_os->Ready() << x; }
-void xostream::put(char x) { m_os->Ready() << x; }
-void xostream::put(signed char x) { m_os->Ready() << x; }
-void xostream::put(unsigned char x) { m_os->Ready() << x; }
-void xostream::put(wchar_t x) { m_os->Ready().PutCodePoint(static_cast<char32_t>(x)); }
-void xostream::put(char16_t x) { m_os->Ready().PutCodePoint(x); }
-void xostream::put(char32_t x) { m_os->Ready().PutCodePoint(x); }
-void xostream::put(short x) { m_os->Ready() << x; }
-void xostream::put(unsigned short x) { m_os->Ready() << x; }
-void xostream::put(int x) { m_os->Ready() << x; }
-void xostream::put(unsigned int x) { m_os->Ready() << x; }
-void xostream::put(long x) { m_os->Ready() << x; }
-void xostream::put(unsigned long x) { m_os->Ready() << x; }
-void xostream::put(long long x) { m_os->Ready() << x; }
-void xostream::put(unsigned long long x) { m_os->Ready() << x; }
-void xostream::put(float x) { m_os->Ready() << x; }
-void xostream::put(double x) { m_os->Ready() << x; }
-void xostream::put(long double x) { m_os->Ready() << x; }
-void xostream::put(const void* x) { m_os->Ready() << x; }
+void xostream::put(bool x) { m_os->Put(x); }
+void xostream::put(char x) { m_os->PutText(&x, 1); }
+void xostream::put(signed char x) { put(static_cast<char>(x)); }
+void xostream::put(unsigned char x) { put(static_cast<char>(x)); }
+void xostream::put(wchar_t x) { m_os->PutCodePoint(static_cast<char32_t>(x)); }
+void xostream::put(char16_t x) { m_os->PutCodePoint(x); }
+void xostream::put(char32_t x) { m_os->PutCodePoint(x); }
+void xostream::put(short x) { m_os->Put(x); }
+void xostream::put(unsigned short x) { m_os->Put(x); }
+void xostream::put(int x) { m_os->Put(x); }
+void xostream::put(unsigned int x) { m_os->Put(x); }
+void xostream::put(long x) { m_os->Put(x); }
+void xostream::put(unsigned long x) { m_os->Put(x); }
+void xostream::put(long long x) { m_os->Put(x); }
+void xostream::put(unsigned long long x) { m_os->Put(x); }
+void xostream::put(float x) { m_os->Put(x); }
+void xostream::put(double x) { m_os->Put(x); }
+void xostream::put(long double x) { m_os->Put(x); }
+void xostream::put(const void* x) { m_os->Put(x); }
 void xostream::put(ConstString8Z x) {
   MIREL_ASSERT(x);
-  m_os->Ready() << x;
+  m_os->PutText(x, GetStringLength(x));
 }
 void xostream::put(const char8* p, ssize_t pn) { put_internal(p, pn, width()); }
 void xostream::put_internal(const xchar* p, ssize_t pn, ssize_t width) {
   MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
   m_os->width(width);
-  m_os->Ready().PutText(p, pn);
+  m_os->PutText(p, pn);
 }
 
-void xostream::flush() { m_os->Ready().flush(); }
+void xostream::flush() { m_os->buffer.pubsync(); }
 void xostream::endl() {
-  m_os->Ready().put('\n');
+  m_os->PutBytes("\n", 1);
   flush();
 }
-void xostream::ends() { m_os->Ready().put('\0'); }
+void xostream::ends() { m_os->PutBytes("", 1); }
 
 streamsize xostream::precision() const { return m_os->precision(); }
 streamsize xostream::precision(streamsize x) { return m_os->precision(x); }
