@@ -86,7 +86,8 @@ def headers(row):
 
 
 def layout(row):
-    """The layout of the sources, and what clang-tidy finds in them."""
+    """The layout of the sources, what clang-tidy finds in them, and whether the mutants still fit them."""
+    row.run("tools/mutants.py", "--check")
     sources = [path for folder in ("utils", "examples", "tests", "benchmarks")
                for path in sorted((ROOT / folder).rglob("*")) if path.suffix in (".h", ".cpp")]
     row.run("clang-format", "--dry-run", "-Werror", *sources)
