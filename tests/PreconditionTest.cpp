@@ -23,14 +23,20 @@ const volatile ssize_t kMax = std::numeric_limits<ssize_t>::max();
 const volatile ssize_t kMin = std::numeric_limits<ssize_t>::min();
 
 const char kPointer[] = "pn == 0 || (pn > 0 && p != nullptr)";
+const char kRange[] = "r1 <= r2";
+const char kSource[] = "0 <= ri && 0 <= rn && ri+rn <= r.size()";
 const char kIndexCount[] = "0 <= i && 0 <= n && i+n <= size()";
+const char kMoveTo[] = "0 <= d && 0 <= n && d+n <= size()";
+const char kMoveFrom[] = "0 <= s && 0 <= n && s+n <= size()";
 const char kForward[] = "0 <= offset && offset <= size()";
 const char kReverse[] = "offset == npos || (0 <= offset && offset < size())";
 const char kLength[] = "count == npos || (0 <= count && offset+count <= size())";
 const char kIndex[] = "0 <= i && i <= size()";
 const char kElement[] = "0 <= i && i < size()";
+const char kIterator[] = "begin() <= i && i < end()";
 const char kIterators[] = "begin() <= i1 && i1 <= i2 && i2 <= end()";
 const char kCount[] = "0 <= count";
+const char kNotEmpty[] = "size() > 0";
 
 std::function<bool()> unchanged;
 
@@ -40,34 +46,46 @@ void ReportState(int) {
     _exit(1);
 }
 
-/// Expects that action stops with text while the storage of v is as before.
-template <class V, class F> void ExpectStop(V& v, const std::string& text, const F& action) {
+/// A call with a container and arguments, and how it is written.
+template <class V, class... A> struct CallOf {
+  struct Type {
+    const char* text;
+    std::function<void(V&, A...)> make;
+  };
+};
+#define CALL(PARAMETERS, ...)                                                                                \
+  {                                                                                                          \
+#__VA_ARGS__, [&] PARAMETERS { static_cast<void>(v), __VA_ARGS__; }                                      \
+  }
+#define WITHOUT(...) CALL((auto& v), __VA_ARGS__)
+#define WITH_I(...) CALL((auto& v, ssize_t i), __VA_ARGS__)
+#define WITH_N(...) CALL((auto& v, ssize_t n), __VA_ARGS__)
+#define WITH_I_N(...) CALL((auto& v, ssize_t i, ssize_t n), __VA_ARGS__)
+#define WITH_I1_I2(...) CALL((auto& v, ssize_t i1, ssize_t i2), __VA_ARGS__)
+#define WITH_P_PN(...) CALL((auto& v, auto p, ssize_t pn), __VA_ARGS__)
+#define WITH_R1_R2(...) CALL((auto& v, auto r1, auto r2), __VA_ARGS__)
+
+/// Expects that each of the calls stops with text for each of the arguments, while the storage of v is as
+/// before.
+template <class V, class... A>
+void ExpectStops(V& v, const std::string& text, const std::vector<std::tuple<A...>>& arguments,
+                 const std::vector<typename CallOf<V, A...>::Type>& calls) {
   const VectorOfByte& b = reinterpret_cast<const VectorOfByte&>(v);
   const VectorOfByte before = b;
   unchanged = [&, data = b.data(), capacity = b.capacity()] {
     return b == before && b.data() == data && b.capacity() == capacity;
   };
-  const auto stop = [&] {
-    std::signal(SIGABRT, ReportState);
-    action(v);
-  };
-  EXPECT_EXIT(stop(), testing::KilledBySignal(SIGABRT),
-              testing::AllOf(testing::ContainsRegex("[a-zA-Z]+\\.(h|cpp):[0-9]+: .*::"),
-                             testing::HasSubstr("Assertion `" + text + "' failed"),
-                             testing::HasSubstr("[unchanged]")));
-}
-
-template <class V, class... A> struct CallsOf { using Type = std::vector<std::function<void(V&, A...)>>; };
-
-/// Expects that each of the calls stops with text for each of the arguments.
-template <class V, class... A>
-void ExpectStops(V& v, const std::string& text, const std::vector<std::tuple<A...>>& arguments,
-                 const typename CallsOf<V, A...>::Type& calls) {
-  for (std::size_t i = 0; i < calls.size(); ++i)
-    for (std::size_t k = 0; k < arguments.size(); ++k) {
-      SCOPED_TRACE("call " + std::to_string(i) + ", arguments " + std::to_string(k));
-      const auto action = [&](V& w) { std::apply([&](A... a) { calls[i](w, a...); }, arguments[k]); };
-      ExpectStop(v, text, action);
+  for (const auto& call : calls)
+    for (const auto& values : arguments) {
+      const auto stop = [&] {
+        std::signal(SIGABRT, ReportState);
+        std::apply([&](A... a) { call.make(v, a...); }, values);
+      };
+      EXPECT_EXIT(stop(), testing::KilledBySignal(SIGABRT),
+                  testing::AllOf(testing::ContainsRegex("[a-zA-Z]+\\.(h|cpp):[0-9]+: .*::"),
+                                 testing::HasSubstr("Assertion `" + text + "' failed"),
+                                 testing::HasSubstr("[unchanged]")))
+          << call.text << " with " << testing::PrintToString(values);
     }
 }
 
@@ -76,6 +94,7 @@ TYPED_TEST_SUITE(Precondition, CodeUnits);
 
 using One = std::vector<std::tuple<ssize_t>>;
 using Two = std::vector<std::tuple<ssize_t, ssize_t>>;
+const std::vector<std::tuple<>> kOnce = {{}};
 
 // Bad values for a string of three units.
 const One kBadIndex = {{-1}, {4}, {kMin}, {kMax}};
@@ -88,198 +107,177 @@ const Two kBadSubrange = {{-1, 1},      {0, -1},      {1, 3},       {4, 0},    {
 const Two kBadIndices = {{-1, 1}, {2, 1}, {0, 4}, {4, 4}, {0, kMax}, {kMin, kMin}};
 const Two kBadIterators = {{-1, 1}, {2, 1}, {0, 4}, {4, 4}};
 
+// Where a call is bad in two ways, as with an index of 99, it is the first check that must report it.
+
 TYPED_TEST(Precondition, OfSubranges) {
   using S = basic_xstring<TypeParam>;
   const S r = Of<TypeParam>("xyz");
   const TypeParam x = 'x';
   S s = Of<TypeParam>("abc");
-  ExpectStops(s, "0 <= ri && 0 <= rn && ri+rn <= r.size()", kBadSubrange,
-              {[&](S&, ssize_t i, ssize_t n) { S(r, i, n); },
-               [&](S& v, ssize_t i, ssize_t n) { v.assign(r, i, n); },
-               [&](S& v, ssize_t i, ssize_t n) { v.append(r, i, n); },
-               [&](S& v, ssize_t i, ssize_t n) { v.insert(99, r, i, n); },
-               [&](S& v, ssize_t i, ssize_t n) { v.replace(0, 1, r, i, n); },
-               [&](S& v, ssize_t i, ssize_t n) { v.compare(0, 1, r, i, n); }});
+  ExpectStops(s, kSource, kBadSubrange,
+              {WITH_I_N(S(r, i, n)), WITH_I_N(v.assign(r, i, n)), WITH_I_N(v.append(r, i, n)),
+               WITH_I_N(v.insert(99, r, i, n)), WITH_I_N(v.replace(0, 1, r, i, n)),
+               WITH_I_N(v.compare(0, 1, r, i, n))});
   ExpectStops(s, kIndexCount, kBadSubrange,
-              {[&](S& v, ssize_t i, ssize_t n) { v.erase(i, n); },
-               [&](S& v, ssize_t i, ssize_t n) { v.replace(i, n, r); },
-               [&](S& v, ssize_t i, ssize_t n) { v.replace(i, n, r, 9, 9); },
-               [&](S& v, ssize_t i, ssize_t n) { v.replace(i, n, nullptr, 1); },
-               [&](S& v, ssize_t i, ssize_t n) { v.replace(i, n, -1, x); },
-               [&](S& v, ssize_t i, ssize_t n) { v.replace(i, n, r.c_str()); },
-               [&](S& v, ssize_t i, ssize_t n) { v.compare(i, n, r); },
-               [&](S& v, ssize_t i, ssize_t n) { v.compare(i, n, r, 9, 9); },
-               [&](S& v, ssize_t i, ssize_t n) { v.compare(i, n, nullptr, 1); }});
-  ExpectStops(s, "0 <= d && 0 <= n && d+n <= size()", kBadSubrange,
-              {[](S& v, ssize_t i, ssize_t n) { v.move(i, 0, n); }});
-  ExpectStops(s, "0 <= s && 0 <= n && s+n <= size()", kBadElement,
-              {[](S& v, ssize_t i) { v.move(0, i, 1); }});
-  ExpectStops(s, "0 <= i1 && i1 <= i2 && i2 <= size()", kBadIndices,
-              {[](S& v, ssize_t i1, ssize_t i2) { v.erase_range(i1, i2); }});
+              {WITH_I_N(v.erase(i, n)), WITH_I_N(v.replace(i, n, r)), WITH_I_N(v.replace(i, n, r, 9, 9)),
+               WITH_I_N(v.replace(i, n, nullptr, 1)), WITH_I_N(v.replace(i, n, -1, x)),
+               WITH_I_N(v.replace(i, n, r.c_str())), WITH_I_N(v.compare(i, n, r)),
+               WITH_I_N(v.compare(i, n, r, 9, 9)), WITH_I_N(v.compare(i, n, nullptr, 1))});
+  ExpectStops(s, kMoveTo, kBadSubrange, {WITH_I_N(v.move(i, 99, n))});
+  ExpectStops(s, kMoveFrom, kBadElement, {WITH_I(v.move(0, i, 1))});
+  ExpectStops(s, "0 <= i1 && i1 <= i2 && i2 <= size()", kBadIndices, {WITH_I1_I2(v.erase_range(i1, i2))});
   ExpectStops(s, kIterators, kBadIterators,
-              {[](S& v, ssize_t i1, ssize_t i2) { v.erase(v.begin() + i1, v.begin() + i2); },
-               [&](S& v, ssize_t i1, ssize_t i2) { v.replace(v.begin() + i1, v.begin() + i2, r); },
-               [&](S& v, ssize_t i1, ssize_t i2) { v.replace(v.begin() + i1, v.begin() + i2, nullptr, 1); },
-               [&](S& v, ssize_t i1, ssize_t i2) { v.replace(v.begin() + i1, v.begin() + i2, -1, x); }});
+              {WITH_I1_I2(v.erase(v.begin() + i1, v.begin() + i2)),
+               WITH_I1_I2(v.replace(v.begin() + i1, v.begin() + i2, r)),
+               WITH_I1_I2(v.replace(v.begin() + i1, v.begin() + i2, nullptr, 1)),
+               WITH_I1_I2(v.replace(v.begin() + i1, v.begin() + i2, -1, x))});
 }
 
 TYPED_TEST(Precondition, OfIndicesAndCounts) {
   using T = TypeParam;
   using S = basic_xstring<T>;
   const S r = Of<T>("xyz");
-  const T* const p = r.data();
-  const T* const z = r.c_str();
-  const T x = 'x';
+  const T *const q = r.data(), *const z = r.c_str(), x = 'x';
   S s = Of<T>("abc");
   ExpectStops(s, kForward, kBadIndex,
-              {[&](S& v, ssize_t i) { v.find(x, i); }, [&](S& v, ssize_t i) { v.find(r, i); },
-               [&](S& v, ssize_t i) { v.find(z, i); }, [&](S& v, ssize_t i) { v.find_first_of(x, i); },
-               [&](S& v, ssize_t i) { v.find_first_of(r, i); },
-               [&](S& v, ssize_t i) { v.find_first_not_of(x, i); },
-               [&](S& v, ssize_t i) { v.find_first_not_of(r, i); },
-               [&](S& v, ssize_t i) { v.contains(p, p, i); }, [&](S& v, ssize_t i) { v.substr(i, 9); }});
+              {WITH_I(v.find(x, i)), WITH_I(v.find(r, i)), WITH_I(v.find(z, i)), WITH_I(v.find(q + 1, q, i)),
+               WITH_I(v.find_first_of(x, i)), WITH_I(v.find_first_of(r, i)),
+               WITH_I(v.find_first_of(q + 1, q, i)), WITH_I(v.find_first_not_of(x, i)),
+               WITH_I(v.find_first_not_of(r, i)), WITH_I(v.find_first_not_of(q + 1, q, i)),
+               WITH_I(v.contains(q + 1, q, i)), WITH_I(v.substr(i, 9))});
   ExpectStops(s, kReverse, kBadReverse,
-              {[&](S& v, ssize_t i) { v.rfind(x, i); }, [&](S& v, ssize_t i) { v.rfind(r, i); },
-               [&](S& v, ssize_t i) { v.find_last_of(x, i); }, [&](S& v, ssize_t i) { v.find_last_of(r, i); },
-               [&](S& v, ssize_t i) { v.find_last_not_of(x, i); },
-               [&](S& v, ssize_t i) { v.find_last_not_of(r, i); }});
-  ExpectStops(s, kLength, kBadLengthFrom2, {[](S& v, ssize_t n) { v.substr(2, n); }});
+              {WITH_I(v.rfind(x, i)), WITH_I(v.rfind(r, i)), WITH_I(v.rfind(q + 1, q, i)),
+               WITH_I(v.find_last_of(x, i)), WITH_I(v.find_last_of(r, i)),
+               WITH_I(v.find_last_of(q + 1, q, i)), WITH_I(v.find_last_not_of(x, i)),
+               WITH_I(v.find_last_not_of(r, i)), WITH_I(v.find_last_not_of(q + 1, q, i))});
+  ExpectStops(s, kLength, kBadLengthFrom2, {WITH_N(v.substr(2, n))});
   ExpectStops(s, kIndex, kBadIndex,
-              {[&](S& v, ssize_t i) { v.insert(i, x); }, [&](S& v, ssize_t i) { v.insert(i, r); },
-               [&](S& v, ssize_t i) { v.insert(i, -1, x); }, [&](S& v, ssize_t i) { v.insert(i, p + 1, p); },
-               [&](S& v, ssize_t i) { v.insert(i, r, 0, 1); }, [&](S& v, ssize_t i) { v.insert(i, p, 1); },
-               [&](S& v, ssize_t i) { v.insert(i, z); }});
-  ExpectStops(s, kIndex, One{{-1}, {4}}, {[&](S& v, ssize_t i) { v.insert(v.begin() + i, x); }});
-  ExpectStops(s, "begin() <= i && i < end()", One{{-1}, {3}},
-              {[](S& v, ssize_t i) { v.erase(v.begin() + i); }});
+              {WITH_I(v.insert(i, x)), WITH_I(v.insert(i, r)), WITH_I(v.insert(i, -1, x)),
+               WITH_I(v.insert(i, q + 1, q)), WITH_I(v.insert(i, r, 0, 1)), WITH_I(v.insert(i, q, 1)),
+               WITH_I(v.insert(i, z))});
+  ExpectStops(s, kIndex, One{{-1}, {4}}, {WITH_I(v.insert(v.begin() + i, x))});
+  ExpectStops(s, kIterator, One{{-1}, {3}}, {WITH_I(v.erase(v.begin() + i))});
   ExpectStops(s, kElement, kBadElement,
-              {[](S& v, ssize_t i) { v.erase_element(i); }, [&](S& v, ssize_t i) { v[i] = x; },
-               [](S& v, ssize_t i) { std::as_const(v)[i]; }});
+              {WITH_I(v.erase_element(i)), WITH_I(v[i] = x), WITH_I(std::as_const(v)[i])});
   ExpectStops(s, kCount, kBadCount,
-              {[&](S&, ssize_t n) { S(n, x); }, [&](S&, ssize_t n) { xvector<T>(n, x); },
-               [&](S& v, ssize_t n) { v.assign(n, x); }, [&](S& v, ssize_t n) { v.append(n, x); },
-               [&](S& v, ssize_t n) { v.insert(1, n, x); },
-               [&](S& v, ssize_t n) { v.insert(v.begin(), n, x); },
-               [&](S& v, ssize_t n) { v.replace(1, 1, n, x); },
-               [&](S& v, ssize_t n) { v.replace(v.begin(), v.end(), n, x); },
-               [&](S& v, ssize_t n) { v.push_back(n, p + 1, p); }, [](S& v, ssize_t n) { v *= n; }});
-  ExpectStops(s, "size >= 0", kBadCount, {[](S& v, ssize_t n) { v.reserve(n); }});
-  ExpectStops(s, "newSize >= 0", kBadCount, {[&](S& v, ssize_t n) { v.resize(n, x); }});
+              {WITH_N(S(n, x)), WITH_N(xvector<T>(n, x)), WITH_N(v.assign(n, x)), WITH_N(v.append(n, x)),
+               WITH_N(v.insert(1, n, x)), WITH_N(v.insert(v.begin(), n, x)), WITH_N(v.replace(1, 1, n, x)),
+               WITH_N(v.replace(v.begin(), v.end(), n, x)), WITH_N(v.push_back(n, q + 1, q)),
+               WITH_N(v *= n)});
+  ExpectStops(s, "size >= 0", kBadCount, {WITH_N(v.reserve(n))});
+  ExpectStops(s, "newSize >= 0", kBadCount, {WITH_N(v.resize(n, x))});
 }
 
 TYPED_TEST(Precondition, OfPointersAndRanges) {
   using T = TypeParam;
   using S = basic_xstring<T>;
   const S r = Of<T>("xyz");
-  const T* const p = r.data();
+  const T* const q = r.data();
   T* const volatile null = nullptr;
-  const std::vector<std::tuple<const T*, ssize_t>> badRun = {{null, 1}, {null, kMax}, {p, -1}, {p, kMin}};
   S s = Of<T>("abc");
-  ExpectStops(s, kPointer, badRun,
-              {[](S&, const T* q, ssize_t n) { S(q, n); },
-               [](S& v, const T* q, ssize_t n) { v.assign(q, n); },
-               [](S& v, const T* q, ssize_t n) { v.append(q, n); },
-               [](S& v, const T* q, ssize_t n) { v.insert(99, q, n); },
-               [](S& v, const T* q, ssize_t n) { v.replace(1, 1, q, n); },
-               [](S& v, const T* q, ssize_t n) { v.replace(v.begin(), v.end(), q, n); },
-               [](S& v, const T* q, ssize_t n) { v.compare(q, n); },
-               [](S& v, const T* q, ssize_t n) { v.compare(1, 1, q, n); },
-               [](S& v, const T* q, ssize_t n) { v.find(q, 99, n); },
-               [](S& v, const T* q, ssize_t n) { v.rfind(q, 99, n); },
-               [](S& v, const T* q, ssize_t n) { v.find_first_of(q, 99, n); },
-               [](S& v, const T* q, ssize_t n) { v.find_first_not_of(q, 99, n); },
-               [](S& v, const T* q, ssize_t n) { v.find_last_of(q, 99, n); },
-               [](S& v, const T* q, ssize_t n) { v.find_last_not_of(q, 99, n); }});
-  const std::vector<std::tuple<const T*, const T*>> badRange = {{p + 1, p}};
-  ExpectStops(s, "r1 <= r2", badRange,
-              {[](S&, const T* a, const T* b) { S(a, b); },
-               [](S& v, const T* a, const T* b) { v.assign(a, b); },
-               [](S& v, const T* a, const T* b) { v.push_back(a, b); },
-               [](S& v, const T* a, const T* b) { v.push_back(2, a, b); },
-               [](S& v, const T* a, const T* b) { v.insert(0, a, b); },
-               [](S& v, const T* a, const T* b) { v.find(a, b); },
-               [](S& v, const T* a, const T* b) { v.rfind(a, b); },
-               [](S& v, const T* a, const T* b) { v.contains(a, b, 0); },
-               [](S& v, const T* a, const T* b) { v.find_first_of(a, b); },
-               [](S& v, const T* a, const T* b) { v.find_first_not_of(a, b); },
-               [](S& v, const T* a, const T* b) { v.find_last_of(a, b); },
-               [](S& v, const T* a, const T* b) { v.find_last_not_of(a, b); }});
-  const std::vector<std::tuple<>> once = {{}};
-  ExpectStops(s, "size() > 0", once,
-              {[](S&) { S().front(); }, [](S&) { S().back(); }, [](S&) { S().pop_front(); },
-               [](S&) { S().pop_back(); }, [](S&) { std::as_const(*std::make_unique<S>()).front(); },
-               [](S&) { std::as_const(*std::make_unique<S>()).back(); }});
-  ExpectStops(s, "p", once,
-              {[](S&) { *S().rbegin(); }, [](S&) { S().rbegin().operator->(); }, [](S&) { ++S().rbegin(); },
-               [](S&) { std::as_const(*std::make_unique<S>()).rbegin()--; }});
-  ExpectStop(s, "r1 >= r2 || r1 != nullptr", [&](S& v) { mirel::p_create(+null, v.begin(), 'x'); });
-  const std::vector<std::tuple<T*, const T*, const T*>> badCopy = {
-      {s.begin(), p + 1, p}, {s.begin(), null, p}, {null, p, p + 1}};
-  ExpectStops(s, "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)", badCopy,
-              {[](S&, T* dst, const T* src1, const T* src2) { mirel::p_copy(dst, src1, src2); }});
-  ExpectStop(s, "src1 == src2 || dst != nullptr", [&](S& v) { mirel::p_copy(+null, v.begin(), v.end()); });
-  mirel::p_copy(+null, s.begin(), s.begin()); // nothing to copy
+  ExpectStops(s, kPointer,
+              std::vector<std::tuple<const T*, ssize_t>>{{null, 1}, {null, kMax}, {q, -1}, {q, kMin}},
+              {WITH_P_PN(S(p, pn)), WITH_P_PN(v.assign(p, pn)), WITH_P_PN(v.append(p, pn)),
+               WITH_P_PN(v.insert(99, p, pn)), WITH_P_PN(v.replace(1, 1, p, pn)),
+               WITH_P_PN(v.replace(v.begin(), v.end(), p, pn)), WITH_P_PN(v.compare(p, pn)),
+               WITH_P_PN(v.compare(1, 1, p, pn)), WITH_P_PN(v.find(p, 99, pn)), WITH_P_PN(v.rfind(p, 99, pn)),
+               WITH_P_PN(v.find_first_of(p, 99, pn)), WITH_P_PN(v.find_first_not_of(p, 99, pn)),
+               WITH_P_PN(v.find_last_of(p, 99, pn)), WITH_P_PN(v.find_last_not_of(p, 99, pn))});
+  ExpectStops(s, kRange, std::vector<std::tuple<const T*, const T*>>{{q + 1, q}},
+              {WITH_R1_R2(S(r1, r2)), WITH_R1_R2(v.assign(r1, r2)), WITH_R1_R2(v.push_back(r1, r2)),
+               WITH_R1_R2(v.push_back(2, r1, r2)), WITH_R1_R2(v.insert(0, r1, r2)),
+               WITH_R1_R2(v.find(r1, r2)), WITH_R1_R2(v.rfind(r1, r2)), WITH_R1_R2(v.contains(r1, r2, 0)),
+               WITH_R1_R2(v.find_first_of(r1, r2)), WITH_R1_R2(v.find_first_not_of(r1, r2)),
+               WITH_R1_R2(v.find_last_of(r1, r2)), WITH_R1_R2(v.find_last_not_of(r1, r2))});
+  const auto empty = std::make_unique<S>();
+  const S& constEmpty = *empty;
+  ExpectStops(s, kNotEmpty, kOnce,
+              {WITHOUT(empty->front()), WITHOUT(empty->back()), WITHOUT(empty->pop_front()),
+               WITHOUT(empty->pop_back()), WITHOUT(constEmpty.front()), WITHOUT(constEmpty.back())});
+  ExpectStops(s, "p", kOnce,
+              {WITHOUT(*empty->rbegin()), WITHOUT(empty->rbegin().operator->()), WITHOUT(++empty->rbegin()),
+               WITHOUT(constEmpty.rbegin()--)});
 }
 
-TEST(Precondition, OfBuffersConversionsAndStreams) {
+TYPED_TEST(Precondition, OfElementRuns) {
+  using T = TypeParam;
+  using mirel::p_copy, mirel::p_create;
+  auto s = Of<T>("abc");
+  T* const volatile null = nullptr, * const q = s.begin();
+  ExpectStops(s, "r1 >= r2 || r1 != nullptr", kOnce, {WITHOUT(p_create(+null, q, 'x'))});
+  ExpectStops(s, "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)",
+              std::vector<std::tuple<const T*, const T*>>{{q + 1, q}, {null, q}},
+              {WITH_R1_R2(p_copy(q, r1, r2)), WITH_R1_R2(p_copy(+null, r1, r2))});
+  ExpectStops(s, "src1 == src2 || dst != nullptr", kOnce, {WITHOUT(p_copy(+null, v.begin(), v.end()))});
+  p_copy(+null, q, q), p_create(+null, +null, 'x'), p_create(q + 3, q, 'x'); // have nothing to do
+  EXPECT_EQ(Std(s), Std(Of<T>("abc")));
+}
+
+TEST(Precondition, OfBuffers) {
   using B = VectorOfByte;
   const uint8_t byte = 1;
   B b{1, 2, 3};
-  ExpectStops(b, kElement, kBadElement,
-              {[](B& v, ssize_t i) { std::as_const(v)[i]; }, [](B& v, ssize_t i) { v.erase_element(i); }});
-  ExpectStops(b, "size_ >= 0", One{{4}, {kMax}}, {[](B& v, ssize_t n) { v.pop_back(n); }});
-  ExpectStops(b, kCount, kBadCount,
-              {[](B& v, ssize_t n) { v.pop_back(n); }, [](B& v, ssize_t n) { v.growbytes(n); },
-               [](B& v, ssize_t n) { v.insert(1, n, 'x'); }});
-  ExpectStops(b, "0 <= n", kBadCount,
-              {[](B& v, ssize_t n) { v.resize(n); }, [](B& v, ssize_t n) { v.insertbytes(3, n); }});
+  ExpectStops(b, kElement, kBadElement, {WITH_I(std::as_const(v)[i]), WITH_I(v.erase_element(i))});
+  ExpectStops(b, "size_ >= 0", One{{4}, {kMax}}, {WITH_N(v.pop_back(n))});
+  ExpectStops(
+      b, kCount, kBadCount,
+      {WITH_N(B(n, 'x')), WITH_N(v.pop_back(n)), WITH_N(v.growbytes(n)), WITH_N(v.insert(1, n, 'x'))});
+  ExpectStops(b, "0 <= n", kBadCount, {WITH_N(v.resize(n)), WITH_N(v.insertbytes(3, n))});
   ExpectStops(b, kIndex, kBadIndex,
-              {[](B& v, ssize_t i) { v.insertbytes(i, 1); }, [](B& v, ssize_t i) { v.insert(i, -1, 'x'); },
-               [&](B& v, ssize_t i) { v.insert(i, &byte, &byte); }});
-  ExpectStops(b, "0 <= d && 0 <= n && d+n <= size()", kBadSubrange,
-              {[](B& v, ssize_t i, ssize_t n) { v.move(i, 0, n); }});
-  ExpectStops(b, "0 <= s && 0 <= n && s+n <= size()", kBadElement,
-              {[](B& v, ssize_t i) { v.move(0, i, 1); }});
-  ExpectStops(b, kIterators, kBadIterators,
-              {[](B& v, ssize_t i1, ssize_t i2) { v.erase(v.begin() + i1, v.begin() + i2); }});
-  ExpectStops(b, "begin() <= i && i < end()", One{{-1}, {3}},
-              {[](B& v, ssize_t i) { v.erase(v.begin() + i); }});
+              {WITH_I(v.insertbytes(i, -1)), WITH_I(v.insert(i, -1, 'x')), WITH_I(v.insert(i, 'x')),
+               WITH_I(v.insert(i, &byte, &byte))});
+  ExpectStops(b, kMoveTo, kBadSubrange, {WITH_I_N(v.move(i, 99, n))});
+  ExpectStops(b, kMoveFrom, kBadElement, {WITH_I(v.move(0, i, 1))});
+  ExpectStops(b, kIterators, kBadIterators, {WITH_I1_I2(v.erase(v.begin() + i1, v.begin() + i2))});
+  ExpectStops(b, kIterator, One{{-1}, {3}}, {WITH_I(v.erase(v.begin() + i))});
   ExpectStops(b, kIndexCount, kBadSubrange,
-              {[](B& v, ssize_t i, ssize_t n) { v.erase(i, n); },
-               [](B& v, ssize_t i, ssize_t n) { v.compare(i, n, v); },
-               [](B& v, ssize_t i, ssize_t n) { v.compare(i, n, v, 9, 9); },
-               [](B& v, ssize_t i, ssize_t n) { v.compare(i, n, nullptr, 1); }});
-  ExpectStops(b, "0 <= ri && 0 <= rn && ri+rn <= r.size()", kBadSubrange,
-              {[](B& v, ssize_t i, ssize_t n) { v.compare(0, 1, v, i, n); }});
-  const std::vector<std::tuple<const uint8_t*, ssize_t>> badRun = {{nullptr, 1}, {&byte, -1}, {&byte, kMin}};
-  ExpectStops(b, kPointer, badRun, {[](B& v, const uint8_t* p, ssize_t n) { v.compare(0, 1, p, n); }});
-  const std::vector<std::tuple<>> once = {{}};
-  ExpectStops(b, "r1 <= r2", once,
-              {[](B& v) { v.insert(0, v.end(), v.begin()); }, [](B& v) { v.assign(v.end(), v.begin()); }});
-  ExpectStops(b, "size() > 0", once,
-              {[](B&) { B().front(); }, [](B&) { B().back(); },
-               [](B&) { std::as_const(*std::make_unique<B>()).front(); },
-               [](B&) { std::as_const(*std::make_unique<B>()).back(); }});
+              {WITH_I_N(v.erase(i, n)), WITH_I_N(v.compare(i, n, v)), WITH_I_N(v.compare(i, n, v, 9, 9)),
+               WITH_I_N(v.compare(i, n, nullptr, 1))});
+  ExpectStops(b, kSource, kBadSubrange, {WITH_I_N(v.compare(0, 1, v, i, n))});
+  ExpectStops(b, kPointer,
+              std::vector<std::tuple<const uint8_t*, ssize_t>>{{nullptr, 1}, {&byte, -1}, {&byte, kMin}},
+              {WITH_P_PN(v.compare(0, 1, p, pn))});
+  ExpectStops(b, kRange, std::vector<std::tuple<const uint8_t*, const uint8_t*>>{{&byte + 1, &byte}},
+              {WITH_R1_R2(B(r1, r2)), WITH_R1_R2(v.insert(0, r1, r2)), WITH_R1_R2(v.assign(r1, r2)),
+               WITH_R1_R2(v.push_back(r1, r2))});
+  const auto empty = std::make_unique<B>();
+  const B& constEmpty = *empty;
+  ExpectStops(b, kNotEmpty, kOnce,
+              {WITHOUT(empty->front()), WITHOUT(empty->back()), WITHOUT(constEmpty.front()),
+               WITHOUT(constEmpty.back())});
+}
 
+TEST(Precondition, OfConversions) {
   string16 wide = Of<char16>("abc");
   string8 narrow = Of<char8>("abc");
-  ExpectStop(wide, "srcLen >= 0", [](string16& s) { mirel::Utf16FromUtf8(s, "a", -1); });
-  ExpectStop(wide, "src", [](string16& s) { mirel::Utf16FromUtf8(s, nullptr); });
-  ExpectStop(wide, "newSize >= 0", [](string16& s) { mirel::Utf16FromAscii(s, "a", -1); });
-  ExpectStop(narrow, "srcLen >= 0", [&](string8& s) { mirel::Utf8FromUtf16(s, wide.data(), kMin); });
-  ExpectStop(narrow, "src", [](string8& s) { mirel::Utf8FromUtf16(s, nullptr); });
+  ExpectStops(wide, "srcLen >= 0", kBadCount, {WITH_N(Utf16FromUtf8(v, "a", n))});
+  ExpectStops(wide, "src", kOnce, {WITHOUT(Utf16FromUtf8(v, nullptr))});
+  ExpectStops(wide, "newSize >= 0", kBadCount, {WITH_N(Utf16FromAscii(v, "a", n))});
+  ExpectStops(narrow, "srcLen >= 0", kBadCount, {WITH_N(Utf8FromUtf16(v, wide.data(), n))});
+  ExpectStops(narrow, "src", kOnce, {WITHOUT(Utf8FromUtf16(v, nullptr))});
+}
 
+TEST(Precondition, OfStreams) {
   struct : mirel::IOutputStream {
     void WriteStream(const void*, ssize_t) override {}
     void FlushStream() override {}
   } sink;
   mirel::xostream os(sink);
-  ExpectStop(narrow, "x", [&](string8&) { os.put(static_cast<const char*>(nullptr)); });
-  const std::vector<std::tuple<const char*, ssize_t>> badText = {{nullptr, 1}, {"a", -1}, {"a", kMin}};
-  ExpectStops(narrow, kPointer, badText,
-              {[&](string8&, const char* p, ssize_t n) { os.put(p, n); },
-               [&](string8&, const char* p, ssize_t n) { os.write(p, n); }});
-  ExpectStop(narrow, "0 <= indent", [&](string8&) { os.Indent(-1); });
+  VectorOfByte none;
+  ExpectStops(none, "x", kOnce, {WITHOUT(os.put(static_cast<const char*>(nullptr)))});
+  ExpectStops(none, kPointer,
+              std::vector<std::tuple<const char*, ssize_t>>{{nullptr, 1}, {"a", -1}, {"a", kMin}},
+              {WITH_P_PN(os.put(p, pn)), WITH_P_PN(os.write(p, pn)), WITH_P_PN(os.put_internal(p, pn, 0)),
+               WITH_P_PN(os.writebytes(reinterpret_cast<const uint8_t*>(p), pn))});
+  ExpectStops(none, "0 <= indent", kBadCount, {WITH_N(os.Indent(n))});
+}
+
+TEST(Precondition, ReportsTheLineOfTheCheck) {
+  // clang-format off
+  const int line = __LINE__; const auto check = [] { MIREL_ASSERT(kMax < 0); };
+  // clang-format on
+  EXPECT_EXIT(check(), testing::KilledBySignal(SIGABRT),
+              testing::HasSubstr("PreconditionTest.cpp:" + std::to_string(line) + ": "));
 }
 
 } // namespace
