@@ -31,6 +31,14 @@ private:
   Numbers& m_numbers;
 };
 
+/// Names an edit by its call, makes it, and replaces len elements at pos of the model with some text.
+#define EDIT(NUMBER, CALL, ...)                                                                              \
+  case NUMBER:                                                                                               \
+    edit = #CALL;                                                                                            \
+    CALL;                                                                                                    \
+    becomes(__VA_ARGS__);                                                                                    \
+    break
+
 template <class T, class Numbers> class Edits : TextMaker<T, Numbers> {
 public:
   using typename TextMaker<T, Numbers>::S;
@@ -41,90 +49,91 @@ public:
   void Step() {
     if (v.size() > 80)
       S().swap(v), m.clear();
+    const M before = m;
     const ssize_t size = v.size(), i = this->Number(size), n = this->Number(size - i),
                   count = this->Number(4);
-    const ssize_t ri = this->Number(size), rn = this->Number(size - ri);
+    const ssize_t ri = this->Number(size), rn = this->Number(size - ri), k = std::min(n, rn);
     const M text = this->Text(9), own = m.substr(size_t(ri), size_t(rn));
     const S r(text.data(), static_cast<ssize_t>(text.size()));
-    const M zeroTerminated = m.substr(size_t(ri), std::min(m.find(T(0), size_t(ri)), m.size()) - size_t(ri));
+    const M upToZero = m.substr(size_t(ri), std::min(m.find(T(0), size_t(ri)), m.size()) - size_t(ri));
     const T x = this->Unit(), own1 = n > 0 ? m[size_t(i)] : x;
     const T& x1 = n > 0 ? v[i] : x; // own and own1 are copies of what p and x1 stand for in the vector
     const T* const p = v.data() + ri;
-    const auto at = v.begin() + i;
-    // Every edit replaces len elements at pos with some text.
+    auto at = v.begin() + i;
+    ssize_t erased = kNpos; // what an edit says how many it has erased
+    const char* edit = "";
     const auto becomes = [&](ssize_t pos, ssize_t len, const M& with) {
       m.replace(size_t(pos), size_t(len), with);
     };
     const auto without = [&](T c) { return M(m.begin(), std::remove(m.begin(), m.end(), c)); };
-    const auto times = [](ssize_t k, T c) { return M(size_t(k), c); };
-    const ssize_t what = this->Number(37);
-    switch (what) {
-    case 0: v.push_back(x1), becomes(size, 0, {own1}); break;
-    case 1: v.append(r), becomes(size, 0, text); break;
-    case 2: v.append(count, x), becomes(size, 0, times(count, x)); break;
-    case 3: v.insert(i, r), becomes(i, 0, text); break;
-    case 4: v.insert(i, x1), becomes(i, 0, {own1}); break;
-    case 5: v.insert(i, count, x1), becomes(i, 0, times(count, own1)); break;
-    case 6: becomes(v.insert(at, x1) - v.begin(), 0, {own1}); break;
-    case 7: v.replace(i, n, r), becomes(i, n, text); break;
-    case 8: v.replace(i, n, count, x1), becomes(i, n, times(count, own1)); break;
-    case 9: v.replace(at, at + n, r), becomes(i, n, text); break;
-    case 10: v.replace(at, at + n, count, x), becomes(i, n, times(count, x)); break;
-    case 11: v.replace(at, at + n, p, rn), becomes(i, n, own); break;
-    case 12: v.erase(i, n), becomes(i, n, {}); break;
-    case 13: v.erase_range(i, i + n), becomes(i, n, {}); break;
-    case 14: v.resize(i, x), becomes(i, size - i, {}); break;
-    case 15: v.resize(size + count, x1), becomes(size, 0, times(count, own1)); break;
-    case 16: v.assign(count, x1), becomes(0, size, times(count, own1)); break;
-    case 17: v.assign(v, ri, rn), becomes(0, size, own); break;
-    case 18: v = v + r, becomes(size, 0, text); break;
-    case 19: v.append(p, rn), becomes(size, 0, own); break;
-    case 20: v.append(v, ri, rn), becomes(size, 0, own); break;
-    case 21: v.insert(i, p, rn), becomes(i, 0, own); break;
-    case 22: v.insert(i, v, ri, rn), becomes(i, 0, own); break;
-    case 23: v.replace(i, n, p, rn), becomes(i, n, own); break;
-    case 24: v.replace(i, n, v, ri, rn), becomes(i, n, own); break;
-    case 25: v.push_back(2, p, p + rn), becomes(size, 0, own + own); break;
-    case 26: v += v, becomes(size, 0, M(m)); break;
-    case 27: v.insert(i, v.begin(), v.end()), becomes(i, 0, M(m)); break;
-    case 28:
-      ASSERT_EQ(v.FindAndErase(x1), std::count(m.begin(), m.end(), own1));
-      becomes(0, size, without(own1));
-      break;
-    case 29: v.resize(i, x), m.resize(size_t(i)), v *= 2, becomes(i, 0, M(m)); break;
-    case 30:
-      if (n > 0)
-        becomes(v.erase(at) - v.begin(), 1, {}), v.push_front(x), v.pop_front();
-      break;
-    case 31:
-      EXPECT_EQ(v.FindAndEraseFirst(x), m.rfind(x) != m.npos);
-      m.erase(std::min(m.rfind(x), m.size()), 1);
-      break;
-    case 32: v.append(v.c_str() + ri), becomes(size, 0, zeroTerminated); break;
-    case 33: v.assign(v.c_str() + ri), becomes(0, size, zeroTerminated); break;
-    case 34: v.insert(i, v.c_str() + ri), becomes(i, 0, zeroTerminated); break;
-    case 35: v.replace(i, n, v.c_str() + ri), becomes(i, n, zeroTerminated); break;
-    case 36: {
-      const ssize_t k = std::min(n, rn);
-      v.move(i, ri, k), becomes(i, k, m.substr(size_t(ri), size_t(k)));
-      break;
+    const auto times = [](ssize_t copies, T c) { return M(size_t(copies), c); };
+    switch (this->Number(37)) {
+      EDIT(0, v.push_back(x1), size, 0, {own1});
+      EDIT(1, v.append(r), size, 0, text);
+      EDIT(2, v.append(count, x), size, 0, times(count, x));
+      EDIT(3, v.insert(i, r), i, 0, text);
+      EDIT(4, v.insert(i, x1), i, 0, {own1});
+      EDIT(5, v.insert(i, count, x1), i, 0, times(count, own1));
+      EDIT(6, at = v.insert(at, x1), at - v.begin(), 0, {own1});
+      EDIT(7, v.replace(i, n, r), i, n, text);
+      EDIT(8, v.replace(i, n, count, x1), i, n, times(count, own1));
+      EDIT(9, v.replace(at, at + n, r), i, n, text);
+      EDIT(10, v.replace(at, at + n, count, x), i, n, times(count, x));
+      EDIT(11, v.replace(at, at + n, p, rn), i, n, own);
+      EDIT(12, v.erase(i, n), i, n, {});
+      EDIT(13, v.erase_range(i, i + n), i, n, {});
+      EDIT(14, v.resize(i, x), i, size - i, {});
+      EDIT(15, v.resize(size + count, x1), size, 0, times(count, own1));
+      EDIT(16, v.assign(count, x1), 0, size, times(count, own1));
+      EDIT(17, v.assign(v, ri, rn), 0, size, own);
+      EDIT(18, v = v + r, size, 0, text);
+      EDIT(19, v.append(p, rn), size, 0, own);
+      EDIT(20, v.append(v, ri, rn), size, 0, own);
+      EDIT(21, v.insert(i, p, rn), i, 0, own);
+      EDIT(22, v.insert(i, v, ri, rn), i, 0, own);
+      EDIT(23, v.replace(i, n, p, rn), i, n, own);
+      EDIT(24, v.replace(i, n, v, ri, rn), i, n, own);
+      EDIT(25, v.push_back(2, p, p + rn), size, 0, own + own);
+      EDIT(26, v += v, size, 0, before);
+      EDIT(27, v.insert(i, v.begin(), v.end()), i, 0, before);
+      EDIT(28, erased = v.FindAndErase(x1), 0, size, without(own1));
+      EDIT(29, (v.resize(i, x), v *= 2), i, size - i, M(m, 0, size_t(i)));
+      EDIT(30, (n > 0 ? at = v.erase(at) : at), at - v.begin(), n > 0, {});
+      EDIT(31, erased = v.FindAndEraseFirst(x), ssize_t(std::min(m.rfind(x), m.size())), 1, {});
+      EDIT(32, v.append(v.c_str() + ri), size, 0, upToZero);
+      EDIT(33, v.assign(v.c_str() + ri), 0, size, upToZero);
+      EDIT(34, v.insert(i, v.c_str() + ri), i, 0, upToZero);
+      EDIT(35, v.replace(i, n, v.c_str() + ri), i, n, upToZero);
+      EDIT(36, v.move(i, ri, k), i, k, own.substr(0, size_t(k)));
+      EDIT(37, v.append(v.c_str() + ri, size - ri + 1), size, 0, M(m, size_t(ri)) + T(0));
     }
-    case 37: v.append(v.c_str() + ri, size - ri + 1), becomes(size, 0, M(m, size_t(ri)) + T(0)); break;
+    SCOPED_TRACE(edit);
+    ASSERT_EQ(Std(v), m) << "from " << testing::PrintToString(before) << " with i " << i << ", n " << n
+                         << ", ri " << ri << ", rn " << rn << ", count " << count << ", x " << ssize_t(x)
+                         << ", r " << testing::PrintToString(text);
+    ASSERT_THAT(erased, testing::AnyOf(kNpos, size - v.size()));
+    ASSERT_LE(v.size(), v.capacity());
+    ASSERT_EQ(v.end() - v.begin(), ssize_t(m.size()));
+    ASSERT_EQ(v.empty(), m.empty());
+    if (!m.empty()) {
+      ASSERT_EQ(v.front(), m.front());
+      ASSERT_EQ(std::as_const(v).back(), m.back());
+      ASSERT_EQ(std::as_const(v)[v.size() / 2], m[m.size() / 2]);
     }
-    ASSERT_EQ(Std(v), m) << "edit " << what;
-    ASSERT_TRUE(v.size() <= v.capacity() && v.empty() == m.empty() && v.end() - v.begin() == v.size());
-    ASSERT_TRUE(v.empty() || (v.front() == m.front() && std::as_const(v).back() == m.back() &&
-                              std::as_const(v)[v.size() / 2] == m[m.size() / 2]));
     if (this->Number(3) == 0)
-      return S(v).swap(v); // without spare storage, so that the next edit has to move it
+      return S(v).swap(v); // without unused capacity, so that the next edit has to move it
     const T* const z = v.c_str();
-    ASSERT_TRUE(z == v.data() && z[v.size()] == 0 && v.capacity() > v.size() && Std(v) == m);
+    ASSERT_EQ(z, v.data());
+    ASSERT_EQ(z[v.size()], 0);
+    ASSERT_GT(v.capacity(), v.size());
+    ASSERT_EQ(Std(v), m);
   }
 
 private:
   S v;
   M m;
 };
+#undef EDIT
 
 template <class T, class Numbers> class Searches : TextMaker<T, Numbers> {
 public:
