@@ -1,10 +1,14 @@
 #include "Support.h"
 
+#include <algorithm>
 #include <cstdlib>
+#include <cstring>
 #include <functional>
 #include <limits>
 #include <new>
 #include <vector>
+
+#include <malloc.h>
 
 // The linker puts the wrapper in the place of realloc in a static library; a shared one finds it in the
 // program.
@@ -23,12 +27,24 @@ extern "C" void* WRAPPED_REALLOC(void* p, std::size_t n) noexcept {
     return nullptr;
   if (allocation::failAfter > 0)
     --allocation::failAfter;
-  return REAL_REALLOC(p, n);
+  // Each growth moves, and what points to the storage before reads other bytes.
+  void* const moved = REAL_REALLOC(nullptr, n);
+  if (p != nullptr && moved != nullptr) {
+    const std::size_t size = malloc_usable_size(p);
+    std::memcpy(moved, p, std::min(n, size));
+    std::memset(p, 0xDD, size);
+    std::free(p);
+  }
+  return moved;
 }
 
 namespace {
 
 const volatile ssize_t kMax = std::numeric_limits<ssize_t>::max(); // unknown to the compiler
+
+/// An edit of s.
+#define EDIT(...) [&](auto& s) { __VA_ARGS__; }
+template <class V> using EditsOf = std::vector<std::function<void(V&)>>;
 
 template <class T> class Allocation : public testing::Test {};
 TYPED_TEST_SUITE(Allocation, CodeUnits);
@@ -36,27 +52,23 @@ TYPED_TEST_SUITE(Allocation, CodeUnits);
 TYPED_TEST(Allocation, GrowthIsGeometric) {
   using S = basic_xstring<TypeParam>;
   const S run = Of<TypeParam>("seventeen units..");
-  const std::vector<std::function<void(S&)>> edits = {[](S& s) { s.push_back('x'); },
-                                                      [](S& s) { s.append(1, 'x'); },
-                                                      [](S& s) { s.resize(s.size() + 1, 'x'); },
-                                                      [&](S& s) { s += run; },
-                                                      [](S& s) { s.push_back('x'), s.c_str(); },
-                                                      [](S& s) { s.append(1, 'x'), s.c_str(); },
-                                                      [&](S& s) { s += run, s.c_str(); }};
-  for (const auto& edit : edits) {
+  const EditsOf<S> edits = {EDIT(s.push_back('x')),
+                            EDIT(s.append(1, 'x')),
+                            EDIT(s.resize(s.size() + 1, 'x')),
+                            EDIT(s += run),
+                            EDIT(s.push_back('x'), s.c_str()),
+                            EDIT(s.append(1, 'x'), s.c_str()),
+                            EDIT(s += run, s.c_str())};
+  const auto allocations = [](int times, const auto& edit) {
     S s;
-    EXPECT_LT(allocation::Count([&] {
-                for (int i = 0; i < 100000; ++i)
-                  edit(s);
-              }),
-              40);
-  }
-  S s;
-  EXPECT_LT(allocation::Count([&] {
-              for (int i = 0; i < 2000; ++i)
-                s.insert(s.size() / 2, 'x'), s.push_front('y');
-            }),
-            20);
+    return allocation::Count([&] {
+      for (int i = 0; i < times; ++i)
+        edit(s);
+    });
+  };
+  for (const auto& edit : edits)
+    EXPECT_LT(allocations(100000, edit), 40) << &edit - edits.data();
+  EXPECT_LT(allocations(2000, EDIT(s.insert(s.size() / 2, 'x'), s.push_front('y'))), 20);
 }
 
 TYPED_TEST(Allocation, CapacityFollowsTheStatedRules) {
@@ -75,68 +87,96 @@ TYPED_TEST(Allocation, CapacityFollowsTheStatedRules) {
   EXPECT_EQ(s.substr(1, 6).capacity(), 6);
   s.assign(9, 'a'), s.erase(0, 8), s.resize(0, 'a'), s.clear();
   EXPECT_EQ(s.capacity(), 16);
-  EXPECT_EQ(allocation::Count([&] { s + s, s + 'x'; }), 1) << "an empty sum takes none";
+  EXPECT_EQ(allocation::Count([&] { s + s; }), 0) << "an empty sum takes none";
+  s.resize(12, 'a');
+  EXPECT_EQ(allocation::Count([&] { s + s; }), 1);
+  EXPECT_EQ(allocation::Count([&] { s + 'x'; }), 1);
 }
 
 TYPED_TEST(Allocation, NoneWhereThereIsRoomAndNothingAliases) {
   using S = basic_xstring<TypeParam>;
-  S s = Of<TypeParam>("abcdef");
-  s.reserve(40);
   const S r = Of<TypeParam>("xyz");
-  EXPECT_EQ(allocation::Count([&] {
-              s.append(r), s.insert(2, r.data(), 3), s.replace(1, 2, r, 1, 1),
-                  s.push_back(r.begin(), r.end());
-              s.assign(r), s = r, s.insert(0, 3, s[0]), s.push_front(s.back()), s += s[1], s.c_str(),
-                           s.pop_back();
-              s.FindAndErase(s[0]), s.find(r), s.rfind(r), s.compare(r), s._Eq(r);
-            }),
-            0);
+  const EditsOf<S> edits = {EDIT(s.append(r)),
+                            EDIT(s.insert(2, r.data(), 3)),
+                            EDIT(s.replace(1, 2, r, 1, 1)),
+                            EDIT(s.push_back(r.begin(), r.end())),
+                            EDIT(s.assign(r)),
+                            EDIT(s = r),
+                            EDIT(s.insert(0, 3, s[0])),
+                            EDIT(s.push_front(s.back())),
+                            EDIT(s += s[1]),
+                            EDIT(s.pop_back(), s.c_str()),
+                            EDIT(s.FindAndErase(s[0])),
+                            EDIT(s.find(r), s.rfind(r)),
+                            EDIT(s.compare(r), s._Eq(r)),
+                            EDIT(s = *&s),
+                            EDIT(s.resize(6, 'x')),
+                            EDIT(s.assign(6, 'x')),
+                            EDIT(s.replace(0, 1, 4, 'x')),
+                            EDIT(s.resize(5, 'x'), s.c_str()),
+                            EDIT(s.reserve(6)),
+                            EDIT(s.push_back('x'), s.push_back('y'), s.push_back('z'))};
+  for (const auto& edit : edits) {
+    S s = Of<TypeParam>("abc");
+    s.reserve(6); // an exact fit for most of them
+    EXPECT_EQ(allocation::Count([&] { edit(s); }), 0) << &edit - edits.data();
+    EXPECT_EQ(s.capacity(), 6) << &edit - edits.data();
+  }
+}
+
+/// Expects that each edit throws where one of its allocations fails, and leaves v as it was.
+template <class V> void ExpectSafe(const V& v, const EditsOf<V>& edits) {
+  for (const auto& edit : edits) {
+    SCOPED_TRACE(&edit - edits.data());
+    int failures = 0;
+    for (; failures < 4; ++failures) { // some never succeed
+      V s(v);
+      const auto* const data = s.data();
+      allocation::failAfter = failures;
+      try {
+        edit(s);
+        break;
+      } catch (const std::bad_alloc&) {
+      }
+      allocation::failAfter = -1;
+      ASSERT_EQ(s.compare(v), 0);
+      ASSERT_EQ(s.data(), data);
+      ASSERT_EQ(s.capacity(), v.size());
+    }
+    allocation::failAfter = -1;
+    EXPECT_GT(failures, 0);
+  }
 }
 
 TYPED_TEST(Allocation, AFailureChangesNothing) {
   using S = basic_xstring<TypeParam>;
   const S r = Of<TypeParam>("0123456789");
-  const std::vector<std::function<void(S&)>> edits = {
-      [](S& s) { s.reserve(100); }, [](S& s) { s.resize(100, 'x'); }, [](S& s) { s.c_str(); },
-      [](S& s) { s.push_back('x'); }, [](S& s) { s.insert(1, 5, 'x'); }, [&](S& s) { s = r; },
-      [&](S& s) { s += r; }, [](S& s) { s += s; }, [](S& s) { s.assign(s, 1, 2); },
-      [&](S& s) { s.replace(1, 2, r); }, [](S& s) { s.replace(0, 3, s.data() + 1, 2); },
-      [](S& s) { s.assign(s.rbegin(), s.rend()); }, [](S& s) { s.insert(1, s.begin(), s.end()); },
-      [](S& s) { s *= 3; }, [](S& s) { s + s; }, [](S& s) { s.substr(); }, [](S& s) { S copy(s); },
-      [](S& s) { s.push_front(s[1]); }, [&](S& s) { s.insert(1, r); }, [&](S& s) { s.replace(1, 1, 5, 'x'); },
-      [&](S& s) { s.push_back(3, r.begin(), r.end()); }, [&](S& s) { s.append(r.data(), 4); },
-      [z = r.c_str()](S& s) { s.append(z); },
-      // What no machine can have.
-      [](S& s) { s.reserve(kMax); }, [](S& s) { s.resize(kMax, 'x'); }, [](S& s) { s.append(kMax, 'x'); },
-      [](S& s) { s.append((kMax - 1) / ssize_t(sizeof(TypeParam)), 'x'); },
-      [](S& s) { s.insert(0, kMax / 2 + 1, 'x'); }, [](S& s) { s.assign(kMax, 'x'); },
-      [](S& s) { s *= kMax; }, [](S& s) { s *= kMax / 3 + 1; }, [](S& s) { s.append(s.data(), kMax); }};
-  for (std::size_t i = 0; i < edits.size(); ++i) {
-    int failures = 0;
-    for (long failAfter = 0;; ++failAfter) {
-      S s(r, 0, 3);
-      const auto contents = Std(s);
-      const TypeParam* const data = s.data();
-      allocation::failAfter = failAfter;
-      try {
-        edits[i](s);
-        allocation::failAfter = -1;
-        break;
-      } catch (const std::bad_alloc&) {
-        allocation::failAfter = -1;
-        ++failures;
-        ASSERT_EQ(Std(s), contents) << i;
-        ASSERT_EQ(s.data(), data) << i;
-        ASSERT_EQ(s.capacity(), 3) << i;
-      }
-      if (failures > 4)
-        break; // it never succeeds
-    }
-    EXPECT_GT(failures, 0) << i;
-  }
+  const TypeParam* const z = r.c_str();
+  ExpectSafe<S>(
+      Of<TypeParam>("012"),
+      {EDIT(s.reserve(100)), EDIT(s.resize(100, 'x')), EDIT(s.c_str()), EDIT(s.push_back('x')),
+       EDIT(s.insert(1, 5, 'x')), EDIT(s = r), EDIT(s.assign(r)), EDIT(s.assign(z, 9)),
+       EDIT(s.assign(9, 'x')), EDIT(s += r), EDIT(s += s), EDIT(s.assign(s, 1, 2)), EDIT(s.replace(1, 2, r)),
+       EDIT(s.replace(0, 3, s.data() + 1, 2)), EDIT(s.assign(s.rbegin(), s.rend())),
+       EDIT(s.insert(1, s.begin(), s.end())), EDIT(s *= 3), EDIT(s + s), EDIT(s.substr()), EDIT(S copy(s)),
+       EDIT(s.push_front(s[1])), EDIT(s.insert(1, r)), EDIT(s.replace(1, 1, 5, 'x')),
+       EDIT(s.push_back(3, r.begin(), r.end())), EDIT(s.append(z, 4)), EDIT(s.append(z)),
+       // What no machine can have.
+       EDIT(s.reserve(kMax)), EDIT(s.resize(kMax, 'x')), EDIT(s.append(kMax, 'x')),
+       EDIT(s.append((kMax - 1) / ssize_t(sizeof(TypeParam)), 'x')), EDIT(s.insert(0, kMax / 2 + 1, 'x')),
+       EDIT(s.assign(kMax, 'x')), EDIT(s *= kMax), EDIT(s *= kMax / 3 + 1), EDIT(s.append(s.data(), kMax))});
   S empty;
   empty *= kMax;
   EXPECT_EQ(empty.capacity(), 0);
+}
+
+TEST(Allocation, AFailureLeavesABufferAsItWas) {
+  const mirel::VectorOfByte r(9, 7);
+  ExpectSafe<mirel::VectorOfByte>({1, 2, 3}, {EDIT(s.assign(r.begin(), r.end())), EDIT(s = r), EDIT(s += r),
+                                              EDIT(s.insert(1, 9, 7)), EDIT(s.insert(1, r.begin(), r.end())),
+                                              EDIT(s.insert(1, 7)), EDIT(s.growbytes(1)), EDIT(s.resize(4)),
+                                              EDIT(s.push_back('x')), EDIT(s.insertbytes(0, kMax)),
+                                              EDIT(s.resize(kMax))});
 }
 
 TYPED_TEST(Allocation, AFailedConversionThrowsAndKeepsTheBeginning) {

@@ -153,23 +153,17 @@ public:
     const T c = this->Unit();
     const T* const p = r.data();
     const ssize_t pn = r.size();
-    const auto is = [](ssize_t ours, std::size_t theirs) { return ours == static_cast<ssize_t>(theirs); };
-    ASSERT_PRED2(is, v.find(c, forward), text.find(c, uf));
-    ASSERT_PRED2(is, v.find(r, forward), text.find(pattern, uf));
-    ASSERT_PRED2(is, v.rfind(c, reverse), text.rfind(c, ur));
-    ASSERT_PRED2(is, v.rfind(r, reverse), text.rfind(pattern, ur));
-    ASSERT_PRED2(is, v.find_first_of(r, forward), text.find_first_of(pattern, uf));
-    ASSERT_PRED2(is, v.find_first_not_of(r, forward), text.find_first_not_of(pattern, uf));
-    ASSERT_PRED2(is, v.find_first_not_of(c, forward), text.find_first_not_of(c, uf));
-    ASSERT_PRED2(is, v.find_last_of(r, reverse), text.find_last_of(pattern, ur));
-    ASSERT_PRED2(is, v.find_last_not_of(r, reverse), text.find_last_not_of(pattern, ur));
-    ASSERT_PRED2(is, v.find_last_not_of(c, reverse), text.find_last_not_of(c, ur));
-    ASSERT_PRED2(is, v.find(p, forward, pn), text.find(pattern, uf));
-    ASSERT_PRED2(is, v.rfind(p, reverse, pn), text.rfind(pattern, ur));
-    ASSERT_PRED2(is, v.find_first_of(p, forward, pn), text.find_first_of(pattern, uf));
-    ASSERT_PRED2(is, v.find_first_not_of(p, forward, pn), text.find_first_not_of(pattern, uf));
-    ASSERT_PRED2(is, v.find_last_of(p, reverse, pn), text.find_last_of(pattern, ur));
-    ASSERT_PRED2(is, v.find_last_not_of(p, reverse, pn), text.find_last_not_of(pattern, ur));
+#define SEARCH(NAME, OURS, THEIRS)                                                                           \
+  ASSERT_EQ(v.NAME(c, OURS), ssize_t(text.NAME(c, THEIRS)));                                                 \
+  ASSERT_EQ(v.NAME(r, OURS), ssize_t(text.NAME(pattern, THEIRS)));                                           \
+  ASSERT_EQ(v.NAME(p, OURS, pn), ssize_t(text.NAME(pattern, THEIRS)))
+    SEARCH(find, forward, uf);
+    SEARCH(find_first_of, forward, uf);
+    SEARCH(find_first_not_of, forward, uf);
+    SEARCH(rfind, reverse, ur);
+    SEARCH(find_last_of, reverse, ur);
+    SEARCH(find_last_not_of, reverse, ur);
+#undef SEARCH
     ASSERT_EQ(v.contains(r.begin(), r.end(), forward), text.compare(uf, pattern.size(), pattern) == 0);
     ASSERT_EQ(Std(v.substr(forward, kNpos)), text.substr(uf));
     const auto other = std::basic_string<T>(this->Text(12));
@@ -182,7 +176,8 @@ public:
     ASSERT_EQ(sign(v.compare(o)), expected);
     ASSERT_EQ(sign(v.compare(0, v.size(), o, 0, o.size())), expected);
     ASSERT_EQ(sign(v.compare(o.data(), o.size())), expected);
-    ASSERT_TRUE(v._Eq(o) == (expected == 0) && v._Lt(o) == (expected < 0));
+    ASSERT_EQ(v._Eq(o), expected == 0);
+    ASSERT_EQ(v._Lt(o), expected < 0);
     ASSERT_TRUE(sizeof(T) == 1 || v.compare(o) == expected);
   }
 };

@@ -84,6 +84,28 @@ TYPED_TEST(Overload, LiteralZeroIsANumber) {
   static_assert(!std::is_constructible_v<S, std::nullptr_t>);
 }
 
+TYPED_TEST(Overload, SearchesForIntegersTakeAnOffset) {
+  const auto s = Of<TypeParam>("abcabc");
+  EXPECT_EQ(s.find(0x61, 1), 3);
+  EXPECT_EQ(s.find_first_of(0x61, 1), 3);
+  EXPECT_EQ(s.find_first_not_of(0x61, 3), 4);
+  EXPECT_EQ(s.rfind(0x61, 2), 0);
+  EXPECT_EQ(s.find_last_of(0x61, 2), 0);
+  EXPECT_EQ(s.find_last_not_of(0x62, 1), 0);
+}
+
+TYPED_TEST(Overload, ReverseSearchesFromTheFirstUnit) {
+  const auto s = Of<TypeParam>("abab"), r = Of<TypeParam>("b");
+  const std::list<TypeParam> list(1, 'b');
+  const auto check = [&](auto... b) {
+    EXPECT_EQ(s.rfind(b...), kNpos);
+    EXPECT_EQ(s.find_last_of(b...), kNpos);
+    EXPECT_EQ(s.find_last_not_of(b...), 0);
+  };
+  check(r, 0), check(r[0], 0), check(0x62, 0), check(r.c_str(), 0);
+  check(r.begin(), r.end(), 0), check(list.begin(), list.end(), 0), check(r.data(), 0, 1);
+}
+
 // Calls with a string and a pointer, to be asked whether they would compile.
 #define CALL(EXPRESSION) [](auto&& s, auto p) -> decltype(EXPRESSION, void()) { static_cast<void>(s), p; }
 
@@ -137,7 +159,10 @@ TYPED_TEST(Overload, DeclaredSignatures) {
   static_assert(!kFindsInConst<V> && !kFindsInConst<S>);
   static_assert(std::is_convertible_v<const T*, S> && !std::is_convertible_v<const T*, V>);
   static_assert(!std::is_default_constructible_v<typename V::reverse_iterator>);
-  static_assert(std::is_nothrow_destructible_v<S> && std::is_nothrow_swappable_v<V>);
+  static_assert(std::is_nothrow_destructible_v<S> && std::is_nothrow_destructible_v<VectorOfByte>);
+  static_assert(std::is_nothrow_swappable_v<V> && std::is_nothrow_swappable_v<S>);
+  static_assert(noexcept(std::declval<S&>().swap(std::declval<S&>())));
+  static_assert(noexcept(std::declval<VectorOfByte&>().swap(std::declval<VectorOfByte&>())));
   EXPECT_TRUE((static_cast<T* (V::*)(T*, const T&)>(&V::insert)) != nullptr);
   EXPECT_TRUE((static_cast<void (V::*)(ssize_t, int, const T&)>(&V::insert)) != nullptr);
   EXPECT_TRUE((static_cast<void (V::*)(ssize_t) const>(&V::reserve)) != nullptr);

@@ -64,6 +64,10 @@ template <class V, class... A> struct CallOf {
 #define WITH_I1_I2(...) CALL((auto& v, ssize_t i1, ssize_t i2), __VA_ARGS__)
 #define WITH_P_PN(...) CALL((auto& v, auto p, ssize_t pn), __VA_ARGS__)
 #define WITH_R1_R2(...) CALL((auto& v, auto r1, auto r2), __VA_ARGS__)
+#define FORWARD(WITH, ...)                                                                                   \
+  WITH(v.find(__VA_ARGS__)), WITH(v.find_first_of(__VA_ARGS__)), WITH(v.find_first_not_of(__VA_ARGS__))
+#define REVERSE(WITH, ...)                                                                                   \
+  WITH(v.rfind(__VA_ARGS__)), WITH(v.find_last_of(__VA_ARGS__)), WITH(v.find_last_not_of(__VA_ARGS__))
 
 /// Expects that each of the calls stops with text for each of the arguments, while the storage of v is as
 /// before.
@@ -140,16 +144,11 @@ TYPED_TEST(Precondition, OfIndicesAndCounts) {
   const T *const q = r.data(), *const z = r.c_str(), x = 'x';
   S s = Of<T>("abc");
   ExpectStops(s, kForward, kBadIndex,
-              {WITH_I(v.find(x, i)), WITH_I(v.find(r, i)), WITH_I(v.find(z, i)), WITH_I(v.find(q + 1, q, i)),
-               WITH_I(v.find_first_of(x, i)), WITH_I(v.find_first_of(r, i)),
-               WITH_I(v.find_first_of(q + 1, q, i)), WITH_I(v.find_first_not_of(x, i)),
-               WITH_I(v.find_first_not_of(r, i)), WITH_I(v.find_first_not_of(q + 1, q, i)),
-               WITH_I(v.contains(q + 1, q, i)), WITH_I(v.substr(i, 9))});
-  ExpectStops(s, kReverse, kBadReverse,
-              {WITH_I(v.rfind(x, i)), WITH_I(v.rfind(r, i)), WITH_I(v.rfind(q + 1, q, i)),
-               WITH_I(v.find_last_of(x, i)), WITH_I(v.find_last_of(r, i)),
-               WITH_I(v.find_last_of(q + 1, q, i)), WITH_I(v.find_last_not_of(x, i)),
-               WITH_I(v.find_last_not_of(r, i)), WITH_I(v.find_last_not_of(q + 1, q, i))});
+              {FORWARD(WITH_I, x, i), FORWARD(WITH_I, r, i), FORWARD(WITH_I, z, i),
+               FORWARD(WITH_I, q + 1, q, i), WITH_I(v.contains(q + 1, q, i)), WITH_I(v.substr(i, 9))});
+  ExpectStops(
+      s, kReverse, kBadReverse,
+      {REVERSE(WITH_I, x, i), REVERSE(WITH_I, r, i), REVERSE(WITH_I, z, i), REVERSE(WITH_I, q + 1, q, i)});
   ExpectStops(s, kLength, kBadLengthFrom2, {WITH_N(v.substr(2, n))});
   ExpectStops(s, kIndex, kBadIndex,
               {WITH_I(v.insert(i, x)), WITH_I(v.insert(i, r)), WITH_I(v.insert(i, -1, x)),
@@ -175,20 +174,16 @@ TYPED_TEST(Precondition, OfPointersAndRanges) {
   const T* const q = r.data();
   T* const volatile null = nullptr;
   S s = Of<T>("abc");
-  ExpectStops(s, kPointer,
-              std::vector<std::tuple<const T*, ssize_t>>{{null, 1}, {null, kMax}, {q, -1}, {q, kMin}},
-              {WITH_P_PN(S(p, pn)), WITH_P_PN(v.assign(p, pn)), WITH_P_PN(v.append(p, pn)),
-               WITH_P_PN(v.insert(99, p, pn)), WITH_P_PN(v.replace(1, 1, p, pn)),
-               WITH_P_PN(v.replace(v.begin(), v.end(), p, pn)), WITH_P_PN(v.compare(p, pn)),
-               WITH_P_PN(v.compare(1, 1, p, pn)), WITH_P_PN(v.find(p, 99, pn)), WITH_P_PN(v.rfind(p, 99, pn)),
-               WITH_P_PN(v.find_first_of(p, 99, pn)), WITH_P_PN(v.find_first_not_of(p, 99, pn)),
-               WITH_P_PN(v.find_last_of(p, 99, pn)), WITH_P_PN(v.find_last_not_of(p, 99, pn))});
+  ExpectStops(
+      s, kPointer, std::vector<std::tuple<const T*, ssize_t>>{{null, 1}, {null, kMax}, {q, -1}, {q, kMin}},
+      {WITH_P_PN(S(p, pn)), WITH_P_PN(v.assign(p, pn)), WITH_P_PN(v.append(p, pn)),
+       WITH_P_PN(v.insert(99, p, pn)), WITH_P_PN(v.replace(1, 1, p, pn)),
+       WITH_P_PN(v.replace(v.begin(), v.end(), p, pn)), WITH_P_PN(v.compare(p, pn)),
+       WITH_P_PN(v.compare(1, 1, p, pn)), FORWARD(WITH_P_PN, p, 99, pn), REVERSE(WITH_P_PN, p, 99, pn)});
   ExpectStops(s, kRange, std::vector<std::tuple<const T*, const T*>>{{q + 1, q}},
               {WITH_R1_R2(S(r1, r2)), WITH_R1_R2(v.assign(r1, r2)), WITH_R1_R2(v.push_back(r1, r2)),
                WITH_R1_R2(v.push_back(2, r1, r2)), WITH_R1_R2(v.insert(0, r1, r2)),
-               WITH_R1_R2(v.find(r1, r2)), WITH_R1_R2(v.rfind(r1, r2)), WITH_R1_R2(v.contains(r1, r2, 0)),
-               WITH_R1_R2(v.find_first_of(r1, r2)), WITH_R1_R2(v.find_first_not_of(r1, r2)),
-               WITH_R1_R2(v.find_last_of(r1, r2)), WITH_R1_R2(v.find_last_not_of(r1, r2))});
+               WITH_R1_R2(v.contains(r1, r2, 0)), FORWARD(WITH_R1_R2, r1, r2), REVERSE(WITH_R1_R2, r1, r2)});
   const auto empty = std::make_unique<S>();
   const S& constEmpty = *empty;
   ExpectStops(s, kNotEmpty, kOnce,
