@@ -12,6 +12,8 @@
 #include <type_traits>
 #include <utility>
 
+#include <utils/Integers.h>
+#include <utils/NotOffered.h>
 #include <utils/Precondition.h>
 #include <utils/TwoWay.h>
 #include <utils/xchar.h>
@@ -21,12 +23,6 @@ namespace mirel {
 namespace detail {
 
 struct Storage; // what the conversions know of a vector's storage
-
-/// Lets an overload take part only for integers. An integer argument of any type matches such an overload
-/// exactly, which is how a literal 0 stays an index or a count where a pointer could be meant too.
-template <class N>
-constexpr bool kIsInteger = std::is_integral_v<N> || (std::is_enum_v<N> && std::is_convertible_v<N, int>);
-template <class... N> using IfIntegers = std::enable_if_t<(kIsInteger<N> && ...), int>;
 
 } // namespace detail
 
@@ -50,7 +46,7 @@ template <class It1, class It2> int LexicographicalCompareX(It1 x1, It1 x2, It2 
   return y1 == y2 ? 0 : -1;
 }
 
-/// The same order for bytes. A difference within the common length yields the value of memcmp, of any size;
+/// Orders two ranges of bytes. A difference within the common length yields the value of memcmp, of any size;
 /// otherwise the lengths decide: -1, 0 or 1.
 inline int LexicographicalCompareX(const unsigned char* x1, const unsigned char* x2, const unsigned char* y1,
                                    const unsigned char* y2) {
@@ -64,7 +60,7 @@ inline int LexicographicalCompareX(const unsigned char* x1, const unsigned char*
   return lenX < lenY ? -1 : lenX > lenY;
 }
 
-/// The same for 8-bit code units, as bytes.
+/// Orders two ranges of 8-bit code units, as bytes.
 inline int LexicographicalCompareX(const char* x1, const char* x2, const char* y1, const char* y2) {
   const auto bytes = [](const char* p) { return reinterpret_cast<const unsigned char*>(p); };
   return LexicographicalCompareX(bytes(x1), bytes(x2), bytes(y1), bytes(y2));
@@ -74,7 +70,7 @@ inline int LexicographicalCompareX(const char* x1, const char* x2, const char* y
 inline bool IsEqual(const char8* x1, const char8* x2, const char8* y1) {
   return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1)) == 0;
 }
-/// The same for 16-bit code units.
+/// Whether the range [x1, x2) of 16-bit code units and the one of the same length at y1 hold the same ones.
 inline bool IsEqual(const uint16* x1, const uint16* x2, const uint16* y1) {
   return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1) * sizeof(uint16)) == 0;
 }
@@ -292,14 +288,17 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 /// An untyped, growable array of bytes: the storage of every vector and string.
 ///
 /// Parameters: `i` is an offset or an iterator, `n` a number of bytes from there, `i1`/`i2` and `r1`/`r2` the
-/// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a repeat count. Overloads that
-/// are templates take integers of any type and do what the overload before them does.
+/// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a repeat count. An integer of
+/// any type may stand for each: a literal 0 is never a pointer.
 ///
 /// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments
-/// stop the process with the text after "@pre". Memory that can't be had is std::bad_alloc, thrown before
-/// anything has changed. Whatever may grow the buffer may move its storage and so invalidates pointers into
-/// it; erasing keeps the storage and moves down the bytes behind. A run of edits costs amortised constant
-/// time per byte added, plus the bytes that it moves.
+/// stop the process with the text after "@pre", before anything has changed; that a source isn't reversed is
+/// checked after all offsets and counts, and last that its beginning isn't null where its end is another.
+/// @pre "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)" of each source
+///
+/// A failed allocation throws std::bad_alloc before anything has changed. Whatever may grow the buffer may
+/// move its storage and so invalidates pointers into it; erasing keeps the storage and moves down the bytes
+/// behind. A sequence of edits costs amortised constant time per byte added, plus the bytes that it moves.
 class MIREL_DESCRIBED MIREL_API VectorOfByte {
 public:
   typedef uint8 value_type;     ///< A byte.
@@ -314,9 +313,6 @@ public:
   VectorOfByte(const value_type* r1, const value_type* r2);
   /// count bytes of value x. @pre "0 <= count"
   explicit VectorOfByte(ssize_t count, value_type x);
-  /// The same for integers of any type.
-  template <class N, class X, detail::IfIntegers<N, X> = 0>
-  explicit VectorOfByte(N count, X x) : VectorOfByte(ssize_t(count), value_type(x)) {}
   /// The listed bytes.
   VectorOfByte(std::initializer_list<uint8> r);
   /// A copy, whose capacity is its size.
@@ -367,8 +363,8 @@ public:
 
   value_type* begin() { return m_buffer; }                        ///< The first byte.
   const value_type* begin() const { return m_buffer; }            ///< The first byte.
-  value_type* end() { return m_buffer + size_; }                  ///< Behind the last byte.
-  const value_type* end() const { return m_buffer + size_; }      ///< Behind the last byte.
+  value_type* end() { return m_buffer + size_; }                  ///< Past the end.
+  const value_type* end() const { return m_buffer + size_; }      ///< Past the end.
   value_type* data() { return m_buffer; }                         ///< As begin().
   const value_type* data() const { return m_buffer; }             ///< As begin().
   value_type* data_end() { return m_buffer + size_; }             ///< As end().
@@ -402,7 +398,7 @@ public:
     return m_buffer[size_ - 1];
   }
 
-  /// Whether p points into the storage, the spare part included.
+  /// Whether p points into the storage, unused capacity included.
   bool owns(const void* p) const {
     return reinterpret_cast<uintptr_t>(p) - reinterpret_cast<uintptr_t>(m_buffer) <
            static_cast<uintptr_t>(m_capacity);
@@ -419,8 +415,10 @@ public:
   /// Appends the bytes of [r1, r2). @pre "r1 <= r2"
   void push_back(const value_type* r1, const value_type* r2);
 
-  /// Appends the bytes of one T. When the buffer is full it reserves the new size plus the old capacity.
+  /// Appends the bytes of one number. When the buffer is full it reserves the new size plus the old capacity.
   template <class T> void push_back(const T& x) {
+    static_assert(std::is_arithmetic_v<T> || std::is_enum_v<T>,
+                  "push_back appends one number: write += for a buffer, and push_back(r1, r2) for bytes");
     const T value = x; // x may lie in the storage that reserve() is about to give up
     const ssize_t n = size_ + ssize_t(sizeof(T));
     if (m_capacity < n) {
@@ -440,46 +438,29 @@ public:
 
   /// @}
   /// @name Inserting
-  /// Before offset or iterator i.
+  /// Before an iterator the precondition is on its distance from begin().
   /// @{
 
   /// Opens a gap of n bytes, of no particular value. @pre "0 <= i && i <= size()", then "0 <= n"
   void insertbytes(ssize_t i, ssize_t n);
-  /// Inserts the bytes of [r1, r2). @pre "0 <= i && i <= size()", then "r1 <= r2"
+  /// Inserts the bytes of [r1, r2) before offset i. @pre "0 <= i && i <= size()", then "r1 <= r2"
   void insert(ssize_t i, const value_type* r1, const value_type* r2);
-  /// The same before an iterator.
+  /// Inserts the bytes of [r1, r2) before an iterator. @pre "0 <= i && i <= size()", then "r1 <= r2"
   void insert(iterator i, const value_type* r1, const value_type* r2) { insert(i - begin(), r1, r2); }
-  /// Inserts count bytes of value x. @pre "0 <= i && i <= size()", then "0 <= count"
+  /// Inserts count bytes of value x before offset i. @pre "0 <= i && i <= size()", then "0 <= count"
   void insert(ssize_t i, ssize_t count, value_type x);
-  /// The same before an iterator.
+  /// Inserts count bytes of value x before an iterator. @pre "0 <= i && i <= size()", then "0 <= count"
   void insert(iterator i, ssize_t count, value_type x) { insert(i - begin(), count, x); }
-  /// Inserts one byte. @pre "0 <= i && i <= size()"
+  /// Inserts one byte before offset i. @pre "0 <= i && i <= size()"
   void insert(ssize_t i, value_type x) { insert(i, ssize_t(1), x); }
-  /// The same before an iterator. @return where the byte is now
+  /// Inserts one byte before an iterator. @pre "0 <= i && i <= size()" @return where the byte is now
   iterator insert(iterator i, value_type x);
-
-  /// The bytes of [r1, r2), before an offset of any integer type.
-  template <class N, detail::IfIntegers<N> = 0> void insert(N i, const value_type* r1, const value_type* r2) {
-    insert(ssize_t(i), r1, r2);
-  }
-  /// count bytes of value x, for integers of any type.
-  template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
-    insert(ssize_t(i), ssize_t(count), value_type(x));
-  }
-  /// The same before an iterator.
-  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(iterator i, N count, X x) {
-    insert(i - begin(), ssize_t(count), value_type(x));
-  }
-  /// One byte, for integers of any type.
-  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) {
-    insert(ssize_t(i), value_type(x));
-  }
 
   /// @}
   /// @name Moving, erasing
   /// @{
 
-  /// Moves n bytes from offset s to offset d, also where the two stretches overlap.
+  /// Moves n bytes from offset s to offset d, also where the two ranges overlap.
   /// @pre "0 <= d && 0 <= n && d+n <= size()", then "0 <= s && 0 <= n && s+n <= size()"
   void move(ssize_t d, ssize_t s, ssize_t n);
   /// Removes the bytes of [i1, i2). @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
@@ -488,10 +469,6 @@ public:
   iterator erase(iterator i);
   /// Removes n bytes from offset i on. @pre "0 <= i && 0 <= n && i+n <= size()"
   void erase(ssize_t i, ssize_t n);
-  /// The same for integers of any type.
-  template <class N, class M, detail::IfIntegers<N, M> = 0> void erase(N i, M n) {
-    erase(ssize_t(i), ssize_t(n));
-  }
   /// Removes the byte at offset i. @pre "0 <= i && i < size()"
   void erase_element(ssize_t i);
 
@@ -501,14 +478,14 @@ public:
   /// the shorter length.
   /// @{
 
-  /// All bytes, with those of r.
+  /// Compares all bytes with those of r.
   int compare(const VectorOfByte& r) const;
-  /// n bytes from offset i on, with those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
+  /// Compares n bytes from offset i on with those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const VectorOfByte& r) const;
-  /// n bytes from offset i on, with rn of r from ri on.
+  /// Compares n bytes from offset i on with rn of r from ri on.
   /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   int compare(ssize_t i, ssize_t n, const VectorOfByte& r, ssize_t ri, ssize_t rn) const;
-  /// n bytes from offset i on, with the pn at p.
+  /// Compares n bytes from offset i on with the pn at p.
   /// @pre "0 <= i && 0 <= n && i+n <= size()", then "pn == 0 || (pn > 0 && p != nullptr)"
   int compare(ssize_t i, ssize_t n, const value_type* p, ssize_t pn) const;
 
@@ -528,6 +505,38 @@ public:
 
   /// @}
 
+  // Integers of any type, which match these overloads exactly and do what the declared overload of their name
+  // does; and what is refused.
+  /// @cond
+
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  explicit VectorOfByte(N count, X x) : VectorOfByte(detail::Count(count), detail::Unit<value_type>(x)) {}
+  template <class N, detail::IfIntegers<N> = 0> void insert(N i, const value_type* r1, const value_type* r2) {
+    insert(detail::Count(i), r1, r2);
+  }
+  template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
+    insert(detail::Count(i), detail::Count(count), detail::Unit<value_type>(x));
+  }
+  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(iterator i, N count, X x) {
+    insert(i, detail::Count(count), detail::Unit<value_type>(x));
+  }
+  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) {
+    insert(detail::Count(i), detail::Unit<value_type>(x));
+  }
+  template <class X, detail::IfIntegers<X> = 0> iterator insert(iterator i, X x) {
+    return insert(i, detail::Unit<value_type>(x));
+  }
+  template <class N, class M, detail::IfIntegers<N, M> = 0> void erase(N i, M n) {
+    erase(detail::Count(i), detail::Count(n));
+  }
+
+  iterator erase(std::nullptr_t) = delete;
+  template <class N, detail::IfIntegers<N> = 0> detail::WriteEraseElement erase(N) = delete;
+  template <class N, class M, detail::IfIntegers<N, M> = 0> detail::WriteNullptr assign(N, M) = delete;
+  template <class N, class M, detail::IfIntegers<N, M> = 0> detail::WriteNullptr push_back(N, M) = delete;
+  template <class... N, detail::IfIntegers<N...> = 0> detail::WriteNullptr compare(N...) const = delete;
+  /// @endcond
+
 private:
   // By value, so that a buffer whose address nobody takes can live in registers through a loop of appends.
   static value_type* Reallocate(value_type* buffer, ssize_t n);
@@ -538,7 +547,7 @@ private:
 
 public:
   mutable value_type* m_buffer; ///< The storage, or null while there is none.
-  ssize_t size_; ///< Bytes in use, 0 <= size_ <= m_capacity; the rest is spare and may be written.
+  ssize_t size_; ///< Bytes in use, 0 <= size_ <= m_capacity; the rest is unused capacity and may be written.
   mutable ssize_t m_capacity; ///< Bytes of storage.
 };
 

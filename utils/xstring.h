@@ -1,9 +1,9 @@
 /// @file
-/// string8 and string16, their zero-terminated interface, and the conversions between UTF-8, UTF-16 and
+/// string8 and string16, their null-terminated interface, and the conversions between UTF-8, UTF-16 and
 /// ASCII.
 ///
-/// The string knows zero termination and nothing else: it measures a zero-terminated argument once and hands
-/// the run to the vector. It has no storage and no invariant of its own.
+/// The string knows null termination and nothing else: it measures a null-terminated argument once and hands
+/// the range to the vector. It has no storage and no invariant of its own.
 
 #pragma once
 
@@ -16,9 +16,11 @@ namespace mirel {
 
 class xostream;
 
-/// The number of code units before the first zero unit at s, which may not be null. Linear.
+/// The number of code units before the null at s, in linear time. s may not be a null pointer, and isn't
+/// checked.
 inline ssize_t GetStringLength(const char8* s) { return static_cast<ssize_t>(std::strlen(s)); }
-/// The same of 16-bit code units.
+/// The number of 16-bit code units before the null at s, in linear time. s may not be a null pointer, and
+/// isn't checked.
 inline ssize_t GetStringLength(const char16* s) {
   const char16* end = s;
   while (*end != 0)
@@ -26,15 +28,22 @@ inline ssize_t GetStringLength(const char16* s) {
   return end - s;
 }
 
-/// A string: a vector of code units that also takes and gives zero-terminated runs.
+/// The length of a null-terminated argument of a member. A macro, so that the report names the member.
+#define MIREL_LENGTH(s) (MIREL_ASSERT_AS((s) != nullptr, "s != nullptr"), GetStringLength(s))
+
+/// A string: a vector of code units that also takes and gives null-terminated strings.
 ///
-/// Any of its units may be zero, and no terminator is kept: c_str() writes one behind the contents, where the
-/// next change may overwrite it. All that xvector offers is offered here too, and what is said there of bad
-/// arguments, memory, invalidation, aliasing and cost holds.
+/// Any of its units may be null, and no terminator is kept: c_str() writes one past the end, where the next
+/// change may overwrite it. All that xvector offers is offered here too, and what is said there of bad
+/// arguments, ranges, memory, invalidation, aliasing and cost holds.
 ///
-/// A zero-terminated argument (`const T*` without a count) must not be null, and ends before its first zero;
-/// it is measured once, before anything is checked or changed, and then treated as a pointer and count. The
-/// deleted overloads keep a literal null from being one.
+/// A null-terminated argument (`const T*` without a count) ends before its first null. It is measured once,
+/// before anything else is checked or changed, and then treated as a pointer and count. A literal null
+/// pointer isn't taken for one.
+/// @pre "s != nullptr" of every null-terminated argument
+///
+/// In braces two integers are a count and a unit, never a list: string8{3, 'x'} has three units, and
+/// `s = {3, 'x'}` doesn't compile. Only `s = {}` is an assignment, and empties the string.
 template <class T> class MIREL_DESCRIBED MIREL_API basic_xstring : public xvector<T> {
   typedef xvector<T> Base;
 
@@ -49,19 +58,14 @@ public:
   basic_xstring(const basic_xstring<T>& r, ssize_t ri, ssize_t rn) : Base(r, ri, rn) {}
   /// The rn units at r. @pre "pn == 0 || (pn > 0 && p != nullptr)", of r and rn
   basic_xstring(const T* r, ssize_t rn) : Base(r, rn) {}
-  /// The same for counts of any integer type.
-  template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
-  basic_xstring(P r, N rn) : Base(static_cast<const T*>(r), ssize_t(rn)) {}
-  /// A zero-terminated run.
-  basic_xstring(const T* r) : Base(r, r + GetStringLength(r)) {}
-  basic_xstring(std::nullptr_t) = delete;
+  /// The units of a null-terminated string.
+  basic_xstring(const T* r) : Base(r, MIREL_LENGTH(r)) {}
   /// count units x. @pre "0 <= count"
   explicit basic_xstring(ssize_t count, T x) : Base(count, x) {}
-  /// The same for integers of any type.
-  template <class N, class X, detail::IfIntegers<N, X> = 0>
-  explicit basic_xstring(N count, X x) : Base(ssize_t(count), T(x)) {}
   /// The units of [r1, r2). @pre "r1 <= r2"
   basic_xstring(const T* r1, const T* r2) : Base(r1, r2) {}
+  /// The units of [r1, r2), which may be any iterators. @pre "r1 <= r2"
+  template <class It, detail::IfIterator<It> = 0> basic_xstring(It r1, It r2) : Base(r1, r2) {}
   /// A copy, whose capacity is its size.
   basic_xstring(const basic_xstring<T>& r) : Base(r) {}
   /// The units of a vector, as operator+ returns it. A template, so that braces are never taken for one.
@@ -76,35 +80,25 @@ public:
 
   /// Becomes a copy of r; keeps the storage where it is large enough.
   basic_xstring<T>& operator=(const basic_xstring<T>& r) = default;
-  /// Becomes a copy of a zero-terminated run.
-  basic_xstring<T>& operator=(const T* rhs) {
-    assign(rhs);
-    return *this;
-  }
-  basic_xstring<T>& operator=(std::nullptr_t) = delete;
-  /// The listed units. Without it `s = {}` would be a null pointer.
-  basic_xstring<T>& operator=(std::initializer_list<T> r) {
-    assign(r.begin(), r.end());
-    return *this;
-  }
+  /// Becomes a copy of a null-terminated string.
+  basic_xstring<T>& operator=(const T* rhs) { return assign(rhs); }
   using Base::assign;
-  /// Becomes a copy of a zero-terminated run.
+  /// Becomes a copy of a null-terminated string.
   basic_xstring<T>& assign(const T* s) {
-    assign(s, GetStringLength(s));
+    assign(s, MIREL_LENGTH(s));
     return *this;
   }
-  basic_xstring<T>& assign(std::nullptr_t) = delete;
 
   /// @}
-  /// @name Zero termination
+  /// @name Null termination
   /// @{
 
-  /// The contents with a zero unit behind them, which is not part of the string.
+  /// The contents with a null past the end, which is not part of the string.
   ///
   /// It counts as a change, though it is const: it may move the storage, and no other thread may use the
-  /// string meanwhile. It does move it where there is no spare unit, and then makes room for more than one,
-  /// so that appends and c_str() in turn take amortised constant time. The result is valid until the next
-  /// change; a second call without one gives the same pointer.
+  /// string meanwhile. It does move it where there is no unused capacity, and then makes room for more than
+  /// one, so that appends and c_str() in turn take amortised constant time. The result is valid until the
+  /// next change; a second call without one gives the same pointer.
   /// @pre "p": never null after room was made
   const T* c_str() const {
     const ssize_t n = this->size();
@@ -121,58 +115,48 @@ public:
   /// @{
 
   using Base::operator+=;
-  /// Appends a zero-terminated run.
+  /// Appends a null-terminated string.
   basic_xstring<T>& operator+=(const T* s) { return append(s); }
-  basic_xstring<T>& operator+=(std::nullptr_t) = delete;
-  /// Appends one unit, given as an integer of any type.
-  template <class X, detail::IfIntegers<X> = 0> xvector<T>& operator+=(X x) { return Base::operator+=(T(x)); }
   using Base::append;
-  /// Appends a zero-terminated run.
+  /// Appends a null-terminated string.
   basic_xstring<T>& append(const T* s) {
-    this->push_back(s, s + GetStringLength(s));
+    append(s, MIREL_LENGTH(s));
     return *this;
   }
-  basic_xstring<T>& append(std::nullptr_t) = delete;
   using Base::insert;
-  /// Inserts a zero-terminated run before index i. @pre "0 <= i && i <= size()"
+  /// Inserts a null-terminated string before index i. @pre "0 <= i && i <= size()"
   basic_xstring<T>& insert(ssize_t i, const T* s) {
-    insert(i, s, s + GetStringLength(s));
+    insert(i, s, MIREL_LENGTH(s));
     return *this;
   }
-  basic_xstring<T>& insert(ssize_t, std::nullptr_t) = delete;
   using Base::replace;
-  /// Puts a zero-terminated run in the place of n units from index i on.
+  /// Replaces n units from index i on by a null-terminated string.
   /// @pre "0 <= i && 0 <= n && i+n <= size()"
   basic_xstring<T>& replace(ssize_t i, ssize_t n, const T* p) {
-    replace(i, n, p, GetStringLength(p));
+    replace(i, n, p, MIREL_LENGTH(p));
     return *this;
   }
-  basic_xstring<T>& replace(ssize_t, ssize_t, std::nullptr_t) = delete;
 
   /// @}
   /// @name Comparison
   /// @{
 
   using Base::compare;
-  /// With a zero-terminated run.
-  int compare(const T* p) const { return compare(p, GetStringLength(p)); }
-  int compare(std::nullptr_t) const = delete;
-  /// n units from index i on, with a zero-terminated run. @pre "0 <= i && 0 <= n && i+n <= size()"
-  int compare(ssize_t i, ssize_t n, const T* p) const { return compare(i, n, p, GetStringLength(p)); }
-  int compare(ssize_t, ssize_t, std::nullptr_t) const = delete;
+  /// Compares all units with those of a null-terminated string.
+  int compare(const T* p) const { return compare(p, MIREL_LENGTH(p)); }
+  /// Compares n units from index i on with a null-terminated string.
+  /// @pre "0 <= i && 0 <= n && i+n <= size()"
+  int compare(ssize_t i, ssize_t n, const T* p) const { return compare(i, n, p, MIREL_LENGTH(p)); }
   using Base::_Eq;
-  /// Whether the string holds the units of a zero-terminated run.
+  /// Whether the string holds the units of a null-terminated string.
   bool _Eq(const T* rhs) const { return compare(rhs) == 0; }
-  bool _Eq(std::nullptr_t) const = delete;
   using Base::_Lt;
-  /// Whether the string orders before a zero-terminated run.
+  /// Whether the string orders before a null-terminated string.
   bool _Lt(const T* rhs) const { return compare(rhs) < 0; }
-  bool _Lt(std::nullptr_t) const = delete;
 
   /// @}
   /// @name Search
-  /// An integer of any type is a unit: find(0) looks for a zero unit, not at a null pointer. Results, and
-  /// what offset may be, are as in the vector's searches: from offset on forwards
+  /// Results, and what offset may be, are as in the vector's searches: from offset on forwards
   /// @pre "0 <= offset && offset <= size()"
   ///
   /// and from offset down to 0 in reverse, npos being the last unit.
@@ -180,64 +164,31 @@ public:
   /// @{
 
   using Base::find;
-  /// The first occurrence of a zero-terminated run; of an empty one, offset.
-  ssize_t find(const T* p, ssize_t offset = 0) const { return find(p, p + GetStringLength(p), offset); }
-  ssize_t find(std::nullptr_t, ssize_t = 0) const = delete;
-  /// The first unit that is c.
-  template <class X, detail::IfIntegers<X> = 0> ssize_t find(X c, ssize_t offset = 0) const {
-    return Base::find(T(c), offset);
-  }
+  /// Finds the first occurrence of a null-terminated string; an empty one at offset.
+  ssize_t find(const T* p, ssize_t offset = 0) const { return find(p, offset, MIREL_LENGTH(p)); }
   using Base::rfind;
-  /// The last occurrence of a zero-terminated run that starts at or before offset; of an empty one, offset,
-  /// for npos size().
-  ssize_t rfind(const T* p, ssize_t offset = Base::npos) const {
-    return rfind(p, p + GetStringLength(p), offset);
-  }
-  ssize_t rfind(std::nullptr_t, ssize_t = Base::npos) const = delete;
-  /// The last unit at or before offset that is c.
-  template <class X, detail::IfIntegers<X> = 0> ssize_t rfind(X c, ssize_t offset = Base::npos) const {
-    return Base::rfind(T(c), offset);
-  }
+  /// Finds the last occurrence of a null-terminated string that starts at or before offset; an empty one at
+  /// offset, for npos at size().
+  ssize_t rfind(const T* p, ssize_t offset = Base::npos) const { return rfind(p, offset, MIREL_LENGTH(p)); }
   using Base::find_first_of;
-  /// The first unit that occurs in a zero-terminated set.
+  /// Finds the first unit that occurs in a null-terminated set.
   ssize_t find_first_of(const T* s, ssize_t offset = 0) const {
-    return find_first_of(s, s + GetStringLength(s), offset);
-  }
-  ssize_t find_first_of(std::nullptr_t, ssize_t = 0) const = delete;
-  /// The first unit that is c.
-  template <class X, detail::IfIntegers<X> = 0> ssize_t find_first_of(X c, ssize_t offset = 0) const {
-    return Base::find_first_of(T(c), offset);
+    return find_first_of(s, offset, MIREL_LENGTH(s));
   }
   using Base::find_first_not_of;
-  /// The first unit that doesn't occur in a zero-terminated set.
+  /// Finds the first unit that doesn't occur in a null-terminated set.
   ssize_t find_first_not_of(const T* s, ssize_t offset = 0) const {
-    return find_first_not_of(s, s + GetStringLength(s), offset);
-  }
-  ssize_t find_first_not_of(std::nullptr_t, ssize_t = 0) const = delete;
-  /// The first unit that is not c.
-  template <class X, detail::IfIntegers<X> = 0> ssize_t find_first_not_of(X c, ssize_t offset = 0) const {
-    return Base::find_first_not_of(T(c), offset);
+    return find_first_not_of(s, offset, MIREL_LENGTH(s));
   }
   using Base::find_last_of;
-  /// The last unit at or before offset that occurs in a zero-terminated set.
+  /// Finds the last unit at or before offset that occurs in a null-terminated set.
   ssize_t find_last_of(const T* s, ssize_t offset = Base::npos) const {
-    return find_last_of(s, s + GetStringLength(s), offset);
-  }
-  ssize_t find_last_of(std::nullptr_t, ssize_t = Base::npos) const = delete;
-  /// The last unit at or before offset that is c.
-  template <class X, detail::IfIntegers<X> = 0> ssize_t find_last_of(X c, ssize_t offset = Base::npos) const {
-    return Base::find_last_of(T(c), offset);
+    return find_last_of(s, offset, MIREL_LENGTH(s));
   }
   using Base::find_last_not_of;
-  /// The last unit at or before offset that doesn't occur in a zero-terminated set.
+  /// Finds the last unit at or before offset that doesn't occur in a null-terminated set.
   ssize_t find_last_not_of(const T* s, ssize_t offset = Base::npos) const {
-    return find_last_not_of(s, s + GetStringLength(s), offset);
-  }
-  ssize_t find_last_not_of(std::nullptr_t, ssize_t = Base::npos) const = delete;
-  /// The last unit at or before offset that is not c.
-  template <class X, detail::IfIntegers<X> = 0>
-  ssize_t find_last_not_of(X c, ssize_t offset = Base::npos) const {
-    return Base::find_last_not_of(T(c), offset);
+    return find_last_not_of(s, offset, MIREL_LENGTH(s));
   }
 
   /// A new string: count units from index offset on, npos being all that follow.
@@ -250,7 +201,41 @@ public:
   }
 
   /// @}
+  // Integers of any type, as in xvector, and what is refused: a literal null pointer is no string.
+  /// @cond
+
+  template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
+  basic_xstring(P r, N rn) : Base(static_cast<const T*>(r), detail::Count(rn)) {}
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  explicit basic_xstring(N count, X x) : Base(detail::Count(count), detail::Unit<T>(x)) {}
+  /// Takes `s = {}`, which would otherwise be a null pointer.
+  basic_xstring<T>& operator=(std::initializer_list<detail::NoUnit>) {
+    this->clear();
+    return *this;
+  }
+
+  basic_xstring(std::nullptr_t) = delete;
+  basic_xstring<T>& operator=(std::nullptr_t) = delete;
+  template <class X, detail::IfIntegers<X> = 0> detail::WriteAssignOfOneUnit operator=(X) = delete;
+  basic_xstring<T>& assign(std::nullptr_t) = delete;
+  basic_xstring<T>& operator+=(std::nullptr_t) = delete;
+  basic_xstring<T>& append(std::nullptr_t) = delete;
+  basic_xstring<T>& insert(ssize_t, std::nullptr_t) = delete;
+  basic_xstring<T>& replace(ssize_t, ssize_t, std::nullptr_t) = delete;
+  int compare(std::nullptr_t) const = delete;
+  int compare(ssize_t, ssize_t, std::nullptr_t) const = delete;
+  bool _Eq(std::nullptr_t) const = delete;
+  bool _Lt(std::nullptr_t) const = delete;
+  ssize_t find(std::nullptr_t, ssize_t = 0) const = delete;
+  ssize_t rfind(std::nullptr_t, ssize_t = 0) const = delete;
+  ssize_t find_first_of(std::nullptr_t, ssize_t = 0) const = delete;
+  ssize_t find_first_not_of(std::nullptr_t, ssize_t = 0) const = delete;
+  ssize_t find_last_of(std::nullptr_t, ssize_t = 0) const = delete;
+  ssize_t find_last_not_of(std::nullptr_t, ssize_t = 0) const = delete;
+  /// @endcond
 };
+
+#undef MIREL_LENGTH
 
 /// Exchanges the contents of two strings in constant time.
 template <class T> void swap(basic_xstring<T>& a, basic_xstring<T>& b) noexcept { a.swap(b); }
@@ -265,7 +250,7 @@ extern template class xvector<char16>;
 extern template class basic_xstring<char16>;
 
 /// @name Conversions
-/// Replace the contents of the destination with those of the run of srcLen units at src, in one pass and in
+/// Replace the contents of the destination with the srcLen units at src, in one pass and in
 /// linear time. UTF-16 is in the machine's own byte order; a byte order mark is a code point like any other,
 /// and so is a zero. What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition
 /// D91 for UTF-16. A failed allocation throws std::bad_alloc: a UTF conversion then leaves the beginning of
@@ -282,13 +267,17 @@ MIREL_API void Utf16FromAscii(string16& dst, const char8* src, ssize_t srcLen);
 /// converted
 /// @pre "srcLen >= 0"
 MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src, ssize_t srcLen);
-/// The same for a zero-terminated run. @pre "src"
+/// UTF-8 to UTF-16, from a null-terminated string.
+/// @return false where the source is malformed or cut off
+/// @pre "src"
 MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src);
 /// UTF-16 to UTF-8.
 /// @return as the way there
 /// @pre "srcLen >= 0"
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src, ssize_t srcLen);
-/// The same for a zero-terminated run. @pre "src"
+/// UTF-16 to UTF-8, from a null-terminated string.
+/// @return false where the source is malformed or cut off
+/// @pre "src"
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src);
 
 /// What the four above do, for generic code: (char16, char8) is UTF-8 to UTF-16, (char8, char16) the way
@@ -296,10 +285,13 @@ MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src);
 /// @return as theirs
 /// @pre "srcLen >= 0"
 template <class CharOut, class CharIn>
-bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen);
+bool UtfToUtf([[maybe_unused]] basic_xstring<CharOut>& result, const CharIn*, ssize_t) {
+  static_assert(sizeof(CharIn) == 0, "UtfToUtf converts char8 to char16, and char16 to char8");
+  return false;
+}
 /// @cond
-extern template MIREL_API bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);
-extern template MIREL_API bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen);
+template <> MIREL_API bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);
+template <> MIREL_API bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen);
 /// @endcond
 
 /// @}

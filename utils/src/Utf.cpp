@@ -118,14 +118,15 @@ template bool UtfToUtf(const Kernels* kernels, string8& result, const char16* sr
 
 } // namespace detail
 
-template <class CharOut, class CharIn>
-bool UtfToUtf(basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen) {
+template <> bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen) {
   MIREL_ASSERT(srcLen >= 0);
   return detail::UtfToUtf(detail::BestKernels(), result, src, srcLen);
 }
 
-template bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);
-template bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen);
+template <> bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen) {
+  MIREL_ASSERT(srcLen >= 0);
+  return detail::UtfToUtf(detail::BestKernels(), result, src, srcLen);
+}
 
 bool Utf16FromUtf8(string16& dst, const char8* src, ssize_t srcLen) {
   return UtfToUtf<char16, char8>(dst, src, srcLen);

@@ -4,6 +4,8 @@
 #include <limits>
 #include <new>
 
+#include <utils/Ranges.h>
+
 namespace mirel {
 
 #ifdef MIREL_GDB_SCRIPT
@@ -93,7 +95,7 @@ void VectorOfByte::resize(ssize_t n) {
 }
 
 void VectorOfByte::assign(const value_type* r1, const value_type* r2) {
-  MIREL_ASSERT(r1 <= r2);
+  MIREL_ASSERT_SOURCE(r1, r2);
   if (owns(r1)) {
     VectorOfByte copy(r1, r2);
     return swap(copy);
@@ -121,7 +123,7 @@ void VectorOfByte::insertbytes(ssize_t i, ssize_t n) {
 
 void VectorOfByte::insert(ssize_t i, const value_type* r1, const value_type* r2) {
   MIREL_ASSERT(0 <= i && i <= size());
-  MIREL_ASSERT(r1 <= r2);
+  MIREL_ASSERT_SOURCE(r1, r2);
   if (owns(r1)) {
     const VectorOfByte copy(r1, r2);
     return insert(i, copy.begin(), copy.end());

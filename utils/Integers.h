@@ -1,0 +1,85 @@
+/// @file
+/// What an integer argument of any type becomes: a count, an index or a code unit.
+///
+/// It knows integers and code units, neither ranges nor containers.
+
+#pragma once
+
+#include <limits>
+#include <type_traits>
+
+#include <utils/BasicTypes.h>
+
+namespace mirel {
+
+namespace detail {
+
+/// Lets an overload take part only for integers. An integer argument of any type matches such an overload
+/// exactly, which is how a literal 0 stays an index or a count where a pointer could be meant too.
+template <class N>
+constexpr bool kIsInteger = std::is_integral_v<N> || (std::is_enum_v<N> && std::is_convertible_v<N, int>);
+template <class... N> constexpr bool kIsEachInteger = (kIsInteger<N> && ...);
+template <class... N> using IfIntegers = std::enable_if_t<kIsEachInteger<N...>, int>;
+
+/// Lets a template take part only for (pointer, integer), where a literal 0 counts as an integer.
+template <class P, class Ptr, class N>
+using IfPointerAndCount = std::enable_if_t<
+    (std::is_pointer_v<P> || std::is_null_pointer_v<P>)&&std::is_convertible_v<P, Ptr> && kIsInteger<N>, int>;
+
+/// The unsigned value of an integer, an enumerator or a code unit: what a source unit of any type counts by.
+template <class N> constexpr auto UnsignedValue(N x) {
+  if constexpr (std::is_enum_v<N>)
+    return UnsignedValue(static_cast<std::underlying_type_t<N>>(x));
+  else if constexpr (std::is_same_v<N, bool>)
+    return static_cast<unsigned char>(x);
+  else
+    return static_cast<std::make_unsigned_t<N>>(x);
+}
+
+/// Whether a T has as many bits as x needs, with a sign or without.
+template <class T, class N> constexpr bool HasBitsFor(N x) {
+  using Unsigned = decltype(UnsignedValue(x));
+  using Max = std::numeric_limits<std::make_unsigned_t<T>>;
+  if constexpr (std::numeric_limits<Unsigned>::digits <= Max::digits)
+    return true;
+  else
+    return UnsignedValue(x) <= Max::max() ||
+           (x < N{} && UnsignedValue(x) >= static_cast<Unsigned>(~static_cast<Unsigned>(Max::max() / 2)));
+}
+
+/// Isn't defined: a call that is left in a program doesn't compile.
+void ConstantDoesNotFit()
+    __attribute__((error("this constant has more bits than the code unit or count that it is passed as")));
+
+/// Refuses a constant that has too many bits, as soon as the compiler optimises and so knows it. Nothing is
+/// checked at run time.
+template <class T, class N> [[gnu::always_inline]] inline void RefuseConstant([[maybe_unused]] N x) {
+#ifdef __OPTIMIZE__
+  if (__builtin_constant_p(HasBitsFor<T>(x)) && !HasBitsFor<T>(x)) // decided by the compiler
+    ConstantDoesNotFit();                                          // decided by the compiler
+#endif
+}
+
+/// An argument as a count or an index.
+template <class N> [[gnu::always_inline]] inline ssize_t Count(N n) {
+  RefuseConstant<ssize_t>(n);
+  return static_cast<ssize_t>(n);
+}
+
+/// An argument as a code unit, by its unsigned value: the char E9 is the char16 00E9 on every processor.
+template <class T, class X> [[gnu::always_inline]] inline T Unit(X x) {
+  RefuseConstant<T>(x);
+  return static_cast<T>(UnsignedValue(x));
+}
+
+/// An argument as a unit that is searched for, with so many more integers after it. Two would be an offset
+/// and the length of a needle, and the first a null pointer.
+template <class T, int kMore, class X> [[gnu::always_inline]] inline T UnitToFind(X x) {
+  static_assert(kMore <= 1,
+                "an empty needle is (nullptr, offset, 0): a literal 0 is a unit, never a pointer");
+  return Unit<T>(x);
+}
+
+} // namespace detail
+
+} // namespace mirel

@@ -1,0 +1,69 @@
+/// @file
+/// Operators that vectors and strings don't have, and what is written instead, as the compiler names it.
+///
+/// They take their arguments by a conversion that a class defines, which is worse than any other: whatever
+/// operator a program or another header declares for such arguments is called in their place.
+
+#pragma once
+
+#include <iosfwd>
+#include <type_traits>
+
+namespace mirel {
+
+template <class T> class xvector;
+
+namespace detail {
+
+template <class T> std::true_type IsVector(const xvector<T>*);
+std::false_type IsVector(...);
+
+/// What any vector or string converts to.
+struct AnyVector {
+  template <class T> AnyVector(const xvector<T>&);
+};
+
+/// What everything converts to.
+struct Anything {
+  template <class X> Anything(const X&);
+};
+
+/// What everything else converts to.
+struct NoVector {
+  template <class X, std::enable_if_t<!decltype(IsVector(static_cast<X*>(nullptr)))::value, int> = 0>
+  NoVector(const X&);
+};
+
+/// What nothing converts to.
+class NoUnit {
+  NoUnit();
+};
+
+struct AppendToACopyInstead {};
+struct Write_Eq {};
+struct Write_Lt {};
+struct WriteCStrOrDataAndSize {};
+struct WriteEraseElement {};
+struct WriteNullptr {};
+struct WriteAssignOfOneUnit {};
+
+} // namespace detail
+
+/// @cond
+
+detail::AppendToACopyInstead operator+(detail::AnyVector, detail::Anything) = delete;
+detail::AppendToACopyInstead operator+(detail::NoVector, detail::AnyVector) = delete;
+detail::Write_Eq operator==(detail::AnyVector, detail::Anything) = delete;
+detail::Write_Eq operator==(detail::NoVector, detail::AnyVector) = delete;
+detail::Write_Eq operator!=(detail::AnyVector, detail::Anything) = delete;
+detail::Write_Eq operator!=(detail::NoVector, detail::AnyVector) = delete;
+detail::Write_Lt operator<(detail::AnyVector, detail::Anything) = delete;
+detail::Write_Lt operator<(detail::NoVector, detail::AnyVector) = delete;
+detail::Write_Lt operator>(detail::AnyVector, detail::Anything) = delete;
+detail::Write_Lt operator>(detail::NoVector, detail::AnyVector) = delete;
+template <class C, class Traits>
+detail::WriteCStrOrDataAndSize operator<<(std::basic_ostream<C, Traits>&, detail::AnyVector) = delete;
+
+/// @endcond
+
+} // namespace mirel

@@ -1,0 +1,288 @@
+/// @file
+/// What a range given to a vector is: which iterators are taken, how they are checked, and what their
+/// elements count as.
+///
+/// @par Units of other types
+/// A range may be of any iterators over integers or enumerators. Each counts by its unsigned value, on every
+/// processor: the byte E9 is the unit 00E9 of a string16, whether plain char has a sign or not. What is
+/// stored must fit the vector's units, or nothing is changed. What is searched for may be any value, and one
+/// that doesn't fit is equal to nothing.
+/// @pre "Fits<T>(*r1)" of each element that is stored
+///
+/// @par Cost
+/// Pointers to elements of the vector's width, and the iterators of standard strings, string views and
+/// vectors of them, are as fast as `const T*`; from C++20 on so is every contiguous iterator. An edit by
+/// other iterators copies their elements first, with one allocation if they are at least forward iterators. A
+/// search allocates nothing.
+///
+/// This header knows iterators and the byte buffer, no containers.
+
+#pragma once
+
+#include <iterator>
+#include <limits>
+#include <memory>
+#include <type_traits>
+#if __cpp_lib_concepts < 202002L
+#include <string>
+#include <vector>
+#endif
+
+#include <utils/Integers.h>
+#include <utils/VectorOfByte.h>
+
+namespace mirel {
+
+namespace detail {
+
+/// Lets a template take part in overload resolution only for iterators, never for numbers.
+template <class It>
+using IfIterator = std::enable_if_t<
+    std::is_convertible_v<typename std::iterator_traits<It>::iterator_category, std::input_iterator_tag>,
+    int>;
+
+template <class It> using ValueType = typename std::iterator_traits<It>::value_type;
+
+template <class It, class Tag>
+constexpr bool kHasCategory = std::is_base_of_v<Tag, typename std::iterator_traits<It>::iterator_category>;
+
+#if __cpp_lib_concepts >= 202002L
+// The iterators of views are forward and random-access ones as concepts only: what * gives isn't a reference.
+template <class It>
+constexpr bool kIsForward = std::forward_iterator<It> || kHasCategory<It, std::forward_iterator_tag>;
+template <class It>
+constexpr bool kIsRandomAccess =
+    std::random_access_iterator<It> || kHasCategory<It, std::random_access_iterator_tag>;
+template <class It> constexpr bool kIsContiguous = std::contiguous_iterator<It>;
+#else
+template <class It> constexpr bool kIsForward = kHasCategory<It, std::forward_iterator_tag>;
+template <class It> constexpr bool kIsRandomAccess = kHasCategory<It, std::random_access_iterator_tag>;
+template <class It, class C>
+constexpr bool kIsIteratorOf =
+    std::is_same_v<It, typename C::iterator> || std::is_same_v<It, typename C::const_iterator>;
+/// Pointers, and the iterators that are known to stand for pointers. Those of string views are either.
+template <class It>
+constexpr bool kIsContiguous = std::is_pointer_v<It> || kIsIteratorOf<It, std::vector<ValueType<It>>>
+#ifdef __GLIBCXX__ // elsewhere strings have the iterators of vectors, and none but those of characters exist
+                               || kIsIteratorOf<It, std::basic_string<ValueType<It>>>
+#endif
+    ;
+#endif
+
+/// Whether elements of type V are units of the width of T, and so can be copied as bytes.
+template <class T, class V>
+constexpr bool kIsUnit = (std::is_integral_v<V> || std::is_enum_v<V>)&&!std::is_same_v<V, bool> &&
+                         sizeof(V) == sizeof(T);
+
+/// Whether iterators stand for pointers to units of the width of T. Asks for the containers of such only.
+template <class T, class It> constexpr bool StandsForPointer() {
+  if constexpr (!kIsUnit<T, ValueType<It>> || std::is_volatile_v<std::remove_pointer_t<It>>)
+    return false;
+  else
+    return kIsContiguous<It>;
+}
+
+/// The return type of what reverse iterators don't offer, as the compiler names it.
+struct ReverseIteratorsOnlyStep {};
+
+/// What reverse iterators are made from. They convert to the pointers that they hold, for which there is
+/// arithmetic with the opposite meaning: it is refused here.
+struct ReversePointer {
+  template <class X> ReverseIteratorsOnlyStep operator[](const X&) const = delete;
+  template <class X> ReverseIteratorsOnlyStep operator+(const X&) const = delete;
+  template <class X> ReverseIteratorsOnlyStep operator-(const X&) const = delete;
+  template <class X> ReverseIteratorsOnlyStep operator+=(const X&) = delete;
+  template <class X> ReverseIteratorsOnlyStep operator-=(const X&) = delete;
+  template <class X> ReverseIteratorsOnlyStep operator<(const X&) const = delete;
+  template <class X> ReverseIteratorsOnlyStep operator>(const X&) const = delete;
+  template <class X> ReverseIteratorsOnlyStep operator<=(const X&) const = delete;
+  template <class X> ReverseIteratorsOnlyStep operator>=(const X&) const = delete;
+};
+template <class N, IfIntegers<N> = 0> ReverseIteratorsOnlyStep operator+(N, const ReversePointer&) = delete;
+template <class X> ReverseIteratorsOnlyStep operator-(X*, const ReversePointer&) = delete;
+template <class X> ReverseIteratorsOnlyStep operator<(X*, const ReversePointer&) = delete;
+template <class X> ReverseIteratorsOnlyStep operator>(X*, const ReversePointer&) = delete;
+template <class X> ReverseIteratorsOnlyStep operator<=(X*, const ReversePointer&) = delete;
+template <class X> ReverseIteratorsOnlyStep operator>=(X*, const ReversePointer&) = delete;
+
+/// The pointer that one of our reverse iterators holds.
+template <class It> const ValueType<It>* Held(It it) { return it; }
+
+/// False for a reversed range, as far as that can be known: of random-access iterators and of pointers.
+template <class It> constexpr bool IsRange(const It& r1, const It& r2) {
+  if constexpr (std::is_base_of_v<ReversePointer, It>)
+    return Held(r2) <= Held(r1);
+  else if constexpr (kIsRandomAccess<It>)
+    return r1 <= r2;
+  else
+    return true;
+}
+
+/// False for pointers of which only the first in memory is null.
+template <class It> constexpr bool IsInMemory(const It& r1, const It& r2) {
+  if constexpr (std::is_base_of_v<ReversePointer, It>)
+    return IsInMemory(Held(r2), Held(r1));
+  else if constexpr (std::is_pointer_v<It>)
+    return r1 == r2 || r1 != nullptr;
+  else
+    return true;
+}
+template <class It>
+constexpr bool IsInMemory(const std::reverse_iterator<It>& r1, const std::reverse_iterator<It>& r2) {
+  return IsInMemory(r2.base(), r1.base());
+}
+
+/// The unsigned value of an element of a range for a vector of T. What is no integer is one once it is a T.
+template <class T, class V, class X> constexpr auto SourceValue(const X& x) {
+  static_assert(!std::is_floating_point_v<V>, "code units are integers: convert the numbers first");
+  if constexpr (std::is_integral_v<V> || std::is_enum_v<V>)
+    return UnsignedValue(static_cast<V>(x));
+  else
+    return UnsignedValue(static_cast<T>(x));
+}
+
+template <class T, class N> constexpr bool Fits(N value) {
+  return value <= std::numeric_limits<std::make_unsigned_t<T>>::max();
+}
+
+/// Units that stand one behind the other somewhere. They may be of another type, which the library's code
+/// never sees but compilers do where it is inlined: for these all that the program has written is in memory
+/// when the constructor is done, and stays there up to the destructor.
+template <class T, class V> class UnitSpan {
+public:
+  UnitSpan(const V* p, ssize_t n) : m_p(reinterpret_cast<const T*>(p)), m_size(n) { Settle(); }
+  UnitSpan(const UnitSpan&) = delete;
+  UnitSpan& operator=(const UnitSpan&) = delete;
+  ~UnitSpan() { Settle(); }
+
+  const T* begin() const { return m_p; }
+  const T* end() const { return m_p + m_size; }
+  ssize_t size() const { return m_size; }
+
+private:
+  void Settle() {
+    if constexpr (sizeof(T) > 1 && !std::is_same_v<T, V>)
+      __asm__ volatile("" : "+r"(m_p) : : "memory");
+  }
+
+  const T* m_p;
+  ssize_t m_size;
+};
+
+/// The units of any range, copied, each of which must fit.
+template <class T> class UnitCopy {
+public:
+  template <class It> UnitCopy(It r1, It r2) {
+    if constexpr (kIsForward<It>)
+      Reserve(Length(r1, r2));
+    for (; r1 != r2; ++r1) {
+      const auto value = SourceValue<T, ValueType<It>>(*r1);
+      MIREL_ASSERT_AS(Fits<T>(value), "Fits<T>(*r1)");
+      m_units.push_back(static_cast<T>(value));
+    }
+  }
+
+  const T* begin() const { return reinterpret_cast<const T*>(m_units.begin()); }
+  ssize_t size() const { return m_units.size() / ssize_t(sizeof(T)); }
+
+private:
+  template <class It> static ssize_t Length(It r1, It r2) {
+    if constexpr (kIsRandomAccess<It>)
+      return static_cast<ssize_t>(r2 - r1);
+    ssize_t length = 0;
+    for (; r1 != r2; ++r1)
+      ++length;
+    return length;
+  }
+  void Reserve(ssize_t length) {
+    constexpr ssize_t kMax = std::numeric_limits<ssize_t>::max();
+    m_units.reserve(length <= kMax / ssize_t(sizeof(T)) ? length * ssize_t(sizeof(T)) : kMax);
+  }
+
+  VectorOfByte m_units;
+};
+
+/// An iterator over the unsigned values of a range, of the same category up to random access.
+template <class T, class It> class ValueIterator {
+public:
+  typedef std::conditional_t<
+      kIsRandomAccess<It>, std::random_access_iterator_tag,
+      std::conditional_t<kIsForward<It>, std::forward_iterator_tag, std::input_iterator_tag>>
+      iterator_category;
+  typedef decltype(SourceValue<T, ValueType<It>>(*std::declval<It&>())) value_type;
+  typedef ssize_t difference_type;
+  typedef const value_type* pointer;
+  typedef value_type reference;
+
+  explicit ValueIterator(It it) : m_it(it) {}
+  value_type operator*() const { return SourceValue<T, ValueType<It>>(*m_it); }
+  value_type operator[](ssize_t i) const { return *(*this + i); }
+  ValueIterator& operator++() {
+    ++m_it;
+    return *this;
+  }
+  ValueIterator& operator--() {
+    --m_it;
+    return *this;
+  }
+  ValueIterator operator+(ssize_t n) const { return ValueIterator(m_it + static_cast<Difference>(n)); }
+  ValueIterator operator-(ssize_t n) const { return ValueIterator(m_it - static_cast<Difference>(n)); }
+  ssize_t operator-(const ValueIterator& y) const { return static_cast<ssize_t>(m_it - y.m_it); }
+  bool operator==(const ValueIterator& y) const { return m_it == y.m_it; }
+  bool operator!=(const ValueIterator& y) const { return !(m_it == y.m_it); }
+
+private:
+  typedef typename std::iterator_traits<It>::difference_type Difference;
+
+  It m_it;
+};
+
+template <class T, class It> class ValueRange {
+public:
+  ValueRange(It r1, It r2) : m_begin(r1), m_end(r2) {}
+  ValueIterator<T, It> begin() const { return m_begin; }
+  ValueIterator<T, It> end() const { return m_end; }
+
+private:
+  ValueIterator<T, It> m_begin, m_end;
+};
+
+/// The units of [r1, r2), which stand for pointers. The end of a range may not be dereferenced.
+template <class T, class It> UnitSpan<T, ValueType<It>> Span(It r1, It r2) {
+  if constexpr (std::is_pointer_v<It>)
+    return {r1, r2 - r1};
+  else
+    return {r1 == r2 ? nullptr : std::addressof(*r1), static_cast<ssize_t>(r2 - r1)};
+}
+
+/// The units of [r1, r2) in one piece, to be stored: those of a copy where the iterators aren't pointers,
+/// since only a pointer tells whether it points into the vector.
+template <class T, class It> auto Source(It r1, It r2) {
+  if constexpr (StandsForPointer<T, It>())
+    return Span<T>(r1, r2);
+  else
+    return UnitCopy<T>(r1, r2);
+}
+
+/// The units of [r1, r2), to be searched for.
+template <class T, class It> auto Needle(It r1, It r2) {
+  if constexpr (StandsForPointer<T, It>())
+    return Span<T>(r1, r2);
+  else
+    return ValueRange<T, It>(r1, r2);
+}
+
+} // namespace detail
+
+} // namespace mirel
+
+/// Asserts that [r1, r2) is a range that can be copied from.
+#define MIREL_ASSERT_SOURCE(r1, r2)                                                                          \
+  (MIREL_ASSERT_AS(::mirel::detail::IsRange(r1, r2), "r1 <= r2"),                                            \
+   MIREL_ASSERT_AS(::mirel::detail::IsInMemory(r1, r2),                                                      \
+                   "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)"))
+
+/// Asserts that [r1, r2) is a range that can be read.
+#define MIREL_ASSERT_NEEDLE(r1, r2)                                                                          \
+  (MIREL_ASSERT_AS(::mirel::detail::IsRange(r1, r2), "r1 <= r2"),                                            \
+   MIREL_ASSERT_AS(::mirel::detail::IsInMemory(r1, r2), "r1 == r2 || r1 != nullptr"))
