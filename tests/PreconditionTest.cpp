@@ -10,6 +10,7 @@
 #include <utility>
 #include <vector>
 
+#include <utils/Std.h>
 #include <utils/xostream.h>
 
 using mirel::string16;
@@ -165,6 +166,10 @@ TYPED_TEST(Precondition, OfIndicesAndCounts) {
                WITH_N(v *= n)});
   ExpectStops(s, "size >= 0", kBadCount, {WITH_N(v.reserve(n))});
   ExpectStops(s, "newSize >= 0", kBadCount, {WITH_N(v.resize(n, x))});
+  const auto filled = [](ssize_t n) { return [n](T*, ssize_t) { return n; }; };
+  ExpectStops(s, "0 <= most", kBadCount, {WITH_N(mirel::FillFrom(v, n, filled(0)))});
+  ExpectStops(s, "0 <= filled && filled <= most", One{{-1}, {1}, {kMax}, {kMin}},
+              {WITH_N(mirel::FillFrom(v, 0, filled(n)))});
 }
 
 TYPED_TEST(Precondition, OfPointersAndRanges) {
