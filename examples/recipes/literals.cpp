@@ -5,18 +5,12 @@
 #include <string>
 #include <string_view>
 
-#include <utils/xstring.h>
+#include <utils/Std.h>
 
 using mirel::string16;
 
-string16 Text(std::u16string_view units) {
-  string16 text;
-  text.assign(units.begin(), units.end());
-  return text;
-}
-
 int main() {
-  string16 text = Text(u"Grüße, Jürgen");
+  string16 text = mirel::ToString16(u"Grüße, Jürgen");
 
   // Searches and edits take the iterators of a literal as they are; single units need nothing.
   constexpr std::u16string_view name = u"Jürgen", other = u"Zoë";
@@ -25,8 +19,8 @@ int main() {
   text.insert(at, other.begin(), other.end());
   text += u'!';
 
-  const std::u16string standard(text.begin(), text.end());
-  std::printf("%d %d\n", standard == u"Grüße, Zoë!", Text(standard)._Eq(text));
+  const std::u16string standard = mirel::ToU16String(text);
+  std::printf("%d %d\n", standard == u"Grüße, Zoë!", mirel::ToString16(standard) == text);
 }
 
 /* Prints:

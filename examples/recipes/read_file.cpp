@@ -1,29 +1,40 @@
-// A whole file in a string, in one read.
+// A whole file in a string: FillFrom() lets the reader write where the text will stand, and no byte is
+// written twice.
 
 #include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
+#include <fstream>
 #include <memory>
 #include <system_error>
 
-#include <utils/xstring.h>
+#include <utils/Std.h>
 
 using mirel::ssize_t;
 using mirel::string8;
 
+// From a C stream, whose size tells how much storage it takes. A descriptor's read() is used likewise.
 string8 ReadFile(const char* name) {
-  const std::size_t size = std::filesystem::file_size(name);
   const std::unique_ptr<FILE, int (*)(FILE*)> file(std::fopen(name, "rb"), std::fclose);
   if (!file)
     throw std::system_error(errno, std::generic_category(), name);
   string8 bytes;
-  bytes.resize(static_cast<ssize_t>(size), 0);
-  const std::size_t got = std::fread(bytes.data(), 1, size, file.get());
-  if (std::ferror(file.get()))
-    throw std::system_error(errno, std::generic_category(), name);
-  bytes.resize(static_cast<ssize_t>(got), 0); // less where the file was cut meanwhile
+  mirel::FillFrom(bytes, std::filesystem::file_size(name), [&](char* p, ssize_t n) {
+    const std::size_t got = std::fread(p, 1, static_cast<std::size_t>(n), file.get());
+    if (std::ferror(file.get()))
+      throw std::system_error(errno, std::generic_category(), name); // and the string is as it was
+    return got;                                                      // less where the file was cut meanwhile
+  });
+  return bytes;
+}
+
+// From a standard stream of unknown length, block by block. Storage grows as with any other edits.
+string8 ReadStream(std::istream& stream) {
+  string8 bytes;
+  while (mirel::FillFrom(bytes, 65536, [&](char* p, ssize_t n) { return stream.read(p, n).gcount(); }) > 0)
+    ;
   return bytes;
 }
 
@@ -32,8 +43,11 @@ int main(int argc, char** argv) {
     return EXIT_FAILURE;
   const string8 text = ReadFile(argv[1]);
   std::printf("%td bytes, %td lines\n", text.size(), std::count(text.begin(), text.end(), '\n'));
+  std::ifstream stream(argv[1], std::ios::binary);
+  std::puts(ReadStream(stream) == text ? "the same" : "other bytes");
 }
 
 /* Prints:
 36 bytes, 3 lines
+the same
 */

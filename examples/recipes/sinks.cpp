@@ -10,8 +10,8 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
+#include <utils/Std.h>
 #include <utils/xostream.h>
-#include <utils/xstring.h>
 
 using mirel::ssize_t;
 using mirel::string8;
@@ -88,16 +88,20 @@ int main() {
   const string8 sent(4 << 20, 'x');
   string8 received;
   std::thread reader([&] {
-    char block[1 << 16];
-    for (ssize_t n; (n = read(ends[1], block, sizeof(block))) > 0;)
-      received.append(block, n);
+    const auto readSome = [&](char* p, ssize_t n) {
+      const auto got = read(ends[1], p, static_cast<std::size_t>(n));
+      Check(got >= 0);
+      return got;
+    };
+    while (mirel::FillFrom(received, 1 << 16, readSome) > 0)
+      ;
   });
   DescriptorSink socket(ends[0]);
   mirel::xostream(socket).write(sent.data(), sent.size());
   close(ends[0]);
   reader.join();
   close(ends[1]);
-  std::printf("%s, in %s\n", received._Eq(sent) ? "the same" : "other bytes",
+  std::printf("%s, in %s\n", received == sent ? "the same" : "other bytes",
               socket.writes > 1 ? "pieces" : "one piece");
 }
 

@@ -8,14 +8,11 @@
 #include <span>
 #endif
 
-#include <utils/xstring.h>
+#include <utils/Std.h>
 
 using mirel::char16;
 using mirel::string16;
 using mirel::string8;
-
-// A string8 is seen through a string_view. The view is good until the string may move its storage.
-std::string_view View(const string8& text) { return {text.data(), static_cast<std::size_t>(text.size())}; }
 
 // A string16 is seen through a span, or before C++20 through the two pointers that a span stands for. A
 // u16string_view may not look at it: its units are uint16_t, which may not be read through a char16_t*,
@@ -41,22 +38,23 @@ int Sum(const string16& text) {
 int main() {
   const string8 line = "key = value";
 
-  std::string_view name = View(line);
+  // The view is valid until the next change of the string, c_str() included.
+  std::string_view name = mirel::View(line);
   name.remove_suffix(name.size() - name.find(' '));
 
-  const string8 copy(name.data(), name.size()); // a string from a view, with all its zeros
+  const string8 copy = mirel::ToString8(name); // with all its zeros
   string8 reused;
-  reused.assign(name.begin(), name.end()); // the same in storage that is there already
+  reused.assign(name.begin(), name.end()); // into storage that is there already
 
-  const std::string standard(line.begin(), line.end());
-  const string8 back(standard.data(), standard.size());
+  const std::string standard = mirel::ToString(line);
+  const string8 back = mirel::ToString8(standard);
 
   const char16 units[] = {1, 2, 3};
   const string16 wide(units, 3);
 
-  std::printf("%s, %s, %s, %d\n", copy.c_str(), reused.c_str(), back.c_str(), Sum(wide));
+  std::printf("%s, %s, %d, %d\n", copy.c_str(), reused.c_str(), back == standard, Sum(wide));
 }
 
 /* Prints:
-key, key, key = value, 6
+key, key, 1, 6
 */
