@@ -38,6 +38,20 @@ inline std::size_t SequenceLength(View<char8> text) {
   return 0;
 }
 
+/// The length of the maximal subpart that malformed text begins with: as much of a row as is there, or one
+/// byte.
+inline std::size_t SubpartLength(View<char8> text) {
+  const auto byte = [&](std::size_t i) { return i < text.size() ? static_cast<unsigned char>(text[i]) : -1; };
+  for (const Row& row : kTable)
+    if (byte(0) >= row.first && byte(0) <= row.last) {
+      if (byte(1) < row.secondFirst || byte(1) > row.secondLast)
+        return 1;
+      return row.length == 4 && byte(2) >= 0x80 && byte(2) <= 0xBF ? 3 : 2;
+    }
+  return 1;
+}
+inline std::size_t SubpartLength(View<char16>) { return 1; }
+
 inline void Put(Text<char8>& text, char32_t c) {
   const auto tail = [&](int shift) { text += static_cast<char8>(0x80 | (c >> shift & 0x3F)); };
   if (c < 0x80)
@@ -59,29 +73,45 @@ inline void Put(Text<char16>& units, char32_t c) {
 constexpr bool IsLead(char32_t c) { return c >= 0xD800 && c <= 0xDBFF; }
 constexpr bool IsTrail(char32_t c) { return c >= 0xDC00 && c <= 0xDFFF; }
 
-/// Makes out what the conversion of source comes to; whether it is well-formed.
-inline bool Convert(Text<char16>& out, View<char8> source) {
+/// A sequence of a text: well-formed, or a maximal subpart that U+FFFD replaces.
+struct Sequence {
+  std::size_t offset, length;
+  char32_t codePoint;
+  bool isWellFormed;
+};
+
+/// The sequence that text begins with.
+inline Sequence First(View<char8> text) {
+  const std::size_t n = SequenceLength(text);
+  if (n == 0)
+    return {0, SubpartLength(text), 0xFFFD, false};
+  char32_t c = static_cast<unsigned char>(text[0]) & (n == 1 ? 0x7Fu : 0xFFu >> (n + 1));
+  for (std::size_t i = 1; i < n; ++i)
+    c = c << 6 | (static_cast<unsigned char>(text[i]) & 0x3F);
+  return {0, n, c, true};
+}
+inline Sequence First(View<char16> text) {
+  const char32_t a = text[0], b = text.size() > 1 ? text[1] : 0u;
+  if (IsLead(a) && IsTrail(b))
+    return {0, 2, 0x10000 + ((a - 0xD800) << 10) + (b - 0xDC00), true};
+  const bool isSurrogate = IsLead(a) || IsTrail(a);
+  return {0, 1, isSurrogate ? 0xFFFD : a, !isSurrogate};
+}
+
+/// Makes out what the strict conversion of source comes to; whether it is well-formed.
+template <class CharOut, class CharIn> bool Convert(Text<CharOut>& out, View<CharIn> source) {
   out.clear();
-  for (std::size_t n; !source.empty(); source.remove_prefix(n)) {
-    if ((n = SequenceLength(source)) == 0)
+  while (!source.empty()) {
+    const Sequence sequence = First(source);
+    if (!sequence.isWellFormed)
       return false;
-    char32_t c = static_cast<unsigned char>(source[0]) & (n == 1 ? 0x7Fu : 0xFFu >> (n + 1));
-    for (std::size_t i = 1; i < n; ++i)
-      c = c << 6 | (static_cast<unsigned char>(source[i]) & 0x3F);
-    Put(out, c);
+    Put(out, sequence.codePoint);
+    source.remove_prefix(sequence.length);
   }
   return true;
 }
-inline bool Convert(Text<char8>& out, View<char16> source) {
-  out.clear();
-  for (std::size_t i = 0; i < source.size(); ++i) {
-    const char32_t a = source[i], b = i + 1 < source.size() ? source[i + 1] : 0u;
-    if (IsTrail(a) || (IsLead(a) && !IsTrail(b)))
-      return false;
-    Put(out, IsLead(a) ? 0x10000 + ((a - 0xD800) << 10) + (b - 0xDC00) : a);
-    i += IsLead(a);
-  }
-  return true;
+template <class CharOut, class CharIn> bool Convert(Text<CharOut>& out, const Text<CharIn>& source) {
+  return Convert(out, View<CharIn>(source));
 }
 
 /// Calls f with each way to convert on this processor: a function like UtfToUtf(), and its name.

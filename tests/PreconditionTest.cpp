@@ -11,6 +11,7 @@
 #include <vector>
 
 #include <utils/Std.h>
+#include <utils/Utf.h>
 #include <utils/xostream.h>
 
 using mirel::string16;
@@ -255,6 +256,24 @@ TEST(Precondition, OfConversions) {
   ExpectStops(wide, "newSize >= 0", kBadCount, {WITH_N(Utf16FromAscii(v, "a", n))});
   ExpectStops(narrow, "srcLen >= 0", kBadCount, {WITH_N(Utf8FromUtf16(v, wide.data(), n))});
   ExpectStops(narrow, "src", kOnce, {WITHOUT(Utf8FromUtf16(v, nullptr))});
+}
+
+TEST(Precondition, OfText) {
+  string16 wide = Of<char16>("abc");
+  string8 narrow = Of<char8>("abc");
+  ExpectStops(wide, kPointer,
+              std::vector<std::tuple<const char8*, ssize_t>>{{nullptr, 1}, {"a", -1}, {"a", kMin}},
+              {WITH_P_PN(AppendUtf16(v, p, pn)), WITH_P_PN(Utf16FromUtf8Lossy(v, p, pn)),
+               WITH_P_PN(mirel::Utf8Stream().Append(v, p, pn)), WITH_P_PN(mirel::FindMalformed(p, pn)),
+               WITH_P_PN(mirel::ExplainMalformed(p, pn, 9)), WITH_P_PN(mirel::Utf16Length(p, pn)),
+               WITH_P_PN(mirel::CountCodePoints(p, pn)), WITH_P_PN(mirel::CodePoints(p, pn))});
+  ExpectStops(narrow, kPointer,
+              std::vector<std::tuple<const char16*, ssize_t>>{{nullptr, 1}, {wide.data(), kMin}},
+              {WITH_P_PN(AppendUtf8(v, p, pn)), WITH_P_PN(Utf8FromUtf16Lossy(v, p, pn)),
+               WITH_P_PN(mirel::Utf16Stream().Append(v, p, pn)), WITH_P_PN(mirel::FindMalformed(p, pn)),
+               WITH_P_PN(mirel::Utf8Length(p, pn)), WITH_P_PN(mirel::CodePoints(p, pn))});
+  ExpectStops(wide, "0 <= offset && offset < pn", kBadElement,
+              {WITH_I(mirel::ExplainMalformed("abc", 3, i)), WITH_I(ExplainMalformed(v, i))});
 }
 
 TEST(Precondition, OfStreams) {

@@ -4,15 +4,16 @@
 // text on processors without kernels, goes through the traits of Boost, one code point at a time.
 
 #include <utils/Storage.h>
-#include <utils/xstring.h>
+#include <utils/Utf.h>
 
 #include <algorithm>
+#include <cstring>
 #include <limits>
 #include <type_traits>
 
 #include <boost/locale/utf.hpp>
 
-#include "KernelTable.h"
+#include "Conversion.h"
 
 namespace mirel {
 
@@ -83,38 +84,128 @@ Progress<CharOut, CharIn> Convert(const Kernels* k, const CharIn* p, const CharI
   return progress.stop == Stop::kMalformed ? ConvertScalar(progress.p, end, progress.out, outEnd) : progress;
 }
 
+/// After malformed text, so many units must be well-formed before the kernels are tried again: where faults
+/// are dense, each trial would be in vain.
+constexpr ssize_t kWellFormedBeforeKernels = 64;
+
+/// Converts one code point at a time from malformed text on, and replaces what is malformed, until the text
+/// seems to be well-formed.
+template <class CharOut, class CharIn>
+Progress<CharOut, CharIn> Replace(const CharIn* p, const CharIn* end, CharOut* out, const CharOut* outEnd,
+                                  ssize_t& replacements) {
+  for (const CharIn* malformed = p; p != end && p - malformed < kWellFormedBeforeKernels;) {
+    const Sequence sequence = Decode(p, end);
+    if (outEnd - out < EncodedLength<CharOut>(sequence.codePoint))
+      return {p, out, Stop::kNoRoom};
+    out = Encode(sequence.codePoint, out);
+    p += sequence.length;
+    if (!sequence.isWellFormed) {
+      ++replacements;
+      malformed = p;
+    }
+  }
+  return {p, out, p == end ? Stop::kEnd : Stop::kMalformed};
+}
+
 /// The most units of the result for one of the source, and the most of the source for one of the result.
 template <class CharOut> constexpr ssize_t kMostOut = sizeof(CharOut) == 1 ? 3 : 1;
 template <class CharOut> constexpr ssize_t kMostIn = sizeof(CharOut) == 1 ? 1 : 3;
 
+/// a + b, and kMax where that is more.
+ssize_t Sum(ssize_t a, ssize_t b) { return a < kMax - b ? a + b : kMax; }
+
+/// A conversion into a string: makes room, and tells in the end how much of it was needed.
+template <class CharOut> class Destination {
+public:
+  /// Where the result may fit in the capacity that there is, it is tried: a string that holds one result
+  /// after the other would otherwise grow and shrink each time.
+  Destination(basic_xstring<CharOut>& s, ssize_t srcLen)
+      : m_string(s), m_oldSize(s.size()), m_oldCapacity(s.capacity()), m_srcLen(srcLen) {
+    if (srcLen > 0 && m_oldCapacity - m_oldSize <= srcLen / kMostIn<CharOut>)
+      Grow(Sum(m_oldSize, srcLen));
+  }
+
+  CharOut* Out() { return m_string.data_end(); }
+  /// The last unit is for the terminator.
+  CharOut* OutEnd() { return m_string.data() + std::max(m_string.capacity() - 1, ssize_t(0)); }
+  void SetEnd(const CharOut* out) { Storage::SetSize(m_string, out - m_string.data()); }
+
+  /// Makes room for the result of as many units of the source as are left.
+  void GrowFor(ssize_t rest) {
+    const ssize_t size = m_string.size(), tried = Sum(m_oldSize, m_srcLen);
+    const ssize_t most = size + kMostOut<CharOut> * std::min(rest, (kMax - size) / kMostOut<CharOut>);
+    Grow(m_string.capacity() <= tried ? tried : most);
+  }
+  /// Gives back what isn't needed. A string that was appended to keeps twice what it had.
+  void Finish() {
+    if (m_string.capacity() != m_oldCapacity)
+      Storage::GiveBack(m_string, std::max(Least(), m_string.size() + 1));
+  }
+
+private:
+  ssize_t Least() const { return m_oldSize == 0 ? m_oldCapacity : Sum(m_oldCapacity, m_oldCapacity); }
+  void Grow(ssize_t n) { ReserveTerminated(m_string, std::max(n, Least())); }
+
+  basic_xstring<CharOut>& m_string;
+  const ssize_t m_oldSize, m_oldCapacity, m_srcLen;
+};
+
 } // namespace
 
 template <class CharOut, class CharIn>
-bool UtfToUtf(const Kernels* kernels, basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen) {
-  const ssize_t oldCapacity = result.capacity();
-  result.clear();
-  // Where the result may fit in the capacity that there is, it is tried: a string that holds one result after
-  // the other would otherwise grow and shrink each time.
-  if (srcLen > 0 && oldCapacity <= srcLen / kMostIn<CharOut>)
-    ReserveTerminated(result, srcLen);
-  const CharIn* const end = src + srcLen;
+Appended<CharIn> AppendUtf(const Kernels* kernels, basic_xstring<CharOut>& dst, const CharIn* src,
+                           const CharIn* end, OnMalformed onMalformed) {
+  Appended<CharIn> result{nullptr, 0};
+  Destination<CharOut> destination(dst, end - src);
   for (const CharIn* p = src;;) {
-    CharOut* const outEnd = result.data() + std::max(result.capacity() - 1, ssize_t(0));
-    const Progress<CharOut, CharIn> progress = Convert(kernels, p, end, result.data_end(), outEnd);
-    p = progress.p;
-    Storage::SetSize(result, progress.out - result.data());
-    if (progress.stop != Stop::kNoRoom) {
-      Storage::GiveBack(result, std::max(oldCapacity, result.size() + 1));
-      return progress.stop == Stop::kEnd;
+    auto progress = Convert(kernels, p, end, destination.Out(), destination.OutEnd());
+    if (progress.stop == Stop::kMalformed) {
+      if (result.malformed == nullptr)
+        result.malformed = progress.p;
+      if (onMalformed == OnMalformed::kReplace)
+        progress = Replace(progress.p, end, progress.out, destination.OutEnd(), result.replacements);
     }
-    const ssize_t rest = end - p, size = result.size();
-    const ssize_t most = size + kMostOut<CharOut> * std::min(rest, (kMax - size) / kMostOut<CharOut>);
-    ReserveTerminated(result, result.capacity() <= srcLen ? srcLen : most);
+    p = progress.p;
+    destination.SetEnd(progress.out);
+    if (progress.stop == Stop::kNoRoom) {
+      destination.GrowFor(end - p);
+    } else if (progress.stop == Stop::kEnd || onMalformed == OnMalformed::kStop) {
+      destination.Finish();
+      return result;
+    }
   }
+}
+
+template Appended<char8> AppendUtf(const Kernels* kernels, string16& dst, const char8* src, const char8* end,
+                                   OnMalformed onMalformed);
+template Appended<char16> AppendUtf(const Kernels* kernels, string8& dst, const char16* src,
+                                    const char16* end, OnMalformed onMalformed);
+
+template <class CharOut, class CharIn>
+bool UtfToUtf(const Kernels* kernels, basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen) {
+  result.clear();
+  return AppendUtf(kernels, result, src, src + srcLen, OnMalformed::kStop).malformed == nullptr;
 }
 
 template bool UtfToUtf(const Kernels* kernels, string16& result, const char8* src, ssize_t srcLen);
 template bool UtfToUtf(const Kernels* kernels, string8& result, const char16* src, ssize_t srcLen);
+
+namespace {
+
+template <class CharOut, class CharIn>
+bool AppendStrict(basic_xstring<CharOut>& dst, const CharIn* p, ssize_t pn) {
+  MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
+  return AppendUtf(BestKernels(), dst, p, p + pn, OnMalformed::kStop).malformed == nullptr;
+}
+
+template <class CharOut, class CharIn>
+ssize_t ConvertLossy(basic_xstring<CharOut>& dst, const CharIn* p, ssize_t pn) {
+  MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
+  dst.clear();
+  return AppendUtf(BestKernels(), dst, p, p + pn, OnMalformed::kReplace).replacements;
+}
+
+} // namespace
 
 } // namespace detail
 
@@ -144,6 +235,35 @@ bool Utf8FromUtf16(string8& dst, const char16* src, ssize_t srcLen) {
 bool Utf8FromUtf16(string8& dst, const char16* src) {
   MIREL_ASSERT(src);
   return UtfToUtf<char8, char16>(dst, src, GetStringLength(src));
+}
+
+bool Utf8FromUtf16(string8& dst, std::u16string_view text) {
+  const ssize_t oldCapacity = dst.capacity();
+  dst.clear();
+  Utf16Stream stream;
+  bool isWellFormed = true;
+  char16 block[1024];
+  while (!text.empty() && isWellFormed) {
+    const std::u16string_view part = text.substr(0, std::size(block));
+    std::memcpy(block, part.data(), part.size() * sizeof(char16));
+    isWellFormed = stream.Append(dst, block, static_cast<ssize_t>(part.size()));
+    text.remove_prefix(part.size());
+  }
+  isWellFormed = stream.Finish(dst) && isWellFormed;
+  detail::Storage::GiveBack(dst, std::max(oldCapacity, dst.size() + 1));
+  return isWellFormed;
+}
+
+bool AppendUtf16(string16& dst, const char8* p, ssize_t pn) { return detail::AppendStrict(dst, p, pn); }
+
+bool AppendUtf8(string8& dst, const char16* p, ssize_t pn) { return detail::AppendStrict(dst, p, pn); }
+
+ssize_t Utf16FromUtf8Lossy(string16& dst, const char8* p, ssize_t pn) {
+  return detail::ConvertLossy(dst, p, pn);
+}
+
+ssize_t Utf8FromUtf16Lossy(string8& dst, const char16* p, ssize_t pn) {
+  return detail::ConvertLossy(dst, p, pn);
 }
 
 } // namespace mirel

@@ -1,0 +1,420 @@
+// Malformed text, lengths, code points, lossy and appending conversions and those in pieces, beside the
+// oracle and, where it is installed, ICU: by every kernel that the processor has, and by the scalar path.
+#include "Oracle.h"
+
+#include <random>
+#include <utility>
+#include <vector>
+
+#include <utils/Utf.h>
+
+#include "../utils/src/Conversion.h"
+
+#ifdef HAVE_ICU
+#include <unicode/ustring.h>
+#endif
+
+namespace {
+
+using namespace oracle;
+using mirel::MalformedReason;
+using mirel::OnMalformed;
+
+template <class T> using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
+
+/// What the oracle says of a text.
+template <class T> struct Expected {
+  explicit Expected(View<T> source) {
+    std::size_t at = 0;
+    for (; at < source.size(); at += sequences.back().length) {
+      Sequence sequence = First(source.substr(at));
+      sequence.offset = at;
+      malformed += !sequence.isWellFormed;
+      if (!sequence.isWellFormed && first == kNpos)
+        first = static_cast<ssize_t>(at);
+      if (first == kNpos)
+        Put(strict, sequence.codePoint);
+      Put(lossy, sequence.codePoint);
+      sequences.push_back(sequence);
+    }
+  }
+  std::vector<Sequence> sequences;
+  Text<Other<T>> strict, lossy;
+  ssize_t malformed = 0, first = kNpos;
+};
+
+/// Walks the code points forwards and backwards.
+template <class T> void CheckCodePoints(View<T> source, const Expected<T>& expected) {
+  const auto range = mirel::CodePoints(source.data(), ssize_t(source.size()));
+  auto i = range.begin();
+  for (const Sequence& sequence : expected.sequences) {
+    ASSERT_NE(i, range.end());
+    ASSERT_EQ(i.position(), ssize_t(sequence.offset));
+    ASSERT_EQ(*i, sequence.codePoint);
+    ASSERT_EQ(i.isMalformed(), !sequence.isWellFormed);
+    ++i;
+  }
+  ASSERT_EQ(i, range.end());
+  ASSERT_EQ(i.position(), ssize_t(source.size()));
+  for (std::size_t k = expected.sequences.size(); k-- > 0;) {
+    --i;
+    ASSERT_EQ(i.position(), ssize_t(expected.sequences[k].offset)) << "going back";
+    ASSERT_EQ(*i, expected.sequences[k].codePoint) << "going back";
+  }
+  ASSERT_EQ(i, range.begin());
+}
+
+/// Calls f with each table of kernels that there is, and with null.
+template <class F> void ForEachKernels(const F& f) {
+#ifdef MIREL_SHARED // all of them are hidden in the library
+  static_cast<void>(f);
+#else
+  const mirel::detail::Kernels* kernels = nullptr;
+  for (int k = 0; (kernels = mirel::detail::KernelsAt(k)) != nullptr; ++k)
+    f(kernels);
+  f(nullptr);
+#endif
+}
+
+/// What doesn't depend on who calls: all of it by each of the kernels.
+template <class T> void CheckKernels(View<T> source, const Expected<T>& expected) {
+  const T *const p = source.data(), *const end = p + source.size();
+  const ssize_t n = ssize_t(source.size()), count = ssize_t(expected.sequences.size());
+  ForEachKernels([&](const mirel::detail::Kernels* kernels) {
+    SCOPED_TRACE(kernels != nullptr ? kernels->name : "scalar");
+    ASSERT_EQ(mirel::detail::FindMalformed(kernels, p, end) - p,
+              expected.first == kNpos ? n : expected.first);
+    const mirel::detail::Lengths lengths = mirel::detail::Measure(kernels, p, end);
+    ASSERT_EQ(lengths.codePoints, count);
+    ASSERT_EQ(lengths.units, ssize_t(expected.lossy.size()));
+    basic_xstring<Other<T>> dst(3, 'x');
+    const auto lossy = mirel::detail::AppendUtf(kernels, dst, p, end, OnMalformed::kReplace);
+    ASSERT_EQ(Std(dst), Text<Other<T>>(3, 'x') + expected.lossy);
+    ASSERT_EQ(lossy.replacements, expected.malformed);
+    ASSERT_EQ(lossy.malformed, expected.first == kNpos ? nullptr : p + expected.first);
+  });
+}
+
+/// The calls of the header, which choose the kernels.
+bool AppendOther(mirel::string16& dst, const char8* p, ssize_t n) { return mirel::AppendUtf16(dst, p, n); }
+bool AppendOther(mirel::string8& dst, const char16* p, ssize_t n) { return mirel::AppendUtf8(dst, p, n); }
+ssize_t Lossy(mirel::string16& dst, View<char8> s) {
+  return mirel::Utf16FromUtf8Lossy(dst, s.data(), ssize_t(s.size()));
+}
+ssize_t Lossy(mirel::string8& dst, View<char16> s) {
+  return mirel::Utf8FromUtf16Lossy(dst, s.data(), ssize_t(s.size()));
+}
+ssize_t OtherLength(View<char8> s) { return mirel::Utf16Length(s.data(), ssize_t(s.size())); }
+ssize_t OtherLength(View<char16> s) { return mirel::Utf8Length(s.data(), ssize_t(s.size())); }
+
+template <class T> void CheckCalls(View<T> source, const Expected<T>& expected) {
+  const ssize_t n = ssize_t(source.size());
+  ASSERT_EQ(mirel::FindMalformed(source.data(), n), expected.first);
+  ASSERT_EQ(mirel::IsWellFormed(source.data(), n), expected.first == kNpos);
+  ASSERT_EQ(mirel::CountCodePoints(source.data(), n), ssize_t(expected.sequences.size()));
+  ASSERT_EQ(OtherLength(source), ssize_t(expected.lossy.size()));
+  basic_xstring<Other<T>> dst(3, 'x');
+  ASSERT_EQ(AppendOther(dst, source.data(), n), expected.first == kNpos);
+  ASSERT_EQ(Std(dst), Text<Other<T>>(3, 'x') + expected.strict);
+  ASSERT_EQ(Lossy(dst, source), expected.malformed);
+  ASSERT_EQ(Std(dst), expected.lossy);
+  for (const Sequence& sequence : expected.sequences) {
+    const auto explained = mirel::ExplainMalformed(source.data(), n, ssize_t(sequence.offset));
+    ASSERT_EQ(explained.length, ssize_t(sequence.length));
+    ASSERT_EQ(explained.reason == MalformedReason::kNone, sequence.isWellFormed);
+  }
+}
+
+template <class T> void CheckText(const Text<T>& text) {
+  SCOPED_TRACE(testing::PrintToString(text));
+  const std::vector<T> exact(text.begin(), text.end()); // whose end a sanitizer sees
+  const View<T> source(exact.data(), exact.size());
+  const Expected<T> expected(source);
+  ASSERT_NO_FATAL_FAILURE(CheckKernels(source, expected));
+  ASSERT_NO_FATAL_FAILURE(CheckCalls(source, expected));
+  ASSERT_NO_FATAL_FAILURE(CheckCodePoints(source, expected));
+}
+
+const Text<char8> kPieces8[] = {
+    "a", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xED\x9F\xBF", "\xF4\x8F\xBF\xBF",
+    // malformed: overlong, surrogates, beyond U+10FFFF, cut off, invalid
+    "\xC0\xAF", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xF0\x8F\xBF\xBF", "\xF4\x90\x80\x80", "\xF5\x80\x80\x80",
+    "\x80", "\xC3", "\xE2\x82", "\xE0\xA0", "\xF0\x9F\x98", "\xF1\x80", "\xFF"};
+const Text<char16> kPieces16[] = {{'a'},    {0xE9},   {0x20AC}, {0xD83D, 0xDE00}, {0x7FF},
+                                  {0xD800}, {0xDFFF}, {0xDBFF}, {0xDC00, 0xD800}};
+const auto& Pieces(char8) { return kPieces8; }
+const auto& Pieces(char16) { return kPieces16; }
+
+/// A mixture of pieces, of which kinds chooses some, with the malformed ones rarer or denser.
+template <class T, class Random> Text<T> Mixture(Random& random, std::size_t size) {
+  const auto& pieces = Pieces(T());
+  const auto kinds = random(), rarity = 1 + random() % 60;
+  constexpr std::size_t kWellFormed = sizeof(T) == 1 ? 6 : 5;
+  Text<T> text;
+  while (text.size() < size) {
+    const std::size_t kind = random() % (random() % rarity == 0 ? std::size(pieces) : kWellFormed);
+    if (kind >= kWellFormed || (kinds >> kind & 1) != 0 || kinds % 8 == 0)
+      text += pieces[kind];
+  }
+  return text;
+}
+
+template <class T> class UtfText : public testing::Test {};
+TYPED_TEST_SUITE(UtfText, CodeUnits);
+
+TYPED_TEST(UtfText, OneOrTwoAmongOthers) {
+  const auto& pieces = Pieces(TypeParam());
+  for (std::size_t n = 0; n < 70; ++n)
+    for (const auto& filler : {pieces[0], pieces[1], pieces[2], pieces[3]})
+      for (const auto& one : pieces) {
+        Text<TypeParam> text;
+        for (std::size_t k = 0; k < n; ++k)
+          text += filler;
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one));
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + pieces[n % std::size(pieces)] + text));
+      }
+}
+
+TYPED_TEST(UtfText, Mixtures) {
+  std::mt19937 random(3);
+  for (int round = 0; round < 3000; ++round)
+    ASSERT_NO_FATAL_FAILURE(CheckText(Mixture<TypeParam>(random, random() % 500)));
+}
+
+/// The strict conversions, which tests/UtfTest.cpp compares with the same oracle, agree with the decoder.
+TEST(UtfText, EverySequenceIsClassifiedAsTheStandardDoes) {
+  for (unsigned bytes = 0; bytes < 1u << 24; ++bytes) {
+    const char8 text[] = {static_cast<char8>(bytes >> 16), static_cast<char8>(bytes >> 8),
+                          static_cast<char8>(bytes)};
+    const std::size_t zeros = bytes < 0x100 ? 2 : bytes < 0x10000;
+    const View<char8> view = View<char8>(text, 3).substr(zeros);
+    const Sequence expected = First(view);
+    const auto sequence = mirel::detail::Decode(view.data(), view.data() + view.size());
+    if (sequence.codePoint != expected.codePoint || sequence.length != int(expected.length) ||
+        sequence.isWellFormed != expected.isWellFormed)
+      FAIL() << testing::PrintToString(view);
+  }
+}
+
+TEST(UtfText, ReasonsAreTold) {
+  struct {
+    Text<char8> text;
+    ssize_t length;
+    MalformedReason reason;
+    const char* words;
+  } const rows[] = {{"\xC3", 1, MalformedReason::kTruncated, "truncated sequence"},
+                    {"\xC3x", 1, MalformedReason::kTruncated, "truncated sequence"},
+                    {"\xE2\x82\xC3", 2, MalformedReason::kTruncated, "truncated sequence"},
+                    {"\xF0\x9F\x98", 3, MalformedReason::kTruncated, "truncated sequence"},
+                    {"\xF4", 1, MalformedReason::kTruncated, "truncated sequence"},
+                    {"\x80", 1, MalformedReason::kUnexpectedContinuation, "unexpected continuation byte"},
+                    {"\xBF", 1, MalformedReason::kUnexpectedContinuation, "unexpected continuation byte"},
+                    {"\xC0\x80", 1, MalformedReason::kOverlong, "overlong sequence"},
+                    {"\xC1", 1, MalformedReason::kOverlong, "overlong sequence"},
+                    {"\xE0\x9F\xBF", 1, MalformedReason::kOverlong, "overlong sequence"},
+                    {"\xF0\x8F\xBF", 1, MalformedReason::kOverlong, "overlong sequence"},
+                    {"\xED\xA0\x80", 1, MalformedReason::kSurrogate, "surrogate in UTF-8"},
+                    {"\xF4\x90", 1, MalformedReason::kBeyondUnicode, "code point above U+10FFFF"},
+                    {"\xF5\x80", 1, MalformedReason::kInvalidByte, "invalid byte"},
+                    {"\xFF", 1, MalformedReason::kInvalidByte, "invalid byte"},
+                    {"\xC3\xA9", 2, MalformedReason::kNone, "well-formed sequence"}};
+  for (const auto& row : rows) {
+    const auto malformed = mirel::ExplainMalformed("a" + row.text, 1);
+    EXPECT_EQ(malformed.offset, 1);
+    EXPECT_EQ(malformed.length, row.length) << testing::PrintToString(row.text);
+    EXPECT_EQ(malformed.reason, row.reason) << testing::PrintToString(row.text);
+    EXPECT_STREQ(mirel::Describe(malformed.reason), row.words);
+  }
+  EXPECT_STREQ(mirel::Describe(mirel::ExplainMalformed(mirel::string16(1, 0xD800), 0).reason),
+               "unpaired surrogate");
+}
+
+/// Feeds a text in two or three pieces, and a byte at a time.
+template <class T> void CheckPieces(const Text<T>& text, const std::vector<std::size_t>& cuts) {
+  const Expected<T> expected{View<T>(text)};
+  for (const OnMalformed policy : {OnMalformed::kStop, OnMalformed::kReplace}) {
+    const bool isStrict = policy == OnMalformed::kStop;
+    mirel::UtfStream<Other<T>, T> stream(policy);
+    for (int again = 0; again < 2; ++again) { // a finished stream begins anew
+      basic_xstring<Other<T>> dst(1, 'x');
+      std::size_t at = 0;
+      bool ok = true;
+      for (const std::size_t cut : cuts) {
+        ok = stream.Append(dst, text.data() + at, ssize_t(cut - at));
+        at = cut;
+      }
+      ok = stream.Finish(dst);
+      ASSERT_EQ(ok, !isStrict || expected.first == kNpos);
+      ASSERT_EQ(Std(dst), Text<Other<T>>(1, 'x') + (isStrict ? expected.strict : expected.lossy));
+      ASSERT_EQ(stream.malformed().offset, expected.first);
+      ASSERT_EQ(stream.replacements(), isStrict ? 0 : expected.malformed);
+      if (expected.first != kNpos) {
+        const auto whole = mirel::ExplainMalformed(text.data(), ssize_t(text.size()), expected.first);
+        ASSERT_EQ(stream.malformed().length, whole.length);
+        ASSERT_EQ(stream.malformed().reason, whole.reason);
+      }
+    }
+  }
+}
+
+TYPED_TEST(UtfText, InPiecesAsInOne) {
+  std::mt19937 random(4);
+  for (int round = 0; round < 400; ++round) {
+    const Text<TypeParam> text = Mixture<TypeParam>(random, random() % 14);
+    SCOPED_TRACE(testing::PrintToString(text));
+    std::vector<std::size_t> every;
+    for (std::size_t i = 0; i <= text.size(); ++i) {
+      every.push_back(i);
+      for (std::size_t k = i; k <= text.size(); ++k)
+        ASSERT_NO_FATAL_FAILURE(CheckPieces(text, {i, k, text.size()}));
+    }
+    ASSERT_NO_FATAL_FAILURE(CheckPieces(text, every));
+  }
+}
+
+TEST(UtfText, MalformedPiecesAreToldAtOnce) {
+  mirel::Utf8Stream stream;
+  mirel::string16 dst;
+  EXPECT_TRUE(stream.Append(dst, "ab\xE2", 3));
+  EXPECT_EQ(stream.pending(), 1);
+  EXPECT_EQ(stream.position(), 3);
+  EXPECT_TRUE(stream.Append(dst, "\x82", 1));
+  EXPECT_EQ(dst.size(), 2);
+  EXPECT_FALSE(stream.Append(dst, "cd", 2));
+  EXPECT_EQ(stream.malformed().offset, 2);
+  EXPECT_EQ(stream.malformed().length, 2);
+  EXPECT_EQ(stream.malformed().reason, MalformedReason::kTruncated);
+  EXPECT_FALSE(stream.Append(dst, "e", 1)) << "stays so";
+  EXPECT_FALSE(stream.Finish(dst));
+  EXPECT_EQ(dst.size(), 2);
+  EXPECT_TRUE(stream.Append(dst, "e", 1)) << "of the next text";
+  EXPECT_EQ(stream.malformed().offset, kNpos);
+  EXPECT_TRUE(stream.Append(dst, nullptr, 0));
+  EXPECT_TRUE(stream.Finish(dst));
+  EXPECT_EQ(dst.size(), 3);
+}
+
+TYPED_TEST(UtfText, AppendingManyTimesAllocatesSeldom) {
+  basic_xstring<Other<TypeParam>> dst;
+  const Text<TypeParam> text(17, 'a');
+  EXPECT_LT(allocation::Count([&] {
+              for (int i = 0; i < 20000; ++i)
+                AppendOther(dst, text.data(), 17);
+            }),
+            50);
+  EXPECT_EQ(dst.size(), 20000 * 17);
+}
+
+TEST(UtfText, StringsViewsAndLiterals) {
+  const mirel::string8 text = "a\u20AC\xFF";
+  const std::string standard = "a\u20AC\xFF";
+  EXPECT_EQ(mirel::FindMalformed(text), 4);
+  EXPECT_EQ(mirel::FindMalformed(standard), 4);
+  EXPECT_EQ(mirel::FindMalformed("a\u20AC\xFF"), 4);
+  EXPECT_FALSE(mirel::IsWellFormed(std::string_view(standard)));
+  EXPECT_TRUE(mirel::IsWellFormed("a"));
+  EXPECT_EQ(mirel::CountCodePoints("a\u20AC\xFF"), 3);
+  EXPECT_EQ(mirel::Utf16Length("\U0001F600"), 2);
+  mirel::string16 wide;
+  EXPECT_EQ(mirel::Utf16FromUtf8Lossy(wide, "a\u20AC\xFF"), 1);
+  EXPECT_EQ(Std(wide), (Text<char16>{'a', 0x20AC, 0xFFFD}));
+  EXPECT_TRUE(mirel::AppendUtf16(wide, std::string("b")));
+  EXPECT_TRUE(mirel::IsWellFormed(wide));
+  EXPECT_EQ(mirel::CountCodePoints(wide), 4);
+  EXPECT_EQ(mirel::Utf8Length(wide), 8);
+  EXPECT_FALSE(mirel::Utf16FromUtf8(wide, text));
+  EXPECT_EQ(Std(wide), (Text<char16>{'a', 0x20AC}));
+  EXPECT_TRUE(mirel::Utf16FromUtf8(wide, std::string_view("xyz").substr(1)));
+  mirel::string8 narrow;
+  EXPECT_TRUE(mirel::Utf8FromUtf16(narrow, wide));
+  EXPECT_EQ(Std(narrow), "yz");
+  EXPECT_TRUE(mirel::AppendUtf8(narrow, wide));
+  EXPECT_EQ(Std(narrow), "yzyz");
+  EXPECT_EQ(mirel::Utf8FromUtf16Lossy(narrow, mirel::string16(2, 0xDC00)), 2);
+  EXPECT_EQ(Std(narrow), "\uFFFD\uFFFD");
+}
+
+TEST(UtfText, FromTheStandardLibrarysUtf16) {
+  mirel::string8 narrow = "old";
+  std::u16string text;
+  for (int i = 0; i < 1500; ++i) // more than a block, of which one ends within a pair
+    text += i == 3 ? u"a" : u"\U0001F600";
+  EXPECT_TRUE(mirel::Utf8FromUtf16(narrow, text));
+  EXPECT_EQ(narrow.size(), 4 * 1499 + 1);
+  EXPECT_EQ(mirel::CountCodePoints(narrow), 1500);
+  EXPECT_TRUE(mirel::Utf8FromUtf16(narrow, u"gr\u00FCn"));
+  EXPECT_EQ(Std(narrow), "gr\u00FCn");
+  text.insert(2001, 1, u'\xD800');
+  EXPECT_FALSE(mirel::Utf8FromUtf16(narrow, text));
+  EXPECT_EQ(narrow.size(), 4 * 1000 + 1);
+  EXPECT_TRUE(mirel::Utf8FromUtf16(narrow, std::u16string_view()));
+  EXPECT_TRUE(narrow.empty());
+}
+
+TYPED_TEST(UtfText, NullIsEmpty) {
+  const TypeParam* const null = nullptr;
+  basic_xstring<Other<TypeParam>> dst(2, 'x');
+  EXPECT_EQ(mirel::FindMalformed(null, 0), kNpos);
+  EXPECT_EQ(mirel::CountCodePoints(null, 0), 0);
+  EXPECT_TRUE(mirel::CodePoints(null, 0).empty());
+  EXPECT_TRUE(AppendOther(dst, null, 0));
+  EXPECT_EQ(dst.size(), 2);
+  EXPECT_EQ(Lossy(dst, View<TypeParam>()), 0);
+  EXPECT_TRUE(dst.empty());
+}
+
+TYPED_TEST(UtfText, CodePointsAreAppended) {
+  const std::pair<char32_t, char32_t> rows[] = {
+      {0, 0},           {0x7F, 0x7F},       {0x80, 0x80},         {0x7FF, 0x7FF},
+      {0x800, 0x800},   {0xFFFF, 0xFFFF},   {0xD800, 0xFFFD},     {0xDFFF, 0xFFFD},
+      {0xE000, 0xE000}, {0x10000, 0x10000}, {0x10FFFF, 0x10FFFF}, {0x110000, 0xFFFD}};
+  basic_xstring<TypeParam> s;
+  Text<TypeParam> expected;
+  for (const auto& [given, appended] : rows) {
+    mirel::AppendCodePoint(s, given);
+    Put(expected, appended);
+  }
+  EXPECT_EQ(Std(s), expected);
+}
+
+using Iterator = mirel::CodePointIterator<char8>;
+static_assert(std::is_same_v<std::iterator_traits<Iterator>::iterator_category, std::input_iterator_tag>);
+static_assert(std::is_same_v<Iterator::iterator_concept, std::bidirectional_iterator_tag>);
+template <class S, class = void> constexpr bool kTakes = false;
+template <class S>
+constexpr bool kTakes<S, std::void_t<decltype(mirel::CodePoints(std::declval<S>()))>> = true;
+static_assert(kTakes<mirel::string8&> && kTakes<const mirel::string16&> && kTakes<std::string&> &&
+              kTakes<std::string_view> && kTakes<const char*>);
+static_assert(!kTakes<mirel::string8> && !kTakes<const mirel::string16> && !kTakes<std::string> &&
+              !kTakes<const std::string> && !kTakes<std::nullptr_t>);
+#ifdef __cpp_lib_ranges
+static_assert(std::bidirectional_iterator<Iterator>);
+static_assert(std::ranges::bidirectional_range<mirel::CodePointRange<char16>>);
+#endif
+
+#ifdef HAVE_ICU
+TEST(UtfText, AMillionMutatedTextsAsIcuReplacesThem) {
+  std::mt19937 random(8);
+  mirel::string16 wide;
+  mirel::string8 narrow;
+  char16_t units[256];
+  char bytes[1024];
+  for (int round = 0; round < 1000000; ++round) {
+    Text<char8> text = Mixture<char8>(random, 1 + random() % 40);
+    text[random() % text.size()] = static_cast<char8>(random());
+    int32_t n = 0, count = 0;
+    UErrorCode error = U_ZERO_ERROR;
+    u_strFromUTF8WithSub(units, 256, &n, text.data(), int32_t(text.size()), 0xFFFD, &count, &error);
+    ASSERT_EQ(mirel::Utf16FromUtf8Lossy(wide, text.data(), ssize_t(text.size())), count);
+    ASSERT_EQ(std::u16string(wide.begin(), wide.end()), std::u16string(units, std::size_t(n)))
+        << testing::PrintToString(text);
+    wide[ssize_t(random()) % wide.size()] = static_cast<char16>(0xD800 + random() % 0x800);
+    const std::u16string mutated(wide.begin(), wide.end());
+    u_strToUTF8WithSub(bytes, 1024, &n, mutated.data(), int32_t(mutated.size()), 0xFFFD, &count, &error);
+    ASSERT_EQ(mirel::Utf8FromUtf16Lossy(narrow, wide), count);
+    ASSERT_EQ(Std(narrow), std::string(bytes, std::size_t(n))) << testing::PrintToString(mutated);
+  }
+}
+#endif
+
+} // namespace

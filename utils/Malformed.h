@@ -1,0 +1,32 @@
+/// @file
+/// What can be wrong with a sequence of UTF-8 or UTF-16, as a value and in words.
+
+#pragma once
+
+#include <utils/BasicTypes.h>
+
+namespace mirel {
+
+/// Why a sequence isn't well-formed.
+enum class MalformedReason {
+  kNone,                   ///< It is well-formed.
+  kTruncated,              ///< The text ends, or goes on with another unit, before the sequence is complete.
+  kUnexpectedContinuation, ///< A byte 80 to BF that continues nothing.
+  kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 begin no others.
+  kSurrogate,              ///< A surrogate, D800 to DFFF, encoded in UTF-8.
+  kBeyondUnicode,          ///< A code point above U+10FFFF: F4 followed by 90 or above.
+  kInvalidByte,            ///< A byte F5 to FF, which UTF-8 never has.
+  kUnpairedSurrogate,      ///< A surrogate of UTF-16 without its other half.
+};
+
+/// The reason as a noun phrase for a message, "overlong sequence" for example.
+MIREL_API const char* Describe(MalformedReason reason);
+
+/// A malformed sequence in a text.
+struct MalformedText {
+  ssize_t offset;         ///< The index of its first unit.
+  ssize_t length;         ///< The units that one U+FFFD replaces.
+  MalformedReason reason; ///< What is wrong with it.
+};
+
+} // namespace mirel

@@ -1,0 +1,42 @@
+// What the conversions share: the loop that all of them are made of, and what they know of malformed text.
+
+#pragma once
+
+#include <utils/CodePoints.h>
+#include <utils/UtfStream.h>
+
+#include "KernelTable.h"
+
+namespace mirel::detail {
+
+/// How a conversion ended.
+template <class CharIn> struct Appended {
+  const CharIn* malformed; ///< the first malformed sequence, at which a strict conversion stopped; or null
+  ssize_t replacements;    ///< how many U+FFFD a lossy conversion has put in the place of such
+};
+
+/// Converts [src, end) by the given kernels, and without any if they are null, behind what dst holds.
+template <class CharOut, class CharIn>
+Appended<CharIn> AppendUtf(const Kernels* kernels, basic_xstring<CharOut>& dst, const CharIn* src,
+                           const CharIn* end, OnMalformed onMalformed);
+
+/// FindMalformed() by the given kernels, and without any if they are null: the first malformed sequence of
+/// [p, end), or end.
+template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end);
+
+/// The lengths of a text, malformed text counted as U+FFFD.
+struct Lengths {
+  ssize_t codePoints;
+  ssize_t units; ///< in the other encoding
+};
+template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* end);
+
+/// What is wrong with the sequence at p, which Decode() finds to have the given length.
+MalformedReason ReasonOf(const char8* p, const char8* end, const Sequence& sequence);
+MalformedReason ReasonOf(const char16* p, const char16* end, const Sequence& sequence);
+
+/// How many units at the end of [begin, end) begin a sequence that units behind them may complete.
+ssize_t CutOffAtEnd(const char8* begin, const char8* end);
+ssize_t CutOffAtEnd(const char16* begin, const char16* end);
+
+} // namespace mirel::detail

@@ -1,0 +1,44 @@
+// How long a text is: in code points, and in units of the other encoding.
+
+#include <utils/Utf.h>
+
+#include "Conversion.h"
+
+namespace mirel {
+
+namespace detail {
+
+template <class T> Lengths Measure(const Kernels*, const T* p, const T* end) {
+  using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
+  Lengths lengths{0, 0};
+  while (p != end) {
+    const Sequence sequence = Decode(p, end);
+    p += sequence.length;
+    ++lengths.codePoints;
+    lengths.units += EncodedLength<Other>(sequence.codePoint);
+  }
+  return lengths;
+}
+template Lengths Measure(const Kernels* kernels, const char8* p, const char8* end);
+template Lengths Measure(const Kernels* kernels, const char16* p, const char16* end);
+
+namespace {
+
+template <class T> Lengths MeasureText(const T* p, ssize_t pn) {
+  MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
+  return Measure(BestKernels(), p, p + pn);
+}
+
+} // namespace
+
+} // namespace detail
+
+ssize_t Utf16Length(const char8* p, ssize_t pn) { return detail::MeasureText(p, pn).units; }
+
+ssize_t Utf8Length(const char16* p, ssize_t pn) { return detail::MeasureText(p, pn).units; }
+
+ssize_t CountCodePoints(const char8* p, ssize_t pn) { return detail::MeasureText(p, pn).codePoints; }
+
+ssize_t CountCodePoints(const char16* p, ssize_t pn) { return detail::MeasureText(p, pn).codePoints; }
+
+} // namespace mirel
