@@ -1,27 +1,19 @@
-// Text in formatted output: printf, and std::format or the fmt library.
+// Text in formatted output: printf, standard streams, and std::format or the fmt library.
 
 #include <cstdio>
-#include <string_view>
-#include <version>
+#include <iomanip>
+#include <iostream>
+
+#include <utils/Format.h>
+
 #if defined(__cpp_lib_format)
-#include <format>
 namespace formatting = std;
 #else
-#include <fmt/format.h>
 namespace formatting = fmt;
 #endif
 
-#include <utils/xstring.h>
-
+using mirel::string16;
 using mirel::string8;
-
-// Formats a string8 as the string_view over it, with all its options.
-template <> struct formatting::formatter<string8> : formatting::formatter<std::string_view> {
-  auto format(const string8& text, formatting::format_context& context) const {
-    const std::string_view view(text.data(), static_cast<std::size_t>(text.size()));
-    return formatting::formatter<std::string_view>::format(view, context);
-  }
-};
 
 int main() {
   string8 name = "Ada Lovelace";
@@ -29,11 +21,21 @@ int main() {
   // printf counts in int. With a count it needs no terminator and prints up to the first zero, if there is
   // one.
   std::printf("<%.*s> <%.3s>\n", static_cast<int>(name.size()), name.data(), name.c_str());
+  std::fflush(stdout);
 
-  std::puts(formatting::format("<{}> <{:_>16}> <{:.3}>", name, name, name).c_str());
+  std::cout << '<' << name << "> <" << std::setw(16) << std::setfill('_') << name << ">\n";
+
+  std::cout << formatting::format("<{}> <{:_>16}> <{:.3}>\n", name, name, name);
+
+  // A string16 comes out as UTF-8, with U+FFFD where it is malformed.
+  string16 wide = mirel::ToString16(u"Zoë");
+  wide.push_back(0xD800);
+  std::cout << formatting::format("<{}> <{:*^8.3}>\n", wide, wide);
 }
 
 /* Prints:
 <Ada Lovelace> <Ada>
+<Ada Lovelace> <____Ada Lovelace>
 <Ada Lovelace> <____Ada Lovelace> <Ada>
+<Zoë�> <**Zoë***>
 */
