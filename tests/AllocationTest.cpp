@@ -23,7 +23,8 @@
 extern "C" void* REAL_REALLOC(void* p, std::size_t n) noexcept;
 extern "C" void* WRAPPED_REALLOC(void* p, std::size_t n) noexcept {
   ++allocation::count;
-  if (allocation::failAfter == 0 || n > PTRDIFF_MAX)
+  allocation::requested = n;
+  if (allocation::failAfter == 0 || n > PTRDIFF_MAX / 4) // also where a machine of 32 bits has so much
     return nullptr;
   if (allocation::failAfter > 0)
     --allocation::failAfter;
@@ -177,6 +178,38 @@ TEST(Allocation, AFailureLeavesABufferAsItWas) {
                                               EDIT(s.insert(1, 7)), EDIT(s.growbytes(1)), EDIT(s.resize(4)),
                                               EDIT(s.push_back('x')), EDIT(s.insertbytes(0, kMax)),
                                               EDIT(s.resize(kMax))});
+}
+
+TYPED_TEST(Allocation, SumsOfSizesDontOverflow) {
+  using S = basic_xstring<TypeParam>;
+  constexpr ssize_t unit = sizeof(TypeParam), largest = std::numeric_limits<ssize_t>::max() / unit;
+  S v(1, 'x');
+  mirel::VectorOfByte& bytes = reinterpret_cast<mirel::VectorOfByte&>(v);
+  const TypeParam* const data = v.data();
+  const auto expectFailure = [&](ssize_t size, const std::function<void(S&)>& edit, ssize_t requested) {
+    bytes.size_ = bytes.m_capacity = size * unit; // which the storage doesn't have: nothing may be moved
+    allocation::requested = 0;
+    EXPECT_THROW(edit(v), std::bad_alloc);
+    EXPECT_EQ(allocation::requested, std::size_t(requested * unit));
+    EXPECT_EQ(v.size(), size);
+    EXPECT_EQ(v.capacity(), size);
+    EXPECT_EQ(v.data(), data);
+  };
+  const EditsOf<S> edits = {EDIT(s.push_back('x')),
+                            EDIT(s.append(1, 'x')),
+                            EDIT(s.insert(0, 'x')),
+                            EDIT(s.c_str()),
+                            EDIT(s + s),
+                            EDIT(s + 'x'),
+                            EDIT(s *= 2)};
+  for (const auto& edit : edits)
+    expectFailure(largest, edit, 0);
+  // Growth asks for no more than it must where more couldn't be counted.
+  const ssize_t size = largest / 4 * 3;
+  expectFailure(size, EDIT(s.push_back('x')), size + 1);
+  expectFailure(size, EDIT(s.append(5, 'x')), size + 5);
+  expectFailure(size, EDIT(s.c_str()), size + 1);
+  bytes.size_ = bytes.m_capacity = unit;
 }
 
 TYPED_TEST(Allocation, AFailedConversionThrowsAndKeepsTheBeginning) {

@@ -37,6 +37,7 @@ namespace allocation {
 
 inline thread_local long count = 0;      ///< how many allocations this thread has made
 inline thread_local long failAfter = -1; ///< how many of its next ones succeed before one fails; -1 for all
+inline thread_local std::size_t requested = 0; ///< how many bytes the last one was to have
 
 /// Allocations that an action takes.
 template <class F> long Count(const F& action) {

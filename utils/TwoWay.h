@@ -24,11 +24,11 @@ public:
   /// have been passed in all.
   bool Allows(ssize_t equalUnits, ssize_t passed) {
     m_credit -= equalUnits / 4 + 8;
-    return m_credit + 4 * passed >= 0;
+    return m_credit + 4 * int64(passed) >= 0;
   }
 
 private:
-  ssize_t m_credit;
+  int64 m_credit; // four times a size
 };
 
 /// The number of equal elements before the first difference of the n at x and at y, n if there is none.

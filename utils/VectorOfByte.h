@@ -24,6 +24,9 @@ namespace detail {
 
 struct Storage; // what the conversions know of a vector's storage
 
+/// Throws std::bad_alloc. A header that threw it wouldn't compile in a program without exceptions.
+[[noreturn, gnu::cold]] MIREL_API void AllocationFailed();
+
 } // namespace detail
 
 /// @name Comparing ranges
@@ -420,13 +423,14 @@ public:
     static_assert(std::is_arithmetic_v<T> || std::is_enum_v<T>,
                   "push_back appends one number: write += for a buffer, and push_back(r1, r2) for bytes");
     const T value = x; // x may lie in the storage that reserve() is about to give up
-    const ssize_t n = size_ + ssize_t(sizeof(T));
-    if (m_capacity < n) {
-      m_buffer = Reallocate(m_buffer, n + m_capacity);
-      m_capacity += n;
+    const std::size_t n = std::size_t(size_) + sizeof(T); // unsigned, where it can't overflow
+    if (std::size_t(m_capacity) < n) {
+      const ssize_t capacity = GrownCapacity(m_capacity, n);
+      m_buffer = Reallocate(m_buffer, capacity);
+      m_capacity = capacity;
     }
     std::memcpy(m_buffer + size_, &value, sizeof(T));
-    size_ = n;
+    size_ = ssize_t(n);
   }
 
   /// Removes the last count bytes. @pre "0 <= count", then "size_ >= 0" of the size that would be left
@@ -538,6 +542,10 @@ public:
   /// @endcond
 
 private:
+  /// The capacity that a buffer grows to for n bytes, which are more than it has room for. Throws
+  /// std::bad_alloc where no ssize_t can count them.
+  static ssize_t GrownCapacity(ssize_t capacity, std::size_t n);
+  void GrowTo(std::size_t n);
   // By value, so that a buffer whose address nobody takes can live in registers through a loop of appends.
   static value_type* Reallocate(value_type* buffer, ssize_t n);
   static void Release(value_type* buffer) noexcept;

@@ -103,7 +103,7 @@ public:
   const T* c_str() const {
     const ssize_t n = this->size();
     if (n == this->capacity())
-      this->reserve(n + 1 + n / 2);
+      this->reserve(Base::Sum(n, 1 + (n / 2 < Base::kMaxSize - n ? n / 2 : 0)));
     const T* const p = this->data();
     MIREL_ASSERT(p);
     const_cast<T*>(p)[n] = 0;

@@ -12,7 +12,6 @@
 #include <initializer_list>
 #include <iterator>
 #include <limits>
-#include <new>
 
 #include <utils/Elements.h>
 #include <utils/Integers.h>
@@ -86,13 +85,18 @@ public:
   xvector(const xvector<T>& r, ssize_t ri, ssize_t rn) { assign(r, ri, rn); }
   /// The pn elements at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   xvector(const T* p, ssize_t pn) { assign(p, pn); }
+#if __SIZEOF_POINTER__ != 4 // where it is, ssize_t is int
   /// count elements equal to x. @pre "0 <= count"
   explicit xvector(ssize_t count, const T& x) {
     MIREL_ASSERT(0 <= count);
     FillRange(0, 0, count, x);
   }
+#endif
   /// count elements equal to x, implicitly. @pre "0 <= count"
-  xvector(int count, const T& x) : xvector(ssize_t(count), x) {}
+  xvector(int count, const T& x) {
+    MIREL_ASSERT(0 <= count);
+    FillRange(0, 0, count, x);
+  }
   /// The elements of [r1, r2). @pre "r1 <= r2"
   xvector(const T* r1, const T* r2) { assign(r1, r2); }
   /// The elements of [r1, r2), which may be any iterators. @pre "r1 <= r2"
@@ -257,7 +261,7 @@ public:
   /// A new vector: the elements of this one, then those of r. Allocates once.
   const xvector<T> operator+(const xvector<T>& r) const {
     xvector<T> z;
-    z.reserve(size() + r.size());
+    z.reserve(Sum(size(), r.size()));
     z = *this;
     z.append(r);
     return z;
@@ -265,7 +269,7 @@ public:
   /// A new vector: the elements of this one, then x. Allocates once.
   const xvector<T> operator+(const T& x) const {
     xvector<T> z;
-    z.reserve(size() + 1);
+    z.reserve(Sum(size(), 1));
     z = *this;
     z.push_back(x);
     return z;
@@ -363,12 +367,14 @@ public:
     MIREL_ASSERT(0 <= count);
     FillRange(i, 0, count, x);
   }
-  /// Inserts an int's count of elements equal to x before index i.
-  void insert(ssize_t i, int count, const T& x) { insert(i, ssize_t(count), x); }
   /// Inserts count elements equal to x before an iterator.
   void insert(iterator i, ssize_t count, const T& x) { insert(i - begin(), count, x); }
+#if __SIZEOF_POINTER__ != 4 // where it is, ssize_t is int
+  /// Inserts an int's count of elements equal to x before index i.
+  void insert(ssize_t i, int count, const T& x) { insert(i, ssize_t(count), x); }
   /// Inserts an int's count of elements equal to x before an iterator.
   void insert(iterator i, int count, const T& x) { insert(i, ssize_t(count), x); }
+#endif
 
   /// @}
   /// @name Replacing
@@ -762,14 +768,24 @@ public:
   template <class... N, detail::IfIntegers<N...> = 0> detail::WriteNullptr compare(N...) const = delete;
   /// @endcond
 
+protected:
+  /// The most elements whose bytes an ssize_t can count.
+  static constexpr ssize_t kMaxSize = std::numeric_limits<ssize_t>::max() / ssize_t(sizeof(T));
+  /// The sum of two sizes; throws std::bad_alloc where no vector can be that large.
+  static ssize_t Sum(ssize_t a, ssize_t b) {
+    if (b > kMaxSize - a)
+      detail::AllocationFailed();
+    return a + b;
+  }
+
 private:
   /// The element size in bytes.
   static constexpr ssize_t S = sizeof(T);
 
   /// The only place where a number of elements that may be too large becomes one of bytes.
   static ssize_t Bytes(ssize_t count) {
-    if (count > std::numeric_limits<ssize_t>::max() / S)
-      throw std::bad_alloc();
+    if (count > kMaxSize)
+      detail::AllocationFailed();
     return count * S;
   }
   /// And back. Without a sign it is a shift, and compilers see that it is never negative.
@@ -954,8 +970,8 @@ template <class T> void xvector<T>::AppendRepeated(ssize_t count, const T* p, ss
     xvector<T> copy(p, pn);
     return AppendRepeated(count, copy.begin(), pn);
   }
-  if (count > std::numeric_limits<ssize_t>::max() / pn)
-    throw std::bad_alloc();
+  if (count > kMaxSize / pn)
+    detail::AllocationFailed();
   T* range = ResizeRange(size(), 0, count * pn);
   for (; range != end(); range += pn)
     p_copy(range, p, p + pn);

@@ -330,7 +330,7 @@ const T* FindInSetByTable(const T* x1, const T* x2, const T* y1, const T* y2) {
   const T* p = x1;
   const T* end = x2;
   // Where the table isn't exact, hits may be false: it pays as long as few are. It takes 16 bytes at a time.
-  for (ssize_t credit = kIsMember || table.isExact ? 512 + 8 * (y2 - y1) : 0;
+  for (int64 credit = kIsMember || table.isExact ? 512 + 8 * int64(y2 - y1) : 0;
        credit > 0 && end - p >= 2 * kUnitsIn8Bytes<T>;) {
     const T* const hit = Scan<kReverse>(p, end, is);
     if (hit == nullptr)
@@ -354,7 +354,7 @@ const T* FindInSet(const T* x1, const T* x2, const T* y1, const T* y2) {
   const Membership<kIsMember, T, Members<T>> is = {y1, y2, set};
   const bool isLarge = size > 64;
   ssize_t near = isLarge ? 8 : 16;
-  if (length <= 24 || (!isLarge && length * size < 1024 * ssize_t(sizeof(T)) * ssize_t(sizeof(T))))
+  if (length <= 24 || (!isLarge && int64(length) * size < 1024 * int64(sizeof(T) * sizeof(T))))
     near = length;
   const T* const from = kReverse ? x2 - near : x1;
   const T* const hit =

@@ -38,17 +38,25 @@ void FillBytes(uint8* dst, ssize_t n, uint8 x) {
     std::memset(dst, x, static_cast<std::size_t>(n));
 }
 
-/// Makes room for n bytes in all. This is where growth is decided, for all edits but push_back of an element,
-/// which follows the same rule inline (no sum of two sizes overflows in 64 bits): the new size plus the old
-/// capacity. The capacity at least doubles, so a run of edits moves each byte a constant number of times on
-/// average; a first request is granted exactly.
-void GrowTo(const VectorOfByte& buffer, ssize_t n) {
-  const ssize_t capacity = buffer.capacity();
-  if (capacity < n)
-    buffer.reserve(n <= kMaxBytes - capacity ? n + capacity : n);
+} // namespace
+
+void detail::AllocationFailed() { throw std::bad_alloc(); }
+
+/// This is where growth is decided, for all edits: the new size plus the old capacity. The capacity at least
+/// doubles, so a run of edits moves each byte a constant number of times on average; a first request is
+/// granted exactly.
+ssize_t VectorOfByte::GrownCapacity(ssize_t capacity, std::size_t n) {
+  if (n > std::size_t(kMaxBytes))
+    throw std::bad_alloc();
+  const ssize_t size = ssize_t(n);
+  return size <= kMaxBytes - capacity ? size + capacity : size;
 }
 
-} // namespace
+/// Makes room for n bytes in all.
+void VectorOfByte::GrowTo(std::size_t n) {
+  if (n > std::size_t(m_capacity))
+    reserve(GrownCapacity(m_capacity, n));
+}
 
 VectorOfByte::VectorOfByte(const value_type* r1, const value_type* r2) : VectorOfByte() { assign(r1, r2); }
 
@@ -90,7 +98,7 @@ void VectorOfByte::Shrink(ssize_t n) noexcept {
 
 void VectorOfByte::resize(ssize_t n) {
   MIREL_ASSERT(0 <= n);
-  GrowTo(*this, n);
+  GrowTo(std::size_t(n));
   size_ = n;
 }
 
@@ -114,9 +122,7 @@ void VectorOfByte::push_back(const value_type* r1, const value_type* r2) { inser
 void VectorOfByte::insertbytes(ssize_t i, ssize_t n) {
   MIREL_ASSERT(0 <= i && i <= size());
   MIREL_ASSERT(0 <= n);
-  if (n > kMaxBytes - size_)
-    throw std::bad_alloc();
-  GrowTo(*this, size_ + n);
+  GrowTo(std::size_t(size_) + std::size_t(n)); // unsigned, where no sum of two sizes overflows
   MoveBytes(m_buffer + i + n, m_buffer + i, size_ - i);
   size_ += n;
 }

@@ -108,6 +108,12 @@ private:
   ssize_t gathered = kInLine; ///< the same number after the bytes in the block
 };
 
+/// The standard streams count in 32 bits where pointers have so many: the nearest count that they can hold.
+std::streamsize ForStandard(streamsize x) {
+  using Limits = std::numeric_limits<std::streamsize>;
+  return static_cast<std::streamsize>(std::clamp<streamsize>(x, Limits::min(), Limits::max()));
+}
+
 } // namespace
 
 class IndentingOutputStreamToOStream : public std::ostream {
@@ -188,7 +194,7 @@ void xostream::put(ConstString8Z x) {
   MIREL_ASSERT(x);
   m_os->PutText(x, GetStringLength(x));
 }
-void xostream::put(const char8* p, ssize_t pn) { put_internal(p, pn, width()); }
+void xostream::put(const char8* p, ssize_t pn) { put_internal(p, pn, m_os->width()); }
 void xostream::put_internal(const xchar* p, ssize_t pn, ssize_t width) {
   MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
   m_os->width(width);
@@ -203,9 +209,9 @@ void xostream::endl() {
 void xostream::ends() { m_os->PutBytes("", 1); }
 
 streamsize xostream::precision() const { return m_os->precision(); }
-streamsize xostream::precision(streamsize x) { return m_os->precision(x); }
+streamsize xostream::precision(streamsize x) { return m_os->precision(ForStandard(x)); }
 streamsize xostream::width() const { return m_os->width(); }
-streamsize xostream::width(streamsize x) { return m_os->width(x); }
+streamsize xostream::width(streamsize x) { return m_os->width(ForStandard(x)); }
 void xostream::Indent(ssize_t indent) {
   MIREL_ASSERT(0 <= indent);
   m_os->buffer.indent = indent;
