@@ -7,6 +7,8 @@
 
 #include <utils/Kernels.h>
 
+#include "../utils/src/KernelTable.h"
+
 namespace {
 
 /// Converted by whatever is chosen before main() begins.
@@ -28,6 +30,10 @@ TEST(Kernels, AreThoseOfTheProcessor) {
   std::printf("kernels: %s\n", mirel::KernelName());
   const char* const expected = std::getenv("MIREL_EXPECTED_KERNELS");
   EXPECT_STREQ(mirel::KernelName(), expected != nullptr ? expected : mirel::KernelName());
+#ifndef MIREL_SHARED // it hides the function
+  const auto* const best = mirel::detail::KernelsAt(0);
+  EXPECT_STREQ(mirel::KernelName(), best != nullptr ? best->name : "none");
+#endif
 #if defined(__AVX2__) && defined(MIREL_KERNELS)
   EXPECT_STREQ(mirel::KernelName(), "AVX2");
 #elif defined(__aarch64__) && defined(MIREL_KERNELS)

@@ -344,10 +344,23 @@ TEST(VectorOfByteTest, EditsAtAnyPlace) {
               !VectorOfByte().owns(nullptr));
 }
 
+TEST(VectorOfByteTest, AppendsAndCopies) {
+  const VectorOfByte tail{3, 4};
+  VectorOfByte b{1, 2};
+  b.reserve(9), b += tail, b.push_back(tail.begin(), tail.end());
+  EXPECT_EQ(b, (VectorOfByte{1, 2, 3, 4, 3, 4}));
+  EXPECT_EQ(VectorOfByte(b).capacity(), 6);
+  const auto* const data = b.data();
+  b = *&b;
+  EXPECT_EQ(b.data(), data);
+}
+
 TEST(VectorOfByteTest, ComparesBytes) {
   const VectorOfByte a{1, 2}, b{1, 200}, c;
   EXPECT_TRUE(a < b && a <= b && b > a && b >= a && a != b && !(a == b) && c < a && a >= a && a <= a);
   EXPECT_EQ(a.compare(0, 1, b, 0, 1), 0);
+  EXPECT_LT(a.compare(1, 1, b, 1, 1), 0);
+  EXPECT_EQ(a.compare(0, 1, b), -1);
   EXPECT_EQ(a.compare(1, 0, c), 0);
   EXPECT_EQ(a.compare(2, 0, nullptr, 0), 0);
   EXPECT_EQ(a.compare(0, 1, b.data(), 1), 0);

@@ -1,15 +1,17 @@
 #!/usr/bin/python3
 """Breaks the library in small ways, one at a time, and sees whether the suite notices.
 
-usage: mutants.py [NUMBER...]
+usage: mutants.py [--jobs N] [NUMBER...]
        mutants.py --check    builds nothing; ends with 1 if some mutant no longer fits the source
 
 The mutants stand in tools/mutants.txt, a file's name and below it pairs of lines: what stands in the source, once,
 and what is put in its place, with \\n for the end of a line. Each is built in a copy of the tree, one copy for each
-processor, with the address sanitizer, which notices what happens to go well on this machine. Ends with 1 if one
-survives. A mutant that makes a loop endless is noticed too, by the time that it takes.
+processor, with the address sanitizer, which notices what happens to go well on this machine; those of a file that is
+marked as Release are noticed by the tests of an ordinary build alone. Ends with 1 if one survives. A mutant that makes
+a loop endless is noticed too, by the time that it takes.
 """
 
+import argparse
 import os
 import pathlib
 import queue
@@ -24,20 +26,20 @@ OUT = ROOT / "build" / "mutants"
 
 
 def read_mutants():
-    """(file, what stands there, what is put there) of each."""
-    mutants, file, original = [], None, None
+    """(kind of build, file, what stands there, what is put there) of each."""
+    mutants, kind, file, original = [], None, None, None
     for line in (ROOT / "tools" / "mutants.txt").read_text().splitlines():
         line = line.replace("\\n", "\n")
         if line.startswith("- "):
             original = line[2:]
         elif line.startswith("+"):  # nothing may stand behind it
-            mutants.append((file, original, line[2:]))
+            mutants.append((kind, file, original, line[2:]))
         elif line and not line.startswith("#"):
-            file = line
+            file, _, kind = line.partition(", ")
     return mutants
 
 
-def is_stale(number, file, original, _):
+def is_stale(number, _kind, file, original, _replacement):
     """Whether a mutant can't be made, because the source was changed under it; says so."""
     path = ROOT / file
     found = path.read_text().count(original) if path.exists() else 0
@@ -46,20 +48,21 @@ def is_stale(number, file, original, _):
     return found != 1
 
 
-class Copy:
-    """A copy of the tree with a build of its own."""
+BUILDS = {"": ("-DCMAKE_BUILD_TYPE=None", "-DCMAKE_CXX_FLAGS=-O1 -fsanitize=address"),
+          "Release": ("-DCMAKE_BUILD_TYPE=Release",)}
 
-    def __init__(self, number):
-        self.tree, self.build = OUT / f"tree{number}", OUT / f"build{number}"
-        shutil.rmtree(self.tree, ignore_errors=True)
-        shutil.rmtree(self.build, ignore_errors=True)  # what an interrupted run has left may be broken
-        shutil.copytree(ROOT, self.tree, ignore=shutil.ignore_patterns("build", ".git"))
-        self.run("cmake", "-S", self.tree, "-B", self.build, "-G", "Ninja", "-DCMAKE_BUILD_TYPE=None",
-                 "-DCMAKE_CXX_FLAGS=-O1 -fsanitize=address", "-DMIREL_BUILD_EXAMPLES=OFF", "-DMIREL_BUILD_TESTS=ON").check_returncode()
-        self.test_seconds = None
+
+class Build:
+    """A build of the suite from a copy of the tree."""
+
+    def __init__(self, tree, build, kind):
+        self.build, self.test_seconds = build, None
+        shutil.rmtree(build, ignore_errors=True)  # what an interrupted run has left may be broken
+        self.run("cmake", "-S", tree, "-B", build, "-G", "Ninja", *BUILDS[kind], "-DMIREL_BUILD_EXAMPLES=OFF",
+                 "-DMIREL_BUILD_TESTS=ON").check_returncode()
         start = time.monotonic()
         if self.verdict() != "survived":
-            sys.exit("the suite fails as it is")
+            raise RuntimeError(f"the suite fails as it is, in {build}")
         self.test_seconds = time.monotonic() - start  # with the build, and so much more than the tests alone take
 
     def run(self, *command, timeout=None, **env):
@@ -80,24 +83,40 @@ class Copy:
         failed = [line.split()[3].rstrip(",") for line in ran.stdout.splitlines() if line.startswith("[  FAILED  ]")]
         return f"killed by {failed[0]}" if failed else f"killed, exit code {ran.returncode}"
 
-    def judge(self, file, original, replacement):
+
+class Copy:
+    """A copy of the tree, and the builds of it that have been needed."""
+
+    def __init__(self, number):
+        self.number, self.tree, self.builds = number, OUT / f"tree{number}", {}
+        shutil.rmtree(self.tree, ignore_errors=True)
+        shutil.copytree(ROOT, self.tree, ignore=shutil.ignore_patterns("build", ".git"))
+
+    def judge(self, kind, file, original, replacement):
+        if kind not in self.builds:
+            self.builds[kind] = Build(self.tree, OUT / f"build{self.number}{kind}", kind)
         path = self.tree / file
         source = path.read_text()
         path.write_text(source.replace(original, replacement))
         try:
-            return self.verdict()
+            return self.builds[kind].verdict()
         finally:
             path.write_text(source)
 
 
 def main():
+    parser = argparse.ArgumentParser()
+    parser.add_argument("--check", action="store_true")
+    parser.add_argument("--jobs", type=int, default=os.cpu_count() or 1)
+    parser.add_argument("numbers", type=int, nargs="*")
+    arguments = parser.parse_args()
     mutants = list(enumerate(read_mutants(), 1))
     if any([is_stale(number, *mutant) for number, mutant in mutants]):
         return 1
-    if sys.argv[1:] == ["--check"]:
+    if arguments.check:
         return 0
-    if len(sys.argv) > 1:
-        mutants = [mutant for mutant in mutants if str(mutant[0]) in sys.argv[1:]]
+    if arguments.numbers:
+        mutants = [mutant for mutant in mutants if mutant[0] in arguments.numbers]
     waiting = queue.Queue()
     for mutant in mutants:
         waiting.put(mutant)
@@ -110,9 +129,9 @@ def main():
             except queue.Empty:
                 return
             verdicts[number] = copy.judge(*mutant)
-            print(f"{number}: {mutant[0]}: {mutant[2].strip()}: {verdicts[number]}", flush=True)
+            print(f"{number}: {mutant[1]}: {mutant[3].strip()}: {verdicts[number]}", flush=True)
 
-    threads = [threading.Thread(target=work, args=[Copy(i)]) for i in range(os.cpu_count() or 1)]
+    threads = [threading.Thread(target=work, args=[Copy(i)]) for i in range(arguments.jobs)]
     for thread in threads:
         thread.start()
     for thread in threads:
