@@ -67,7 +67,7 @@ public:
     };
     const auto without = [&](T c) { return M(m.begin(), std::remove(m.begin(), m.end(), c)); };
     const auto times = [](ssize_t copies, T c) { return M(size_t(copies), c); };
-    switch (this->Number(37)) {
+    switch (this->Number(40)) {
       EDIT(0, v.push_back(x1), size, 0, {own1});
       EDIT(1, v.append(r), size, 0, text);
       EDIT(2, v.append(count, x), size, 0, times(count, x));
@@ -106,6 +106,9 @@ public:
       EDIT(35, v.replace(i, n, v.c_str() + ri), i, n, upToZero);
       EDIT(36, v.move(i, ri, k), i, k, own.substr(0, size_t(k)));
       EDIT(37, v.append(v.c_str() + ri, size - ri + 1), size, 0, M(m, size_t(ri)) + T(0));
+      EDIT(38, v.push_front(x1), 0, 0, {own1});
+      EDIT(39, size > 0 ? v.pop_front() : void(), 0, 1, {});
+      EDIT(40, size > 0 ? v.pop_back() : void(), size - (size > 0), 1, {});
     }
     SCOPED_TRACE(edit);
     ASSERT_EQ(Std(v), m) << "from " << testing::PrintToString(before) << " with i " << i << ", n " << n
