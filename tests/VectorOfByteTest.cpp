@@ -353,6 +353,9 @@ TEST(VectorOfByteTest, AppendsAndCopies) {
   const auto* const data = b.data();
   b = *&b;
   EXPECT_EQ(b.data(), data);
+  VectorOfByte full{1, 2};
+  const auto where = full.insert(full.begin() + 1, 7);
+  EXPECT_EQ(where, full.begin() + 1) << "after a growth, which moves";
 }
 
 TEST(VectorOfByteTest, ComparesBytes) {
