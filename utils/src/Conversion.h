@@ -24,11 +24,7 @@ Appended<CharIn> AppendUtf(const Kernels* kernels, basic_xstring<CharOut>& dst, 
 /// [p, end), or end.
 template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end);
 
-/// The lengths of a text, malformed text counted as U+FFFD.
-struct Lengths {
-  ssize_t codePoints;
-  ssize_t units; ///< in the other encoding
-};
+/// The lengths of [p, end), malformed text counted as U+FFFD, by the given kernels or without any.
 template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* end);
 
 /// What is wrong with the sequence at p, which Decode() finds to have the given length.
@@ -38,5 +34,15 @@ MalformedReason ReasonOf(const char16* p, const char16* end, const Sequence& seq
 /// How many units at the end of [begin, end) begin a sequence that units behind them may complete.
 ssize_t CutOffAtEnd(const char8* begin, const char8* end);
 ssize_t CutOffAtEnd(const char16* begin, const char16* end);
+
+/// The kernels for a width.
+inline const TextKernels<char8>& TextKernelsOf(const Kernels& kernels, const char8*) { return kernels.text8; }
+inline const TextKernels<char16>& TextKernelsOf(const Kernels& kernels, const char16*) {
+  return kernels.text16;
+}
+
+/// After malformed text, so many units must be well-formed before the kernels are tried again: where faults
+/// are dense, each trial would be in vain.
+constexpr ssize_t kWellFormedBeforeKernels = 64;
 
 } // namespace mirel::detail

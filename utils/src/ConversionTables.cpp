@@ -17,6 +17,36 @@ template <std::size_t kBytes, class F> constexpr Shuffles MakeShuffles(const F& 
   return shuffles;
 }
 
+/// Two bytes that may not follow each other: the ranges of the first and of the second, and the bit for them.
+struct PairFault {
+  int first, firstLast, second, secondLast, bit;
+};
+/// From table 3-7 of the Unicode Standard. The two ranges that share a bit have the second byte in common, or
+/// the first, so that no nibbles of the one go with those of the other.
+constexpr PairFault kFaults[] = {
+    {0xC0, 0xFF, 0x00, 0x7F, 0}, {0xC0, 0xFF, 0xC0, 0xFF, 0}, // a continuation byte is missing
+    {0x00, 0x7F, 0x80, 0xBF, 1},                              // one that continues nothing
+    {0xE0, 0xE0, 0x80, 0x9F, 2},                              // overlong
+    {0xED, 0xED, 0xA0, 0xBF, 3},                              // a surrogate
+    {0xC0, 0xC1, 0x80, 0xBF, 4},                              // overlong
+    {0xF0, 0xF0, 0x80, 0x8F, 5}, {0xF5, 0xFF, 0x80, 0x8F, 5}, // overlong, and above U+10FFFF
+    {0xF4, 0xFF, 0x90, 0xBF, 6},                              // above U+10FFFF
+    {0x80, 0xBF, 0x80, 0xBF, 7}};                             // two continuation bytes
+
+constexpr PairFaults MakePairFaults() {
+  PairFaults faults{};
+  for (const PairFault& fault : kFaults) {
+    const auto add = [&fault](uint8_t& bits) { bits = static_cast<uint8_t>(bits | 1 << fault.bit); };
+    for (int first = fault.first; first <= fault.firstLast; ++first) {
+      add(faults.firstHigh[first >> 4]);
+      add(faults.firstLow[first & 15]);
+    }
+    for (int second = fault.second; second <= fault.secondLast; ++second)
+      add(faults.secondHigh[second >> 4]);
+  }
+  return faults;
+}
+
 constexpr Repeats MakeRepeats() {
   Repeats repeats{};
   for (std::size_t x = 0; x < 256; ++x)
@@ -33,6 +63,7 @@ constexpr Shuffles kKeepTwoBytes =
 constexpr Shuffles kKeepThreeBytes = MakeShuffles<4>([](unsigned bits, std::size_t byte) {
   return byte == 0 || (byte == 2 && (bits & 0x10) != 0) || (byte == 3 && (bits & 1) != 0);
 });
+constexpr PairFaults kPairFaults = MakePairFaults();
 constexpr Repeats kRepeats = MakeRepeats();
 
 } // namespace mirel::detail

@@ -24,6 +24,25 @@ template <class CharOut, class CharIn> struct Progress {
   Stop stop;
 };
 
+/// The lengths of a text.
+struct Lengths {
+  ssize_t codePoints;
+  ssize_t units; ///< in the other encoding
+};
+
+/// How far a text was measured, and what that part comes to.
+template <class T> struct Measured {
+  const T* p;
+  Lengths lengths;
+};
+
+/// What looks at a text. Both go on up to a place, where a sequence begins, before which the text is
+/// well-formed, and which is the end or not far before malformed text.
+template <class T> struct TextKernels {
+  const T* (*skip)(const T* p, const T* end);
+  Measured<T> (*measure)(const T* p, const T* end);
+};
+
 /// What one instruction set offers. The conversions read nothing outside [p, end) and write nothing outside
 /// [out, outEnd), but may write more of it than they report.
 struct Kernels {
@@ -32,6 +51,8 @@ struct Kernels {
   Progress<char8, char16> (*utf8FromUtf16)(const char16* p, const char16* end, char8* out, char8* outEnd);
   /// As Utf16FromAscii(): end - p units at out.
   void (*utf16FromAscii)(const char8* p, const char8* end, char16* out);
+  TextKernels<char8> text8;
+  TextKernels<char16> text16;
   SearchKernels<char8> search8;
   SearchKernels<char16> search16;
 };
@@ -51,6 +72,14 @@ extern const Shuffles kKeepTwoBytes;
 /// For 4 positions of four bytes, the second of them unused: keeps the first byte of each, the last of those
 /// whose bit is set in the lower half of the mask, and the third of those whose bit is set in the upper half.
 extern const Shuffles kKeepThreeBytes;
+
+/// What can be wrong with two bytes that follow each other, a bit for each fault: those that the nibbles of
+/// the first and the high nibble of the second have in common. The highest bit stands for two continuation
+/// bytes, which are a fault where nothing asks for them.
+struct alignas(16) PairFaults {
+  uint8_t firstHigh[16], firstLow[16], secondHigh[16];
+};
+extern const PairFaults kPairFaults;
 
 /// Each byte, as often as the widest vector has bytes.
 struct alignas(64) Repeats {

@@ -24,6 +24,7 @@
 
 #include "ConversionKernels-inl.h"
 #include "SearchKernels-inl.h"
+#include "ValidationKernels-inl.h"
 
 namespace mirel::detail::HWY_NAMESPACE {
 namespace {
@@ -33,6 +34,8 @@ constexpr Kernels kKernels = {
     Utf16FromUtf8,
     Utf8FromUtf16,
     Utf16FromAscii,
+    {SkipUtf8, MeasureUtf8},
+    {SkipUtf16, MeasureUtf16},
     kSearchKernels<char8>,
     kSearchKernels<char16>,
 };

@@ -8,14 +8,35 @@ namespace mirel {
 
 namespace detail {
 
-template <class T> Lengths Measure(const Kernels*, const T* p, const T* end) {
+namespace {
+
+/// Adds the lengths of the sequences from p on, one by one: to the end, or, where there are kernels, until
+/// the text seems to be well-formed. @return where it stopped
+template <class T> const T* MeasureScalar(const T* p, const T* end, bool hasKernels, Lengths& lengths) {
   using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
-  Lengths lengths{0, 0};
-  while (p != end) {
+  for (const T* malformed = p; p != end && !(hasKernels && p - malformed >= kWellFormedBeforeKernels);) {
     const Sequence sequence = Decode(p, end);
     p += sequence.length;
     ++lengths.codePoints;
     lengths.units += EncodedLength<Other>(sequence.codePoint);
+    if (!sequence.isWellFormed)
+      malformed = p;
+  }
+  return p;
+}
+
+} // namespace
+
+template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* end) {
+  Lengths lengths{0, 0};
+  while (p != end) {
+    if (kernels != nullptr) {
+      const Measured<T> measured = TextKernelsOf(*kernels, p).measure(p, end);
+      lengths.codePoints += measured.lengths.codePoints;
+      lengths.units += measured.lengths.units;
+      p = measured.p;
+    }
+    p = MeasureScalar(p, end, kernels != nullptr, lengths);
   }
   return lengths;
 }

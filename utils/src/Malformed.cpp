@@ -57,7 +57,9 @@ ssize_t CutOffAtEnd(const char16* begin, const char16* end) {
   return begin != end && IsHighSurrogate(end[-1]) ? 1 : 0;
 }
 
-template <class T> const T* FindMalformed(const Kernels*, const T* p, const T* end) {
+template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end) {
+  if (kernels != nullptr)
+    p = TextKernelsOf(*kernels, p).skip(p, end);
   while (p != end) {
     const Sequence sequence = Decode(p, end);
     if (!sequence.isWellFormed)

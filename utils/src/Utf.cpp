@@ -84,10 +84,6 @@ Progress<CharOut, CharIn> Convert(const Kernels* k, const CharIn* p, const CharI
   return progress.stop == Stop::kMalformed ? ConvertScalar(progress.p, end, progress.out, outEnd) : progress;
 }
 
-/// After malformed text, so many units must be well-formed before the kernels are tried again: where faults
-/// are dense, each trial would be in vain.
-constexpr ssize_t kWellFormedBeforeKernels = 64;
-
 /// Converts one code point at a time from malformed text on, and replaces what is malformed, until the text
 /// seems to be well-formed.
 template <class CharOut, class CharIn>
