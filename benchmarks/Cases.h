@@ -110,3 +110,4 @@ template <class T> mirel::basic_xstring<T> OurOf(const StdString<T>& text) {
 void RegisterSearches();
 void RegisterEdits();
 void RegisterConversions();
+void RegisterTexts();

@@ -7,6 +7,7 @@ int main(int argc, char** argv) {
   RegisterSearches();
   RegisterEdits();
   RegisterConversions();
+  RegisterTexts();
   benchmark::AddCustomContext("kernels", mirel::KernelName());
 #ifdef HAVE_SIMDUTF
   for (const auto& [party, kernels] : Simdutf())
