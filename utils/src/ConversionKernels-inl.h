@@ -95,15 +95,22 @@ template <int n, class D> HWY_INLINE hn::Vec<D> Shifted(D d, hn::Vec<D> v) {
     return hn::CombineShiftRightBytes<n>(d, hn::ConcatUpperUpper(d, hn::Zero(d), v), v);
 }
 
+template <class Unit> HWY_INLINE const uint8_t* BytesOf(const Unit* p) {
+  return reinterpret_cast<const uint8_t*>(p);
+}
+template <class Unit> HWY_INLINE uint8_t* BytesOf(Unit* p) { return reinterpret_cast<uint8_t*>(p); }
+
 template <class Word> HWY_INLINE uint64_t LoadWord(const uint8_t* p) {
   Word word;
   std::memcpy(&word, p, sizeof(word));
   return word;
 }
 
-/// The n bytes at p, up to 16, and zeros behind them.
-HWY_INLINE hn::Vec<Narrow> LoadPart(const uint8_t* p, ssize_t n) {
+/// The n units at from, but no more than 16 bytes of them, and zeros behind them.
+template <class Unit> HWY_INLINE hn::Vec<Narrow> LoadPart(const Unit* from, ssize_t units) {
   const hn::Repartition<uint64_t, Narrow> d;
+  const uint8_t* const p = BytesOf(from);
+  const ssize_t bytes = units * ssize_t(sizeof(Unit)), n = bytes < 16 ? bytes : 16;
   uint64_t low = 0, high = 0;
   if (n >= 8) {
     low = LoadWord<uint64_t>(p);
@@ -115,24 +122,6 @@ HWY_INLINE hn::Vec<Narrow> LoadPart(const uint8_t* p, ssize_t n) {
     low = p[0] | uint64_t{p[n / 2]} << 8 * (n / 2) | uint64_t{p[n - 1]} << 8 * (n - 1);
   }
   return hn::BitCast(Narrow(), hn::InterleaveLower(hn::Set(d, low), hn::Set(d, high)));
-}
-
-/// Copies n bytes, up to a few vectors, without a call. Most of its loads lie within one earlier store: one
-/// that spans two waits for both.
-HWY_INLINE void CopyShort(const uint8_t* from, ssize_t n, uint8_t* out) {
-  const Narrow d;
-  ssize_t k = 0;
-  for (; k < n - 16; k += 16)
-    hn::StoreU(hn::LoadU(d, from + k), d, out + k);
-  if (n - k >= 8) {
-    std::memcpy(out + k, from + k, 8);
-    std::memcpy(out + n - 8, from + n - 8, 8);
-  } else if (k > 0) {
-    hn::StoreU(hn::LoadU(d, from + n - 16), d, out + n - 16);
-  } else {
-    for (; k < n; ++k)
-      out[k] = from[k];
-  }
 }
 
 /// Stores what the shuffle for a mask keeps of 16 bytes: kLeast of them, and kEach for each of the mask's
@@ -184,37 +173,40 @@ template <class Out, class In> struct Conversion {
   /// off.
   template <class Block> HWY_INLINE Stop Convert(const Block& block, ssize_t from, ssize_t to) {
     constexpr ssize_t kMostBytes = Block::kMost * ssize_t(sizeof(Out));
-    Converted n;
-    if (outEnd - out >= block.Room(from, to)) {
-      n = block.Convert(from, to, reinterpret_cast<uint8_t*>(out));
-    } else {
-      uint8_t copy[std::size_t(2 * kMostBytes)];
-      n = block.Convert(from, to, copy + kMostBytes);
-      if (n.out > outEnd - out)
-        return Stop::kNoRoom;
-      CopyShort(copy + kMostBytes, n.out * ssize_t(sizeof(Out)), reinterpret_cast<uint8_t*>(out));
-    }
+    // ASCII that ends with the block is all that is written.
+    const ssize_t room = to == Block::kUnits && block.IsAscii() ? to - from : Block::kMost;
+    if (outEnd - out >= room)
+      return Accept(block.Convert(from, to, BytesOf(out)));
+    uint8_t copy[std::size_t(2 * kMostBytes)];
+    const Converted n = block.Convert(from, to, copy + kMostBytes);
+    if (n.out > outEnd - out)
+      return Stop::kNoRoom;
+    std::memcpy(out, copy + kMostBytes, std::size_t(n.out) * sizeof(Out));
+    return Accept(n);
+  }
+
+  HWY_INLINE Stop Accept(const Converted& n) {
     p += n.in, out += n.out;
     return n.in == 0 ? Stop::kMalformed : Stop::kEnd;
   }
 
   /// Converts a text of at least one block.
   template <class Block> HWY_INLINE Stop ConvertAll() {
-    while (end - p >= Block::kUnits)
-      if (const Stop stop = Convert(Block::Load(p), 0, Block::kUnits); stop != Stop::kEnd)
-        return stop;
+    constexpr ssize_t kUnits = Block::kUnits;
     Stop stop = Stop::kEnd;
-    while (p != end && stop == Stop::kEnd) // a second time only for what the text's end cuts off
-      stop = Convert(Block::Load(end - Block::kUnits), Block::kUnits - (end - p), Block::kUnits);
+    while (stop == Stop::kEnd && end - p >= kUnits && outEnd - out >= Block::kMost)
+      stop = Accept(Block::Load(p).Convert(0, kUnits, BytesOf(out)));
+    while (stop == Stop::kEnd && p != end) { // near an end
+      const ssize_t from = end - p < kUnits ? kUnits - (end - p) : 0;
+      stop = Convert(Block::Load(p - from), from, kUnits);
+    }
     return stop;
   }
 
   /// Converts a text that is shorter than a block.
   template <class Block> HWY_INLINE Stop ConvertShort() {
-    if (p == end)
-      return Stop::kEnd;
     const ssize_t n = end - p;
-    const Stop stop = Convert(Block::Load(p, n), 0, n);
+    const Stop stop = n == 0 ? Stop::kEnd : Convert(Block::Load(p, n), 0, n);
     return stop == Stop::kEnd && p != end ? Stop::kMalformed : stop; // the end cuts a code point off
   }
 };
@@ -265,55 +257,35 @@ template <class D> HWY_INLINE void StoreWidened(D d, hn::Vec<D> bytes, uint8_t* 
 }
 
 /// A block of kVectors vectors of UTF-8.
-template <int kVectors, class D> struct Utf8InMemory {
-  using Tag = D;
-  static constexpr int kCount = kVectors;
+template <int kVectors, class D> struct Utf8Block {
   static constexpr ssize_t kUnits = kVectors * kLanes<D>;
-
+  static constexpr ssize_t kMost = kUnits;
   const uint8_t* p;
+  hn::Vec<D> last; ///< its last vector
+
+  static HWY_INLINE Utf8Block Load(const char8* p) {
+    return {BytesOf(p), hn::LoadU(D(), BytesOf(p) + kUnits - kLanes<D>)};
+  }
+  /// The n bytes at p, fewer than the one vector of the block has, and zeros behind them.
+  static HWY_INLINE Utf8Block Load(const char8* p, ssize_t n) { return {nullptr, LoadPart(p, n)}; }
+
   /// The vector that begins at the n-th byte of the k-th one; the bytes behind the block are zeros.
   template <int n> HWY_INLINE hn::Vec<D> Get(int k) const {
-    const uint8_t* const q = p + k * kLanes<D>;
-    return k + 1 < kVectors ? hn::LoadU(D(), q + n) : Shifted<n>(D(), hn::LoadU(D(), q));
+    return k + 1 < kVectors ? hn::LoadU(D(), p + k * kLanes<D> + n) : Shifted<n>(D(), last);
   }
-};
-
-/// A block of up to 16 bytes of UTF-8, which it has in a register.
-struct Utf8InRegister {
-  using Tag = Narrow;
-  static constexpr int kCount = 1;
-  static constexpr ssize_t kUnits = 16;
-
-  hn::Vec<Narrow> bytes;
-  template <int n> HWY_INLINE hn::Vec<Narrow> Get(int) const { return Shifted<n>(Narrow(), bytes); }
-};
-
-template <class Bytes> struct Utf8Block : Bytes {
-  using D = typename Bytes::Tag;
-  static constexpr ssize_t kMost = Bytes::kUnits;
-
-  // Not constructors: g++ compiles inherited ones for the processor that the library is built for.
-  static HWY_INLINE Utf8Block Load(const char8* p) { return {{reinterpret_cast<const uint8_t*>(p)}}; }
-  static HWY_INLINE Utf8Block Load(const char8* p, ssize_t n) {
-    return {{LoadPart(reinterpret_cast<const uint8_t*>(p), n)}};
-  }
-
-  HWY_INLINE bool IsAscii() const {
-    auto any = this->template Get<0>(0);
-    for (int k = 1; k < Bytes::kCount; ++k)
-      any = hn::Or(any, this->template Get<0>(k));
-    return HighBits(D(), any) == 0;
-  }
-  /// The room that Convert() needs. For ASCII it is exact.
-  HWY_INLINE ssize_t Room(ssize_t from, ssize_t to) const {
-    return to == Bytes::kUnits && IsAscii() ? to - from : kMost;
+  /// A bit for each position, of the masks that f gives for the vectors and those one byte further on.
+  template <class F> HWY_INLINE uint64_t Bits(const F& f) const {
+    uint64_t bits = 0;
+    for (int k = 0; k < kVectors; ++k)
+      bits |= BitsOf(D(), f(Get<0>(k), Get<1>(k))) << k * kLanes<D>;
+    return bits;
   }
 
   /// The n-th highest bit of each byte, n counted from 0.
   template <int n> HWY_INLINE uint64_t BitsAt() const {
     uint64_t bits = 0;
-    for (int k = 0; k < Bytes::kCount; ++k) {
-      auto v = this->template Get<0>(k);
+    for (int k = 0; k < kVectors; ++k) {
+      auto v = Get<0>(k);
       for (int shifts = 0; shifts < n; ++shifts)
         v = hn::Add(v, v);
       bits |= HighBits(D(), v) << k * kLanes<D>;
@@ -321,39 +293,29 @@ template <class Bytes> struct Utf8Block : Bytes {
     return bits;
   }
 
-  /// The positions of continuation bytes, and of C0 and C1, which are never well-formed.
-  HWY_INLINE uint64_t From80BelowC2() const {
-    uint64_t bits = 0;
-    for (int k = 0; k < Bytes::kCount; ++k)
-      bits |= BitsOf(D(), IsFrom80Below(D(), this->template Get<0>(k), 0xC2)) << k * kLanes<D>;
-    return bits;
-  }
+  HWY_INLINE bool IsAscii() const { return BitsAt<0>() == 0; }
 
   /// The positions of lead bytes that may not stand before the byte behind them: the sequence would be
   /// overlong, a surrogate, or beyond U+10FFFF.
   template <bool kHasFourBytes> HWY_INLINE uint64_t BadLeads() const {
-    const D d;
-    uint64_t bits = 0;
-    for (int k = 0; k < Bytes::kCount; ++k) {
-      const auto lead = this->template Get<0>(k), next = this->template Get<1>(k);
+    return Bits([](auto lead, auto next) HWY_ATTR {
+      const D d;
       // 80 to 9F may not follow E0, and nothing else may follow ED; xor with 0D turns one into the other.
       const auto swap = hn::IfThenElseZero(IsFrom80Below(d, next, 0xA0), Repeat(d, 0x0D));
-      auto bad = IsEqual(d, hn::Xor(lead, swap), 0xED);
-      if constexpr (kHasFourBytes) {
-        // 80 to 8F may not follow F0, and nothing else may follow F4; xor with 04 turns one into the other.
-        const auto swap4 = hn::IfThenElseZero(IsFrom80Below(d, next, 0x90), Repeat(d, 0x04));
-        bad = hn::Or(bad, hn::Or(IsEqual(d, hn::Xor(lead, swap4), 0xF4), IsAtLeast(d, lead, 0xF5)));
-      }
-      bits |= BitsOf(d, bad) << k * kLanes<D>;
-    }
-    return bits;
+      const auto bad = IsEqual(d, hn::Xor(lead, swap), 0xED);
+      if (!kHasFourBytes)
+        return bad;
+      // 80 to 8F may not follow F0, and nothing else may follow F4; xor with 04 turns one into the other.
+      const auto swap4 = hn::IfThenElseZero(IsFrom80Below(d, next, 0x90), Repeat(d, 0x04));
+      return hn::Or(bad, hn::Or(IsEqual(d, hn::Xor(lead, swap4), 0xF4), IsAtLeast(d, lead, 0xF5)));
+    });
   }
 
   /// Stores the units of the positions whose bits are set; their number.
   template <int kMaxBytes> HWY_INLINE ssize_t Store(uint64_t keep, uint8_t* const out) const {
     uint8_t* end = out;
-    for (int k = 0; k < Bytes::kCount; ++k) {
-      const auto a = this->template Get<0>(k), b = this->template Get<1>(k), c = this->template Get<2>(k);
+    for (int k = 0; k < kVectors; ++k) {
+      const auto a = Get<0>(k), b = Get<1>(k), c = Get<2>(k);
       const auto units = UnitsOf<kMaxBytes>(D(), a, b, c);
       end = StorePairs<0, 2>(D(), units.low, units.high, kKeepUnits, keep, end);
       keep = keep >> (kLanes<D> - 1) >> 1;
@@ -368,7 +330,7 @@ template <class Bytes> struct Utf8Block : Bytes {
     alignas(16) static constexpr uint8_t kLast[16] = {2, 1, 5, 4, 8, 7, 11, 10, 14, 13};
     alignas(16) static constexpr uint8_t kFirst[16] = {0, 0, 3, 3, 6, 6, 9, 9, 12, 12};
     for (int k = 0; k < 4; ++k) {
-      const auto bytes = hn::LoadU(d, this->p + 15 * k);
+      const auto bytes = hn::LoadU(d, p + 15 * k);
       const auto last = hn::BitCast(du, hn::TableLookupBytes(bytes, hn::Load(d, kLast)));
       const auto first = hn::BitCast(du, hn::TableLookupBytes(bytes, hn::Load(d, kFirst)));
       const auto low =
@@ -380,33 +342,33 @@ template <class Bytes> struct Utf8Block : Bytes {
 
   HWY_INLINE Converted Convert(ssize_t from, ssize_t to, uint8_t* out) const {
     if (IsAscii()) {
-      for (int k = 0; k < Bytes::kCount; ++k)
-        StoreWidened(D(), this->template Get<0>(k), out - 2 * from + 2 * k * kLanes<D>);
+      for (int k = 0; k < kVectors; ++k)
+        StoreWidened(D(), Get<0>(k), out - 2 * from + 2 * k * kLanes<D>);
       return {to - from, to - from};
     }
-    constexpr uint64_t kLast = uint64_t{1} << (Bytes::kUnits - 1);
-    // The positions to check, up to and including the lead byte of a sequence that is cut off: that byte too
-    // may stand where a continuation byte is missing.
-    const auto upTo = [from](uint64_t cutOff) { return (cutOff ^ (cutOff - 1)) & ~FirstBits(from); };
-    const uint64_t continuations = From80BelowC2(), bad = continuations & BitsAt<1>();
+    constexpr uint64_t kLast = uint64_t{1} << (kUnits - 1);
+    const uint64_t continuations = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC2); });
+    const uint64_t bad = continuations & BitsAt<1>(); // C0 and C1, which are never well-formed
     const uint64_t leads = BitsAt<0>() & ~continuations, leads3 = leads & BitsAt<2>();
+    // The positions to convert, of which there are none if the block isn't well-formed. A lead byte that is
+    // cut off is checked as well: it may stand where a continuation byte is missing.
+    const auto wellFormed = [=](uint64_t cutOff, uint64_t behindLeads) {
+      const uint64_t checked = (cutOff ^ (cutOff - 1)) & ~FirstBits(from);
+      const bool isBad = ((bad | (continuations ^ behindLeads)) & checked) != 0;
+      return isBad ? 0 : checked & ~cutOff & FirstBits(to);
+    };
     if (leads3 == 0) {
-      const uint64_t cutOff = leads & kLast, checked = upTo(cutOff),
-                     positions = checked & ~cutOff & FirstBits(to);
-      if (((bad | (leads << 1 ^ continuations)) & checked) != 0)
-        return {0, 0};
-      return {Count(positions), Store<2>(positions & ~continuations, out)};
+      const uint64_t positions = wellFormed(leads & kLast, leads << 1);
+      return {Count(positions), positions == 0 ? 0 : Store<2>(positions & ~continuations, out)};
     }
     const uint64_t leads4 = leads3 & BitsAt<3>();
-    const uint64_t cutOff = (leads & kLast) | (leads3 & kLast >> 1) | (leads4 & kLast >> 2);
-    const uint64_t checked = upTo(cutOff), positions = checked & ~cutOff & FirstBits(to);
-    const uint64_t misplaced = continuations ^ (leads << 1 | leads3 << 2 | leads4 << 3);
-    if (((bad | misplaced) & checked) != 0 ||
-        ((leads4 == 0 ? BadLeads<false>() : BadLeads<true>()) & positions) != 0)
+    const uint64_t positions = wellFormed((leads & kLast) | (leads3 & kLast >> 1) | (leads4 & kLast >> 2),
+                                          leads << 1 | leads3 << 2 | leads4 << 3);
+    if (positions == 0 || ((leads4 == 0 ? BadLeads<false>() : BadLeads<true>()) & positions) != 0)
       return {0, 0};
     if (leads4 != 0)
       return {Count(positions), Store<4>(positions & (~continuations | leads4 << 1), out)};
-    if constexpr (Bytes::kUnits == 64)
+    if constexpr (kUnits == 64)
       if ((continuations & FirstBits(60)) == 0xDB6DB6DB6DB6DB6 && from == 0)
         return ConvertThreeByteSequences(out);
     return {Count(positions), Store<3>(positions & ~continuations, out)};
@@ -416,12 +378,12 @@ template <class Bytes> struct Utf8Block : Bytes {
 Progress<char16, char8> Utf16FromUtf8(const char8* p, const char8* end, char16* out, char16* outEnd) {
   Conversion<char16, char8> text{p, end, out, outEnd};
   if (end - p >= 64)
-    return text.At(text.ConvertAll<Utf8Block<Utf8InMemory<64 / kLanes<Wide>, Wide>>>());
+    return text.At(text.ConvertAll<Utf8Block<64 / kLanes<Wide>, Wide>>());
   if (end - p >= 32)
-    return text.At(text.ConvertAll<Utf8Block<Utf8InMemory<32 / kLanes<Wide>, Wide>>>());
+    return text.At(text.ConvertAll<Utf8Block<32 / kLanes<Wide>, Wide>>());
   if (end - p >= 16)
-    return text.At(text.ConvertAll<Utf8Block<Utf8InMemory<1, Narrow>>>());
-  return text.At(text.ConvertShort<Utf8Block<Utf8InRegister>>());
+    return text.At(text.ConvertAll<Utf8Block<1, Narrow>>());
+  return text.At(text.ConvertShort<Utf8Block<1, Narrow>>());
 }
 
 // UTF-16 to UTF-8 ----------
@@ -443,26 +405,20 @@ template <class Tag> struct Utf16Block {
   static constexpr D d{};
   hn::Vec<D> low, high; ///< the bytes of the units
 
-  static HWY_INLINE Utf16Block Load(const char16* p) { return Of(LoadHalf(p), LoadHalf(p + kUnits / 2)); }
-  /// Of n units; the others are zeros.
+  static HWY_INLINE Utf16Block Load(const char16* p) {
+    return Of(hn::LoadU(d, BytesOf(p)), hn::LoadU(d, BytesOf(p) + kUnits));
+  }
+  /// The n units at p, fewer than the block has, and zeros behind them.
   static HWY_INLINE Utf16Block Load(const char16* p, ssize_t n) {
-    return Of(LoadHalf(p, 0, n), LoadHalf(p, 8, n));
+    return Of(LoadPart(p, n), n > 8 ? LoadPart(p + 8, n - 8) : hn::Zero(d));
   }
   static HWY_INLINE Utf16Block Of(hn::Vec<D> first, hn::Vec<D> second) {
     return {hn::ConcatEven(d, second, first), hn::ConcatOdd(d, second, first)};
   }
-  static HWY_INLINE hn::Vec<D> LoadHalf(const char16* p) {
-    return hn::LoadU(d, reinterpret_cast<const uint8_t*>(p));
-  }
-  static HWY_INLINE hn::Vec<D> LoadHalf(const char16* p, ssize_t i, ssize_t n) {
-    return n <= i ? hn::Zero(d)
-                  : LoadPart(reinterpret_cast<const uint8_t*>(p + i), n - i < 8 ? 2 * (n - i) : 16);
-  }
-
-  HWY_INLINE ssize_t Room(ssize_t, ssize_t) const { return kMost; }
 
   /// Bytes from 80 on where the unit isn't ASCII, and where it takes three bytes.
   HWY_INLINE hn::Vec<D> NonAscii() const { return hn::Or(hn::SaturatedAdd(high, Repeat(d, 0x7F)), low); }
+  HWY_INLINE bool IsAscii() const { return HighBits(d, NonAscii()) == 0; }
   HWY_INLINE hn::Vec<D> ThreeBytes() const { return hn::SaturatedAdd(high, Repeat(d, 0x78)); }
   /// The units whose high byte is kind in the bits of mask.
   HWY_INLINE hn::Mask<D> Is(uint8_t kind, uint8_t mask) const {
@@ -528,12 +484,11 @@ template <class Tag> struct Utf16Block {
 
   HWY_INLINE Converted Convert(ssize_t from, ssize_t to, uint8_t* out) const {
     const ssize_t n = to - from, behind = kUnits - to;
-    UnitMasks masks = {HighBits(d, NonAscii()), 0};
-    if (masks.two == 0) {
+    if (IsAscii()) {
       hn::StoreU(low, d, out - from);
       return {n, n};
     }
-    masks.three = HighBits(d, ThreeBytes());
+    UnitMasks masks = {HighBits(d, NonAscii()), HighBits(d, ThreeBytes())};
     if (masks.three == 0)
       return {n, StoreTwo(masks.two, out - masks.Bytes(from)) - out - behind};
     if (BitsOf(d, Is(0xD8, 0xF8)) == 0)
@@ -558,23 +513,17 @@ Progress<char8, char16> Utf8FromUtf16(const char16* p, const char16* end, char8*
 
 // ASCII to UTF-16 ----------
 
-/// The bytes, with ? in the place of those that aren't ASCII.
-template <class D> HWY_INLINE hn::Vec<D> AsAscii(D d, hn::Vec<D> bytes) {
-  return Select(IsNonAscii(d, bytes), Repeat(d, '?'), bytes);
+/// Goes on from the i-th of n bytes by whole vectors; where it ends.
+template <class D> HWY_INLINE ssize_t WidenAscii(D d, const char8* src, ssize_t i, ssize_t n, char16* dst) {
+  for (; n - i >= kLanes<D>; i += kLanes<D>) {
+    const auto bytes = hn::LoadU(d, BytesOf(src + i));
+    StoreWidened(d, Select(IsNonAscii(d, bytes), Repeat(d, '?'), bytes), BytesOf(dst + i));
+  }
+  return i;
 }
 
-void Utf16FromAscii(const char8* src, const char8* end, char16* dst) {
-  const uint8_t* p = reinterpret_cast<const uint8_t*>(src);
-  uint8_t* out = reinterpret_cast<uint8_t*>(dst);
-  ssize_t rest = end - src;
-  for (; rest >= kLanes<Wide>; rest -= kLanes<Wide>, p += kLanes<Wide>, out += 2 * kLanes<Wide>)
-    StoreWidened(Wide(), AsAscii(Wide(), hn::LoadU(Wide(), p)), out);
-  for (ssize_t n; rest > 0; rest -= n, p += n, out += 2 * n) {
-    n = rest < 16 ? rest : 16;
-    uint8_t units[32];
-    StoreWidened(Narrow(), AsAscii(Narrow(), LoadPart(p, n)), units);
-    CopyShort(units, 2 * n, out);
-  }
+ssize_t Utf16FromAscii(const char8* src, ssize_t n, char16* dst) {
+  return WidenAscii(Narrow(), src, WidenAscii(Wide(), src, 0, n, dst), n, dst);
 }
 
 } // namespace

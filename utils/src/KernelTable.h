@@ -49,8 +49,8 @@ struct Kernels {
   const char* name;
   Progress<char16, char8> (*utf16FromUtf8)(const char8* p, const char8* end, char16* out, char16* outEnd);
   Progress<char8, char16> (*utf8FromUtf16)(const char16* p, const char16* end, char8* out, char8* outEnd);
-  /// As Utf16FromAscii(): end - p units at out.
-  void (*utf16FromAscii)(const char8* p, const char8* end, char16* out);
+  /// As Utf16FromAscii(), for the first of n units; how many they are. It leaves less than a vector.
+  ssize_t (*utf16FromAscii)(const char8* src, ssize_t n, char16* out);
   TextKernels<char8> text8;
   TextKernels<char16> text16;
   SearchKernels<char8> search8;

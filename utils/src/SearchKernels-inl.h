@@ -6,8 +6,6 @@
 //
 // There is no include guard: the file is included once for each instruction set.
 
-#include <cstring>
-
 #include <hwy/highway.h>
 
 #include <utils/TwoWay.h>
@@ -23,7 +21,6 @@ namespace hn = hwy::HWY_NAMESPACE;
 template <class T> using Lane = std::make_unsigned_t<T>;
 template <class T> using FullTag = hn::ScalableTag<Lane<T>>;
 template <class T, std::size_t kBytes> using TagOf = hn::FixedTag<Lane<T>, kBytes / sizeof(T)>;
-template <class T> constexpr ssize_t kUnitsIn8Bytes = 8 / ssize_t(sizeof(T));
 
 template <class D, class T> HWY_INLINE hn::Vec<D> LoadUnits(D d, const T* p) {
   return hn::LoadU(d, reinterpret_cast<const hn::TFromD<D>*>(p));
@@ -125,9 +122,9 @@ template <bool kReverse, class T, class Is> HWY_INLINE const T* Scan(const T* x1
   if (length >= n)
     return length <= 2 * n ? ScanEnds<kReverse>(FullTag<T>(), x1, x2, is)
                            : ScanVectors<kReverse>(FullTag<T>(), x1, x2, is);
-  if (length >= 2 * kUnitsIn8Bytes<T>)
+  if (length >= 16 / ssize_t(sizeof(T)))
     return ScanEnds<kReverse>(TagOf<T, 16>(), x1, x2, is);
-  if (length >= kUnitsIn8Bytes<T>)
+  if (length >= 8 / ssize_t(sizeof(T)))
     return ScanEnds<kReverse>(TagOf<T, 8>(), x1, x2, is);
   return ScanUnits<kReverse>(x1, x2, is);
 }
@@ -212,7 +209,7 @@ const T* FindSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
   return q == end ? x2 : q;
 }
 
-// Sets: Lanes() tells the lanes of a vector that may be members. Where isExact, they are.
+// Sets: Lanes() tells the lanes of a vector that are members.
 
 /// A set as it is given.
 template <class T> struct Members {
@@ -241,15 +238,10 @@ template <class D> HWY_INLINE hn::Vec<D> HighNibbles(D d, hn::Vec<D> v) {
 /// A set of bytes: for each low nibble the bits of the high nibbles with which it is a member, those below 8
 /// in one table and the others in another.
 struct ByteTable {
-  static constexpr bool kIsCheap = true, isExact = true;
+  static constexpr bool kIsCheap = true, isExact = true; ///< a table is that of the set only where isExact
   alignas(16) uint8_t low[16], high[16];
 
-  ByteTable(const char8* y1, const char8* y2) : low(), high() {
-    if (y2 - y1 <= 16) { // more take twice as long bit by bit as what follows
-      for (; y1 != y2; ++y1)
-        (UnitValue(*y1) < 0x80 ? low : high)[*y1 & 0xF] |= kNibbleBits[UnitValue(*y1) >> 4];
-      return;
-    }
+  ByteTable(const char8* y1, const char8* y2) {
     alignas(16) uint8_t isMember[256] = {}; // all bits where it is
     for (; y1 != y2; ++y1)
       isMember[UnitValue(*y1)] = 0xFF;
@@ -305,18 +297,13 @@ struct RowTables {
   }
 };
 
-/// Whether a unit may be in a set or, if !kIsMember, isn't.
+/// Whether a unit is in a set or, if !kIsMember, isn't.
 template <bool kIsMember, class T, class Set> struct Membership {
   static constexpr bool kIsCheap = Set::kIsCheap;
   const T *y1, *y2;
   const Set& set;
 
-  HWY_INLINE bool At(const T* p) const {
-    if constexpr (sizeof(T) == 1) // the C library's is faster
-      return (y1 != y2 && std::memchr(y1, *p, std::size_t(y2 - y1)) != nullptr) == kIsMember;
-    else
-      return (FindUnit<false>(y1, y2, *p) != y2) == kIsMember;
-  }
+  HWY_INLINE bool At(const T* p) const { return (FindUnit<false>(y1, y2, *p) != y2) == kIsMember; }
   template <class D> HWY_INLINE hn::Mask<D> Lanes(D d, const T* p) const {
     const auto isIn = set.Lanes(d, LoadUnits(d, p));
     return kIsMember ? isIn : hn::Not(isIn);
@@ -326,24 +313,12 @@ template <bool kIsMember, class T, class Set> struct Membership {
 template <bool kReverse, bool kIsMember, class T>
 const T* FindInSetByTable(const T* x1, const T* x2, const T* y1, const T* y2) {
   const std::conditional_t<sizeof(T) == 1, ByteTable, RowTables> table(y1, y2);
-  const Membership<kIsMember, T, decltype(table)> is = {y1, y2, table};
-  const T* p = x1;
-  const T* end = x2;
-  // Where the table isn't exact, hits may be false: it pays as long as few are. It takes 16 bytes at a time.
-  for (int64 credit = kIsMember || table.isExact ? 512 + 8 * int64(y2 - y1) : 0;
-       credit > 0 && end - p >= 2 * kUnitsIn8Bytes<T>;) {
-    const T* const hit = Scan<kReverse>(p, end, is);
-    if (hit == nullptr)
-      return x2;
-    if (table.isExact || is.At(hit))
-      return hit;
-    credit += PassHit<kReverse>(p, end, hit) - 64 - (y2 - y1);
-  }
+  if (table.isExact)
+    return HitOrEnd(Scan<kReverse>(x1, x2, Membership<kIsMember, T, decltype(table)>{y1, y2, table}), x2);
   const auto& scalar = ScalarSearches<T>();
   const auto search = kReverse ? (kIsMember ? scalar.findLastOf : scalar.findLastNotOf)
                                : (kIsMember ? scalar.findFirstOf : scalar.findFirstNotOf);
-  const T* const q = search(p, end, y1, y2);
-  return q == end ? x2 : q;
+  return search(x1, x2, y1, y2);
 }
 
 /// Most hits are near, and many texts short: a table is made only after units that are no hits.

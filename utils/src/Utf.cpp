@@ -32,11 +32,10 @@ void Utf16FromAscii(string16& dst, const char8* src, ssize_t srcLen) {
   MIREL_ASSERT_AS(srcLen >= 0, "newSize >= 0");
   if (srcLen > 0)
     ReserveTerminated(dst, srcLen);
-  if (const detail::Kernels* const kernels = detail::BestKernels())
-    kernels->utf16FromAscii(src, src + srcLen, dst.data());
-  else
-    for (ssize_t i = 0; i < srcLen; ++i)
-      dst.data()[i] = detail::UnitValue(src[i]) < 0x80 ? detail::UnitValue(src[i]) : '?';
+  char16* const out = dst.data();
+  const detail::Kernels* const kernels = detail::BestKernels();
+  for (ssize_t i = kernels != nullptr ? kernels->utf16FromAscii(src, srcLen, out) : 0; i < srcLen; ++i)
+    out[i] = detail::UnitValue(src[i]) < 0x80 ? detail::UnitValue(src[i]) : '?';
   detail::Storage::SetSize(dst, srcLen);
 }
 
