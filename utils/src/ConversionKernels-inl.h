@@ -261,7 +261,7 @@ template <int kVectors, class D> struct Utf8Block {
   static constexpr ssize_t kUnits = kVectors * kLanes<D>;
   static constexpr ssize_t kMost = kUnits;
   const uint8_t* p;
-  hn::Vec<D> last; ///< its last vector
+  hn::Vec<D> lastVector;
 
   static HWY_INLINE Utf8Block Load(const char8* p) {
     return {BytesOf(p), hn::LoadU(D(), BytesOf(p) + kUnits - kLanes<D>)};
@@ -271,7 +271,7 @@ template <int kVectors, class D> struct Utf8Block {
 
   /// The vector that begins at the n-th byte of the k-th one; the bytes behind the block are zeros.
   template <int n> HWY_INLINE hn::Vec<D> Get(int k) const {
-    return k + 1 < kVectors ? hn::LoadU(D(), p + k * kLanes<D> + n) : Shifted<n>(D(), last);
+    return k + 1 < kVectors ? hn::LoadU(D(), p + k * kLanes<D> + n) : Shifted<n>(D(), lastVector);
   }
   /// A bit for each position, of the masks that f gives for the vectors and those one byte further on.
   template <class F> HWY_INLINE uint64_t Bits(const F& f) const {
