@@ -311,6 +311,14 @@ template <int kVectors, class D> struct Utf8Block {
     });
   }
 
+  /// How many bytes the block's end cuts off from their sequence. Where the next block begins is known by
+  /// these bytes alone, long before the masks are.
+  HWY_INLINE ssize_t CutOff() const {
+    const uint32_t isLead = uint32_t{p[kUnits - 1] >= 0xC0} | uint32_t{p[kUnits - 2] >= 0xE0} << 1 |
+                            uint32_t{p[kUnits - 3] >= 0xF0} << 2;
+    return static_cast<ssize_t>((hwy::Num0BitsBelowLS1Bit_Nonzero32(isLead | 8) + 1) % 4);
+  }
+
   /// Stores the units of the positions whose bits are set; their number.
   template <int kMaxBytes> HWY_INLINE ssize_t Store(uint64_t keep, uint8_t* const out) const {
     uint8_t* end = out;
@@ -346,32 +354,28 @@ template <int kVectors, class D> struct Utf8Block {
         StoreWidened(D(), Get<0>(k), out - 2 * from + 2 * k * kLanes<D>);
       return {to - from, to - from};
     }
-    constexpr uint64_t kLast = uint64_t{1} << (kUnits - 1);
+    const ssize_t stop = to == kUnits ? kUnits - CutOff() : to;
+    // A lead byte that is cut off is checked as well: it may stand where a continuation byte is missing.
+    const uint64_t checked = FirstBits(stop + 1) & ~FirstBits(from), positions = checked & FirstBits(stop);
     const uint64_t continuations = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC2); });
     const uint64_t bad = continuations & BitsAt<1>(); // C0 and C1, which are never well-formed
     const uint64_t leads = BitsAt<0>() & ~continuations, leads3 = leads & BitsAt<2>();
-    // The positions to convert, of which there are none if the block isn't well-formed. A lead byte that is
-    // cut off is checked as well: it may stand where a continuation byte is missing.
-    const auto wellFormed = [=](uint64_t cutOff, uint64_t behindLeads) {
-      const uint64_t checked = (cutOff ^ (cutOff - 1)) & ~FirstBits(from);
-      const bool isBad = ((bad | (continuations ^ behindLeads)) & checked) != 0;
-      return isBad ? 0 : checked & ~cutOff & FirstBits(to);
-    };
     if (leads3 == 0) {
-      const uint64_t positions = wellFormed(leads & kLast, leads << 1);
-      return {Count(positions), positions == 0 ? 0 : Store<2>(positions & ~continuations, out)};
+      if (((bad | (continuations ^ leads << 1)) & checked) != 0)
+        return {0, 0};
+      return {stop - from, Store<2>(positions & ~continuations, out)};
     }
     const uint64_t leads4 = leads3 & BitsAt<3>();
-    const uint64_t positions = wellFormed((leads & kLast) | (leads3 & kLast >> 1) | (leads4 & kLast >> 2),
-                                          leads << 1 | leads3 << 2 | leads4 << 3);
-    if (positions == 0 || ((leads4 == 0 ? BadLeads<false>() : BadLeads<true>()) & positions) != 0)
+    const uint64_t misplaced = continuations ^ (leads << 1 | leads3 << 2 | leads4 << 3);
+    if (((bad | misplaced) & checked) != 0 ||
+        ((leads4 == 0 ? BadLeads<false>() : BadLeads<true>()) & positions) != 0)
       return {0, 0};
     if (leads4 != 0)
-      return {Count(positions), Store<4>(positions & (~continuations | leads4 << 1), out)};
+      return {stop - from, Store<4>(positions & (~continuations | leads4 << 1), out)};
     if constexpr (kUnits == 64)
       if ((continuations & FirstBits(60)) == 0xDB6DB6DB6DB6DB6 && from == 0)
         return ConvertThreeByteSequences(out);
-    return {Count(positions), Store<3>(positions & ~continuations, out)};
+    return {stop - from, Store<3>(positions & ~continuations, out)};
   }
 };
 
