@@ -130,6 +130,7 @@ template <class T> void CheckText(const Text<T>& text) {
   const std::vector<T> exact(text.begin(), text.end()); // whose end a sanitizer sees
   const View<T> source(exact.data(), exact.size());
   const Expected<T> expected(source);
+  ASSERT_NO_FATAL_FAILURE(Check<Other<T>>(source));
   ASSERT_NO_FATAL_FAILURE(CheckKernels(source, expected));
   ASSERT_NO_FATAL_FAILURE(CheckCalls(source, expected));
   ASSERT_NO_FATAL_FAILURE(CheckCodePoints(source, expected));
@@ -145,7 +146,8 @@ const Text<char16> kPieces16[] = {{'a'},    {0xE9},   {0x20AC}, {0xD83D, 0xDE00}
 const auto& Pieces(char8) { return kPieces8; }
 const auto& Pieces(char16) { return kPieces16; }
 
-/// A mixture of pieces, of which kinds chooses some, with the malformed ones rarer or denser.
+/// A mixture of pieces, of which kinds chooses some, with the malformed ones rarer or denser, and of other
+/// code points with as many bytes of UTF-8.
 template <class T, class Random> Text<T> Mixture(Random& random, std::size_t size) {
   const auto& pieces = Pieces(T());
   const auto kinds = random(), rarity = 1 + random() % 60;
@@ -153,7 +155,14 @@ template <class T, class Random> Text<T> Mixture(Random& random, std::size_t siz
   Text<T> text;
   while (text.size() < size) {
     const std::size_t kind = random() % (random() % rarity == 0 ? std::size(pieces) : kWellFormed);
-    if (kind >= kWellFormed || (kinds >> kind & 1) != 0 || kinds % 8 == 0)
+    static constexpr char32_t kLimits[] = {0, 0x80, 0x800, 0x10000, 0x110000};
+    const auto length = kind % 4;
+    const char32_t c = kLimits[length] + char32_t(random()) % (kLimits[length + 1] - kLimits[length]);
+    if (kind < kWellFormed && (kinds >> kind & 1) == 0 && kinds % 8 != 0)
+      continue;
+    if (kind < 4 && random() % 2 == 0 && !IsLead(c) && !IsTrail(c))
+      Put(text, c);
+    else
       text += pieces[kind];
   }
   return text;

@@ -3,7 +3,6 @@
 #include "Oracle.h"
 
 #include <algorithm>
-#include <random>
 #include <vector>
 
 namespace {
@@ -92,32 +91,6 @@ TEST(Utf, CutOffAtEveryPlace) {
   for (std::size_t from = 0; from <= units.size(); ++from)
     for (std::size_t size = 0; size <= units.size() - from; ++size)
       ASSERT_NO_FATAL_FAILURE(CheckExactly(View<char16>(units).substr(from, size)));
-}
-
-TEST(Utf, RandomMixtures) {
-  std::mt19937 random(5);
-  for (int round = 0; round < 4000; ++round) {
-    Text<char8> text;
-    Text<char16> units;
-    const std::size_t size = random() % 400;
-    const auto kinds = 1 + random() % 15; // which lengths of sequences there are
-    while (text.size() < size) {
-      static constexpr char32_t kLimits[] = {0, 0x80, 0x800, 0x10000, 0x110000};
-      const auto kind = random() % 4;
-      const char32_t c =
-          kLimits[kind] + static_cast<char32_t>(random()) % (kLimits[kind + 1] - kLimits[kind]);
-      if ((kinds >> kind & 1) != 0 && !IsLead(c) && !IsTrail(c))
-        Put(text, c), Put(units, c);
-    }
-    ASSERT_NO_FATAL_FAILURE(CheckExactly<char8>(text));
-    ASSERT_NO_FATAL_FAILURE(CheckExactly<char16>(units));
-    if (size != 0) {
-      text[random() % text.size()] = static_cast<char8>(random());
-      units[random() % units.size()] = static_cast<char16>(0xD800 + random() % 0x800);
-      ASSERT_NO_FATAL_FAILURE(CheckExactly<char8>(text));
-      ASSERT_NO_FATAL_FAILURE(CheckExactly<char16>(units));
-    }
-  }
 }
 
 #ifndef MIREL_SHARED
