@@ -109,5 +109,6 @@ template <class T> mirel::basic_xstring<T> OurOf(const StdString<T>& text) {
 
 void RegisterSearches();
 void RegisterEdits();
+void RegisterStandard();
 void RegisterConversions();
 void RegisterTexts();

@@ -6,6 +6,7 @@
 int main(int argc, char** argv) {
   RegisterSearches();
   RegisterEdits();
+  RegisterStandard();
   RegisterConversions();
   RegisterTexts();
   benchmark::AddCustomContext("kernels", mirel::KernelName());

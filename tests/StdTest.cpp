@@ -203,6 +203,7 @@ TYPED_TEST(StdLibrary, MovableStringsMoveStorage) {
               EXPECT_EQ(a.data(), storage);
               EXPECT_TRUE(s.empty());
               b = std::move(a);
+              EXPECT_TRUE(a.empty());
               M c(std::move(b));
               c = std::move(c);
               EXPECT_TRUE(b.empty());

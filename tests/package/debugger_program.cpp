@@ -2,7 +2,7 @@
 
 #include <cstdlib>
 
-#include <utils/xstring.h>
+#include <utils/MovableString.h>
 
 namespace {
 
@@ -27,6 +27,7 @@ int main() {
   const mirel::VectorOfByte bytes{0, '1', 27};
   const mirel::xstring& alias = text;
   mirel::string8 empty;
+  mirel::mstring16 movable(wide);
   mirel::string16 long_text(1000, 0x20ac);
   long_text.reserve(5000);
   mirel::string8 negative, above, nowhere, unreadable, wrapping, huge;

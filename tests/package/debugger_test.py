@@ -20,6 +20,7 @@ WHOLE = {
     "malformed": r'"a\377\355\240\200z\342\202" (size 8, capacity 8)',
     "lone": r'u"a\udc00b\ud83d" (size 4, capacity 4)',
     "bytes": r'"\0001\033" (size 3, capacity 3)',
+    "movable": r'u"Grüße\t\"😀\u202e" (size 10, capacity 10)',
     "empty": '"" (size 0, capacity 0)',
 }
 BROKEN = {

@@ -6,7 +6,7 @@ GDB runs all such files in one namespace, its own __main__, hence the prefix on 
 
 import codecs
 
-MIREL_TYPES = r"^mirel::(VectorOfByte|(xvector|basic_xstring)<(char|unsigned short|short unsigned int)>)$"
+MIREL_TYPES = r"^mirel::(VectorOfByte|(xvector|basic_xstring|MovableString)<(char|unsigned short|short unsigned int)>)$"
 
 # So many elements are shown at most, whatever limit is set: a corrupt size must not keep the debugger busy.
 MIREL_MOST = 1 << 20
