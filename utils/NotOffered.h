@@ -40,9 +40,9 @@ class NoUnit {
 };
 
 struct AppendToACopyInstead {};
-struct Write_Eq {};
-struct Write_Lt {};
-struct WriteCStrOrDataAndSize {};
+struct IncludeStdOrWrite_Eq {};
+struct IncludeStdOrWrite_Lt {};
+struct IncludeStdOrWriteCStr {};
 struct WriteEraseElement {};
 struct WriteNullptr {};
 struct WriteAssignOfOneUnit {};
@@ -53,16 +53,16 @@ struct WriteAssignOfOneUnit {};
 
 detail::AppendToACopyInstead operator+(detail::AnyVector, detail::Anything) = delete;
 detail::AppendToACopyInstead operator+(detail::NoVector, detail::AnyVector) = delete;
-detail::Write_Eq operator==(detail::AnyVector, detail::Anything) = delete;
-detail::Write_Eq operator==(detail::NoVector, detail::AnyVector) = delete;
-detail::Write_Eq operator!=(detail::AnyVector, detail::Anything) = delete;
-detail::Write_Eq operator!=(detail::NoVector, detail::AnyVector) = delete;
-detail::Write_Lt operator<(detail::AnyVector, detail::Anything) = delete;
-detail::Write_Lt operator<(detail::NoVector, detail::AnyVector) = delete;
-detail::Write_Lt operator>(detail::AnyVector, detail::Anything) = delete;
-detail::Write_Lt operator>(detail::NoVector, detail::AnyVector) = delete;
+detail::IncludeStdOrWrite_Eq operator==(detail::AnyVector, detail::Anything) = delete;
+detail::IncludeStdOrWrite_Eq operator==(detail::NoVector, detail::AnyVector) = delete;
+detail::IncludeStdOrWrite_Eq operator!=(detail::AnyVector, detail::Anything) = delete;
+detail::IncludeStdOrWrite_Eq operator!=(detail::NoVector, detail::AnyVector) = delete;
+detail::IncludeStdOrWrite_Lt operator<(detail::AnyVector, detail::Anything) = delete;
+detail::IncludeStdOrWrite_Lt operator<(detail::NoVector, detail::AnyVector) = delete;
+detail::IncludeStdOrWrite_Lt operator>(detail::AnyVector, detail::Anything) = delete;
+detail::IncludeStdOrWrite_Lt operator>(detail::NoVector, detail::AnyVector) = delete;
 template <class C, class Traits>
-detail::WriteCStrOrDataAndSize operator<<(std::basic_ostream<C, Traits>&, detail::AnyVector) = delete;
+detail::IncludeStdOrWriteCStr operator<<(std::basic_ostream<C, Traits>&, detail::AnyVector) = delete;
 
 /// @endcond
 

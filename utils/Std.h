@@ -150,8 +150,9 @@ struct Equal {
   }
 };
 
-/// The hash of a text, whatever holds it; of 8-bit text that of the `std::string_view`. It isn't noexcept:
-/// GNU's containers then keep the hash with each key, as they do for their own strings.
+/// The hash of a text, whatever holds it; of 8-bit text that of the `std::string_view`. `std::hash` of a
+/// string is the same, for the default of unordered containers. Neither is noexcept: GNU's containers then
+/// keep the hash with each key, as they do for their own strings.
 struct Hash {
   typedef void is_transparent; ///< Look-ups take other types than the key's.
   /// The hash of the code units.
@@ -235,11 +236,10 @@ inline string16 ToString16(std::u16string_view s) {
 
 } // namespace mirel
 
-/// The hash of a string, for the default of unordered containers; of a string8 that of the
-/// `std::string_view`.
+/// @cond
+// The reference would have no page for them. The hash of a string8 is that of the std::string_view.
 template <class T> struct std::hash<mirel::basic_xstring<T>> {
-  /// The hash of the code units.
   std::size_t operator()(const mirel::basic_xstring<T>& s) const { return mirel::detail::HashText<T>(s); }
 };
-/// The hash of a movable string, equal to that of a string.
 template <class T> struct std::hash<mirel::MovableString<T>> : std::hash<mirel::basic_xstring<T>> {};
+/// @endcond
