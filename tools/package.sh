@@ -1,0 +1,61 @@
+#!/usr/bin/env bash
+# Builds the Debian packages for amd64 and arm64 in build/package, and checks them: what lintian says, the binary
+# interface beside the last version's, and their use in a bare root.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+out=$PWD/build/package
+as_root=$([ "$(id -u)" = 0 ] || echo sudo)
+
+say() { printf '\033[1m==> %s\033[0m\n' "$*"; }
+
+build() { # ARCHITECTURE [OPTION...]
+  local dir=$out/$1
+  say "building the packages for $1"
+  rm -rf "$dir"
+  mkdir -p "$dir/source" "$dir/root"
+  tar -c --exclude=./build --exclude=./.git . | tar -x -C "$dir/source"
+  (cd "$dir/source" && dpkg-buildpackage -us -uc "${@:2}") >"$dir/log" 2>&1 || { tail -40 "$dir/log"; exit 1; }
+  # No licence has been chosen, and debian/copyright claims none.
+  lintian --allow-root --fail-on error,warning --suppress-tags copyright-without-copyright-notice "$dir"/*.changes
+  for package in "$dir"/*.deb; do
+    dpkg-deb -x "$package" "$dir/root"
+  done
+}
+
+# Compares the binary interface with the last version's. Names may be added; all else is a new minor version.
+compare_interfaces() {
+  local base=debian/libmirel-utils0.1.abi
+  say "comparing the binary interface with $base.xz"
+  (cd "$out/amd64/root" && abidw --debug-info-dir usr/lib/debug --headers-dir usr/include/mirel --no-corpus-path \
+    --no-show-locs --no-comp-dir-path --no-write-default-sizes --drop-private-types --type-id-style hash \
+    usr/lib/*/libmirel_utils.so.*.*.*) >"$out/new.abi"
+  xz -dc "$base.xz" >"$out/old.abi"
+  abidiff --no-added-syms --suppressions debian/abi.suppressions "$out/old.abi" "$out/new.abi" || {
+    echo "The binary interface is another. If that is meant:" >&2
+    echo "  xz -9c $out/new.abi >$base.xz" >&2
+    exit 1
+  }
+}
+
+# A bare root with what programs are compiled by, from the archive that apt uses here; made once.
+make_base() {
+  [ ! -e "$out/base.tar" ] || return 0
+  local format='deb $(REPO_URI) $(RELEASE) $(COMPONENT)'
+  apt-get indextargets --format "$format" 'Created-By: Packages' 'Origin: Debian' >"$out/sources.list"
+  $as_root mmdebstrap --quiet --mode=root --variant=apt --include=g++,make,cmake,pkg-config '' "$out/base.tar.part" \
+    "$out/sources.list"
+  mv "$out/base.tar.part" "$out/base.tar"
+}
+
+mkdir -p "$out"
+make_base &
+base=$!
+build amd64 -b
+compare_interfaces
+build arm64 -B -aarm64 -d -Pcross,nocheck # without arm64's own packages: only headers are needed
+qemu-aarch64 -L /usr/aarch64-linux-gnu -E LD_LIBRARY_PATH="$out/arm64/root/usr/lib/aarch64-linux-gnu" \
+  "$out/arm64/root/usr/bin/transcode" --version
+say 'making a bare root'
+wait "$base"
+say 'installing the packages in a bare root, using and removing them'
+$as_root tests/package/debian_test.sh "$out/amd64" "$out/base.tar" "$out/bare"
