@@ -7,8 +7,9 @@ install(TARGETS mirel_utils EXPORT mirel
   RUNTIME COMPONENT runtime
   LIBRARY COMPONENT runtime NAMELINK_COMPONENT development
   ARCHIVE COMPONENT development
-  FILE_SET HEADERS DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/mirel COMPONENT development
-  FILE_SET generated DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/mirel COMPONENT development)
+  INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/mirel)
+install(DIRECTORY utils ${PROJECT_BINARY_DIR}/include/utils DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/mirel
+  COMPONENT development FILES_MATCHING PATTERN *.h PATTERN src EXCLUDE)
 install(EXPORT mirel NAMESPACE mirel:: FILE mirel-targets.cmake DESTINATION ${package_dir} COMPONENT development)
 write_basic_package_version_file(mirel-config-version.cmake COMPATIBILITY SameMinorVersion)
 install(FILES cmake/mirel-config.cmake ${PROJECT_BINARY_DIR}/mirel-config-version.cmake
@@ -33,3 +34,7 @@ list(TRANSFORM pc_runtime PREPEND -l)
 list(JOIN pc_runtime " " pc_runtime)
 configure_file(cmake/mirel.pc.in mirel.pc @ONLY)
 install(FILES ${PROJECT_BINARY_DIR}/mirel.pc DESTINATION ${pc_dir} COMPONENT development)
+
+# GDB runs what lies here in its own data directory; docs/debugging.md tells users what comes of it.
+install(FILES tools/mirel_printers.py DESTINATION ${CMAKE_INSTALL_DATADIR}/gdb/python/gdb/printer
+  COMPONENT development)

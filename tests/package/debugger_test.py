@@ -51,6 +51,12 @@ def expect(output, wanted):
             sys.exit(f"{name} is not {summary} but {shown.get(name)} in\n{output}")
 
 
+def expect_text_alone(output):
+    if " = {" in output or re.search("warning: .*script", output):
+        sys.exit(f"elements that nobody asked for, or a warning, in\n{output}")
+    return output
+
+
 def expect_all(whole, limited):
     expect(whole, WHOLE)
     expect(whole, {name: f"<corrupt or uninitialised: {fault}" for name, fault in BROKEN.items()})
@@ -58,18 +64,15 @@ def expect_all(whole, limited):
 
 
 def gdb(program, prefix, **variables):
-    """Nothing but the installed directory is named: what is loaded, GDB has found by itself."""
-    auto_load = f"{prefix}/share/gdb/auto-load"
-    output = run("gdb", "-nx", "-batch", "-iex", "set debuginfod enabled off",
-                 "-iex", f"add-auto-load-safe-path {auto_load}", "-iex", f"add-auto-load-scripts-directory {auto_load}",
+    """Nothing but GDB's data directory is named: what lies there, GDB has found by itself."""
+    output = run("gdb", "-nx", "-batch", "-data-directory", f"{prefix}/share/gdb", "-iex", "set debuginfod enabled off",
                  "-ex", "break Stop", "-ex", "run", "-ex", "up", "-ex", "info locals", "-ex", "echo LIMITED\\n",
-                 "-ex", "set print elements 3", "-ex", "set print mirel-elements off", "-ex", "info locals",
-                 program, **variables)
-    whole, limited = output.split("LIMITED")
-    if "{" in limited:
-        sys.exit(f"elements after they were turned off in\n{limited}")
-    expect(whole, {"bytes": WHOLE["bytes"] + r" = {0 '\000', 49 '1', 27 '\033'}"})
-    return whole, limited
+                 "-ex", "set print elements 3", "-ex", "info locals", "-ex", "echo ELEMENTS\\n",
+                 "-ex", "set print elements 200", "-ex", "set print mirel-elements on", "-ex", "info locals", program,
+                 **variables)
+    whole, limited, elements = re.split("LIMITED|ELEMENTS", output)
+    expect(elements, {"bytes": WHOLE["bytes"] + r" = {0 '\000', 49 '1', 27 '\033'}"})
+    return expect_text_alone(whole), expect_text_alone(limited)
 
 
 def run_lldb(*arguments):
@@ -79,11 +82,15 @@ def run_lldb(*arguments):
 
 
 def lldb(program, prefix):
-    script = f"{prefix}/share/gdb/auto-load/mirel/mirel_printers.py"
+    script = f"{prefix}/share/gdb/python/gdb/printer/mirel_printers.py"
     commands = [f"command script import {script}", "break set -n Stop", "run", "up", "frame variable",
-                'script print("LIMITED")', "settings set target.max-string-summary-length 3", "frame variable"]
+                'script print("LIMITED")', "settings set target.max-string-summary-length 3", "frame variable",
+                'script print("ELEMENTS")', "type category enable mirel-elements", "frame variable lone"]
     options = itertools.chain.from_iterable(("-o", command) for command in commands)
-    return run_lldb(*options, program).split("\nLIMITED")
+    whole, limited, elements = re.split("\nLIMITED|\nELEMENTS", run_lldb(*options, program))
+    if not re.search(r"\[1\] = 56320\s+\[2\] = 98\s", elements):
+        sys.exit(f"no elements in\n{elements}")
+    return whole, limited
 
 
 def main():
@@ -98,6 +105,7 @@ def main():
     with tempfile.TemporaryDirectory() as directory:
         for kind, shared in (("static", "OFF"), ("shared", "ON")):
             prefix, program = f"{directory}/{kind}", f"{directory}/{kind}_program"
+            shutil.copytree("/usr/share/gdb", f"{prefix}/share/gdb")
             run("cmake", "-S", source, "-B", f"{prefix}_build", "-G", "Ninja", f"-DCMAKE_CXX_COMPILER={compiler}",
                 f"-DBUILD_SHARED_LIBS={shared}", f"-DCMAKE_INSTALL_PREFIX={prefix}", "-DCMAKE_INSTALL_LIBDIR=lib",
                 "-DMIREL_BUILD_TESTS=OFF", "-DMIREL_BUILD_EXAMPLES=OFF")

@@ -7,9 +7,6 @@ run(${CMAKE_COMMAND} -S ${SOURCE_DIR} -B ${dir}/build ${build_options} -DCMAKE_I
   -DCMAKE_INSTALL_LIBDIR=${LIBDIR} -DMIREL_BUILD_TESTS=OFF -DMIREL_BUILD_EXAMPLES=OFF)
 run(${CMAKE_COMMAND} --build ${dir}/build --parallel 2)
 run(${CMAKE_COMMAND} --install ${dir}/build)
-if(KIND STREQUAL "static")
-  run(${CMAKE_COMMAND} --build ${dir}/build --parallel 2 --target all_verify_interface_header_sets)
-endif()
 if(IS_ABSOLUTE ${LIBDIR})
   return() # the components' files would be at the same place
 endif()
@@ -33,15 +30,9 @@ if(SHARED)
   set(versioned ${LIBDIR}/libmirel_utils.so.${minor} ${LIBDIR}/libmirel_utils.so.${VERSION})
 endif()
 expect_files(runtime ${versioned})
-set(auto_load share/gdb/auto-load)
-set(printers ${auto_load}/mirel/mirel_printers.py)
-if(SHARED)
-  file(REAL_PATH ${dir}/development/${LIBDIR} real_libdir)
-  list(APPEND printers ${auto_load}${real_libdir}/libmirel_utils.so.${VERSION}-gdb.py)
-endif()
 expect_files(development ${headers} include/mirel/utils/Version.h ${libraries} ${LIBDIR}/pkgconfig/mirel.pc
   ${LIBDIR}/cmake/mirel/mirel-config.cmake ${LIBDIR}/cmake/mirel/mirel-config-version.cmake
   ${LIBDIR}/cmake/mirel/mirel-targets.cmake ${LIBDIR}/cmake/mirel/mirel-targets-release.cmake
-  ${printers})
+  share/gdb/python/gdb/printer/mirel_printers.py)
 
 file(RENAME ${dir}/prefix ${dir}/moved)

@@ -8,14 +8,6 @@
 
 namespace mirel {
 
-#ifdef MIREL_GDB_SCRIPT
-/// Names a Python file, which is what the 1 means, to GDB: a program that is linked to the static library has
-/// no other tie to the script that shows strings as text. It stands here because whatever has storage links
-/// this file; without alignment because GDB allows for no padding between the notes of different libraries.
-[[gnu::section(".debug_gdb_scripts"), gnu::used, gnu::retain]] alignas(1) static const
-    char kGdbScript[] = "\1" MIREL_GDB_SCRIPT;
-#endif
-
 namespace {
 
 constexpr ssize_t kMaxBytes = std::numeric_limits<ssize_t>::max();

@@ -1,7 +1,7 @@
 """Shows mirel's vectors and strings as text in GDB and in LLDB.
 
-GDB runs this file by itself where it is installed, or with `source FILE`; LLDB with `command script import FILE`.
-GDB runs all such files in one namespace, its own __main__, hence the prefix on every name.
+GDB runs this file by itself when it starts, if the file lies in its data directory, and with `source FILE` elsewhere,
+then in GDB's own namespace, hence the prefix on every name. LLDB runs it with `command script import FILE`.
 """
 
 import codecs
@@ -132,7 +132,7 @@ class MirelInGdb(MirelObject):
 
 
 class MirelWithElements(MirelInGdb):
-    """The same with elements, which front ends show in place of the text."""
+    """Adds the elements, which front ends show in place of the text."""
 
     def children(self):
         try:
@@ -177,6 +177,32 @@ class MirelInLldb(MirelObject):
         return units
 
 
+class MirelElementsInLldb:
+    """What LLDB shows below the summary, once its category is enabled."""
+
+    def __init__(self, value, _):
+        self.object = MirelInLldb(value)
+        self.update()
+
+    def update(self):
+        try:
+            self.address, size, _ = self.object.check()
+        except MirelFault:
+            size = 0
+        self.count = min(size // self.object.width, MIREL_MOST)
+
+    def num_children(self):
+        return self.count
+
+    def get_child_index(self, name):
+        return int(name.strip("[]"))
+
+    def get_child_at_index(self, i):
+        value, width = self.object.value, self.object.width
+        unit = value.GetTarget().GetBasicType(lldb.eBasicTypeChar if width == 1 else lldb.eBasicTypeUnsignedShort)
+        return value.CreateValueFromAddress(f"[{i}]", self.address + i * width, unit)
+
+
 def mirel_lldb_summary(value, _):
     debugger = value.GetTarget().GetDebugger()
     limit = debugger.GetInternalVariableValue("target.max-string-summary-length", debugger.GetInstanceName())
@@ -184,8 +210,12 @@ def mirel_lldb_summary(value, _):
 
 
 def __lldb_init_module(debugger, _):
-    debugger.HandleCommand(f'type summary add -w mirel -F {__name__}.mirel_lldb_summary -x "{MIREL_TYPES}"')
+    summary = f'-F {__name__}.mirel_lldb_summary -x "{MIREL_TYPES}"'
+    debugger.HandleCommand(f"type summary add -w mirel {summary}")
     debugger.HandleCommand("type category enable mirel")
+    debugger.HandleCommand(f"type summary add -w mirel-elements --expand {summary}")
+    debugger.HandleCommand(f'type synthetic add -w mirel-elements -l {__name__}.MirelElementsInLldb -x "{MIREL_TYPES}"')
+    debugger.HandleCommand("type category disable mirel-elements")
 
 
 try:
@@ -195,7 +225,7 @@ except ImportError:
 else:
     try:
         gdb.parameter("print mirel-elements")
-    except RuntimeError:  # the first of the program's files that runs this
+    except RuntimeError:  # it wasn't run before
         class MirelElements(gdb.Parameter):
             """Whether the elements of mirel's vectors and strings are shown beside their text."""
 
@@ -207,7 +237,7 @@ else:
             def get_show_string(self, value):
                 return f"Elements of mirel's vectors and strings: {value}."
 
-        MirelElements("print mirel-elements", gdb.COMMAND_DATA, gdb.PARAM_BOOLEAN).value = True
+        MirelElements("print mirel-elements", gdb.COMMAND_DATA, gdb.PARAM_BOOLEAN)
 
     def mirel_printer(value):
         return (MirelWithElements if gdb.parameter("print mirel-elements") else MirelInGdb)(value)
