@@ -22,19 +22,19 @@ build() { # ARCHITECTURE [OPTION...]
   done
 }
 
-# Compares the binary interface with the last version's. Names may be added; all else is a new minor version.
+# Compares the binary interface with the one that is kept. From that version on functions may only be added; within the
+# version, as long as it isn't released, all may change, and is kept anew.
 compare_interfaces() {
-  local base=debian/libmirel-utils0.1.abi
-  say "comparing the binary interface with $base.xz"
+  local kept=(debian/abi/*.xz) version
+  say "comparing the binary interface with ${kept[0]}"
+  version=$(dpkg-parsechangelog --show-field Version)
   (cd "$out/amd64/root" && abidw --debug-info-dir usr/lib/debug --headers-dir usr/include/mirel --no-corpus-path \
     --no-show-locs --no-comp-dir-path --no-write-default-sizes --drop-private-types --type-id-style hash \
     usr/lib/*/libmirel_utils.so.*.*.*) >"$out/new.abi"
-  xz -dc "$base.xz" >"$out/old.abi"
-  abidiff --no-added-syms --suppressions debian/abi.suppressions "$out/old.abi" "$out/new.abi" || {
-    echo "The binary interface is another. If that is meant:" >&2
-    echo "  xz -9c $out/new.abi >$base.xz" >&2
-    exit 1
-  }
+  xz -dc "${kept[0]}" >"$out/old.abi"
+  abidiff --no-added-syms --suppressions debian/abi/suppressions "$out/old.abi" "$out/new.abi" && return
+  echo "To keep this interface: xz -9c $out/new.abi >debian/abi/$version.xz"
+  [ "${kept[0]}" = "debian/abi/$version.xz" ] || exit 1
 }
 
 # A bare root with what programs are compiled by, from the archive that apt uses here; made once.
