@@ -88,7 +88,7 @@ void ExpectStops(V& v, const std::string& text, const std::vector<std::tuple<A..
         std::apply([&](A... a) { call.make(v, a...); }, values);
       };
       EXPECT_EXIT(stop(), testing::KilledBySignal(SIGABRT),
-                  testing::AllOf(testing::ContainsRegex("[a-zA-Z]+\\.(h|cpp):[0-9]+: .*::"),
+                  testing::AllOf(testing::ContainsRegex("tests: utils/[a-zA-Z/]+\\.(h|cpp):[0-9]+: .*::"),
                                  testing::HasSubstr("Assertion `" + text + "' failed"),
                                  testing::HasSubstr("[unchanged]")))
           << call.text << " with " << testing::PrintToString(values);

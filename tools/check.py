@@ -79,12 +79,26 @@ def suite(flags, **how):
 
 
 def headers(row):
-    """Every public header alone."""
+    """Every public header alone, and all of them in a program without exceptions and RTTI."""
     for cxx in ("g++", "clang++", "clang++ -stdlib=libc++"):
         for std in ("17", "20", "2b"):
             for header in sorted((ROOT / "utils").glob("*.h")):
-                row.run(*cxx.split(), f"-std=c++{std}", *WARNINGS.split(), "-I.", "-x", "c++", "-include", header,
+                row.run(*cxx.split(), f"-std=c++{std}", *WARNINGS.split(), "-x", "c++", "-include", header,
                         "-fsyntax-only", "/dev/null")
+    everything = [flag for header in (ROOT / "utils").glob("*.h") for flag in ("-include", header)]
+    for cxx in ("g++", "clang++"):
+        for level in range(4):
+            row.run(cxx, "-std=c++17", *WARNINGS.split(), f"-O{level}", "-fno-exceptions", "-fno-rtti", "-x", "c++",
+                    *everything, "-S", "/dev/null", "-o", "/dev/null")
+
+
+def unity(row):
+    """The library as one source, which a project that does so with all asks for."""
+    for cxx in ("g++", "clang++"):
+        tree = row.dir / cxx
+        row.run("cmake", "-S", ROOT, "-B", tree, "-G", "Ninja", f"-DCMAKE_CXX_COMPILER={cxx}", "-DCMAKE_UNITY_BUILD=ON",
+                "-DCMAKE_COMPILE_WARNING_AS_ERROR=ON", "-DMIREL_BUILD_TESTS=OFF")
+        row.run("cmake", "--build", tree, "-j", "1", "--target", "mirel_utils")
 
 
 def layout(row):
@@ -173,11 +187,13 @@ ROWS = [
     Row("older x86-64 processors under emulation", older_processors),
     Row("valgrind", valgrind),
     Row("headers alone", headers),
+    Row("unity builds", unity),
     Row("clang-format, clang-tidy", layout),
     Row("g++ C++17 -O2", suite(flags="-O2")),
     Row("g++ C++20 -O3 NDEBUG unsigned char", suite(std=20, flags="-O3 -DNDEBUG -funsigned-char")),
     Row("g++ C++23 -O0 signed char", suite(std=23, flags="-O0 -fsigned-char")),
-    Row("g++ C++17 -O2 without kernels", suite(flags="-O2", options=("-DMIREL_KERNELS=OFF",))),
+    Row("g++ C++17 -O2 without kernels and assertion facility", suite(
+        flags="-O2 -DMIREL_NO_ASSERT_FACILITY", options=("-DMIREL_KERNELS=OFF",))),
     Row("g++ C++17 shared hardened", suite(flags=HARDENING, options=(
         SHARED, "-DCMAKE_SHARED_LINKER_FLAGS=-Wl,-z,relro,-z,now", "-DCMAKE_EXE_LINKER_FLAGS=-Wl,-z,relro,-z,now -pie"))),
     Row("g++ C++20 -O2 NDEBUG in the program only", suite(std=20, flags="-O2", program="-DNDEBUG")),

@@ -12,7 +12,7 @@
 #include <string_view>
 #include <type_traits>
 
-#include <utils/xstring.h>
+#include "xstring.h"
 
 namespace mirel {
 

@@ -9,8 +9,8 @@
 #include <cstddef>
 #include <cstring>
 
-#include <utils/Precondition.h>
-#include <utils/xchar.h>
+#include "Precondition.h"
+#include "xchar.h"
 
 namespace mirel {
 

@@ -19,8 +19,8 @@
 #include <format>
 #endif
 
-#include <utils/Std.h>
-#include <utils/Utf.h>
+#include "Std.h"
+#include "Utf.h"
 
 namespace mirel::detail {
 

@@ -8,7 +8,7 @@
 #include <limits>
 #include <type_traits>
 
-#include <utils/BasicTypes.h>
+#include "BasicTypes.h"
 
 namespace mirel {
 

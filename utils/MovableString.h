@@ -8,7 +8,7 @@
 
 #include <type_traits>
 
-#include <utils/xstring.h>
+#include "xstring.h"
 
 namespace mirel {
 

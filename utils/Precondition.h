@@ -7,14 +7,15 @@
 
 #pragma once
 
-#include <utils/BasicTypes.h>
+#include "BasicTypes.h"
 
 namespace mirel {
 
 /// Reports a violated precondition through the C library's assertion facility and ends the process (SIGABRT).
+/// Where there is no facility that is known, it prints the same line to standard error itself.
 ///
 /// @param expression  what should have been true, as text
-/// @param file        source file of the check
+/// @param file        source file of the check; a folder utils/ and what follows are reported
 /// @param line        its line there
 /// @param function    signature of the function that made the check
 [[noreturn, gnu::cold]] MIREL_API void AssertionFailed(const char* expression, const char* file, int line,

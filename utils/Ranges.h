@@ -28,8 +28,8 @@
 #include <vector>
 #endif
 
-#include <utils/Integers.h>
-#include <utils/VectorOfByte.h>
+#include "Integers.h"
+#include "VectorOfByte.h"
 
 namespace mirel {
 

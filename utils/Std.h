@@ -13,9 +13,9 @@
 #include <string_view>
 #include <type_traits>
 
-#include <utils/MovableString.h>
-#include <utils/Storage.h>
-#include <utils/xstring.h>
+#include "MovableString.h"
+#include "Storage.h"
+#include "xstring.h"
 
 namespace mirel {
 

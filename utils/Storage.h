@@ -6,7 +6,7 @@
 
 #pragma once
 
-#include <utils/xvector.h>
+#include "xvector.h"
 
 namespace mirel::detail {
 

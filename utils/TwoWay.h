@@ -8,7 +8,7 @@
 #include <iterator>
 #include <type_traits>
 
-#include <utils/xchar.h>
+#include "xchar.h"
 
 namespace mirel {
 

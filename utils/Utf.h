@@ -16,10 +16,10 @@
 #include <cstddef>
 #include <string_view>
 
-#include <utils/CodePoints.h>
-#include <utils/Malformed.h>
-#include <utils/UtfStream.h>
-#include <utils/xstring.h>
+#include "CodePoints.h"
+#include "Malformed.h"
+#include "UtfStream.h"
+#include "xstring.h"
 
 namespace mirel {
 

@@ -3,8 +3,8 @@
 
 #pragma once
 
-#include <utils/Malformed.h>
-#include <utils/xstring.h>
+#include "Malformed.h"
+#include "xstring.h"
 
 namespace mirel {
 

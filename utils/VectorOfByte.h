@@ -12,11 +12,11 @@
 #include <type_traits>
 #include <utility>
 
-#include <utils/Integers.h>
-#include <utils/NotOffered.h>
-#include <utils/Precondition.h>
-#include <utils/TwoWay.h>
-#include <utils/xchar.h>
+#include "Integers.h"
+#include "NotOffered.h"
+#include "Precondition.h"
+#include "TwoWay.h"
+#include "xchar.h"
 
 namespace mirel {
 

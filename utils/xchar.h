@@ -3,7 +3,7 @@
 
 #pragma once
 
-#include <utils/BasicTypes.h>
+#include "BasicTypes.h"
 
 namespace mirel {
 

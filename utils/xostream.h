@@ -8,8 +8,8 @@
 
 #include <cstddef>
 
-#include <utils/StreamInterfaces.h>
-#include <utils/xchar.h>
+#include "StreamInterfaces.h"
+#include "xchar.h"
 
 namespace mirel {
 

@@ -10,7 +10,7 @@
 #include <cstddef>
 #include <cstring>
 
-#include <utils/xvector.h>
+#include "xvector.h"
 
 namespace mirel {
 

@@ -13,11 +13,11 @@
 #include <iterator>
 #include <limits>
 
-#include <utils/Elements.h>
-#include <utils/Integers.h>
-#include <utils/NotOffered.h>
-#include <utils/Ranges.h>
-#include <utils/VectorOfByte.h>
+#include "Elements.h"
+#include "Integers.h"
+#include "NotOffered.h"
+#include "Ranges.h"
+#include "VectorOfByte.h"
 
 namespace mirel {
 

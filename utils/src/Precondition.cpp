@@ -2,15 +2,39 @@
 #undef NDEBUG
 #include <assert.h>
 
+#include <cerrno>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+
 #include <utils/Precondition.h>
 
 namespace mirel {
 
+namespace {
+
+/// The file's name from the folder of includes on: for inline code, compilers have the path by which the
+/// program found the header.
+const char* IncludeName(const char* file) {
+  while (const char* const folder = std::strstr(file, "/utils/"))
+    file = folder + 1;
+  return file;
+}
+
+} // namespace
+
 void AssertionFailed(const char* expression, const char* file, int line, const char* function) {
-#ifdef __ANDROID__
-  __assert2(file, line, function, expression);
+#if defined(__ANDROID__)
+  __assert2(IncludeName(file), line, function, expression);
+#elif defined(__GLIBC__) && !defined(MIREL_NO_ASSERT_FACILITY)
+  __assert_fail(expression, IncludeName(file), static_cast<unsigned>(line), function);
 #else
-  __assert_fail(expression, file, static_cast<unsigned>(line), function);
+  // What glibc prints. Other C libraries have facilities of other names and forms, if any.
+#ifdef __linux__
+  std::fprintf(stderr, "%s: ", program_invocation_short_name);
+#endif
+  std::fprintf(stderr, "%s:%d: %s: Assertion `%s' failed.\n", IncludeName(file), line, function, expression);
+  std::abort();
 #endif
 }
 

@@ -13,7 +13,7 @@
 
 namespace mirel {
 
-namespace {
+namespace detail { // and not a namespace without a name, whose types g++ takes in unity builds for a header's
 
 /// Gathers text in a block, with the indent between a newline and the next byte, so that the sink is called
 /// seldom. A long line goes to the sink from where it stands.
@@ -37,7 +37,7 @@ protected:
   std::streamsize xsputn(const char* p, std::streamsize n) override {
     for (const char* const end = p + n; p != end;) {
       AddIndent();
-      const char* const newline = indent == 0 ? end : Find(p, end, '\n');
+      const char* const newline = indent == 0 ? end : mirel::Find(p, end, '\n');
       const char* const lineEnd = newline == end ? end : newline + 1;
       Add(p, lineEnd - p);
       p = lineEnd;
@@ -108,6 +108,10 @@ private:
   ssize_t gathered = kInLine; ///< the same number after the bytes in the block
 };
 
+} // namespace detail
+
+namespace {
+
 /// The standard streams count in 32 bits where pointers have so many: the nearest count that they can hold.
 std::streamsize ForStandard(streamsize x) {
   using Limits = std::numeric_limits<std::streamsize>;
@@ -152,7 +156,7 @@ public:
     buffer.Deliver();
   }
 
-  IndentingBuffer buffer;
+  detail::IndentingBuffer buffer;
 };
 
 IOutputStream::~IOutputStream() = default;
