@@ -154,11 +154,12 @@ public:
     const ssize_t reverse = v.empty() ? kNpos : this->Number(v.size()) - 1;
     const auto uf = static_cast<std::size_t>(forward), ur = static_cast<std::size_t>(reverse);
     const T c = this->Unit();
-    const T* const p = r.data();
+    const T *const z = r.c_str(), *const p = r.data();
     const ssize_t pn = r.size();
 #define SEARCH(NAME, OURS, THEIRS)                                                                           \
   ASSERT_EQ(v.NAME(c, OURS), ssize_t(text.NAME(c, THEIRS)));                                                 \
   ASSERT_EQ(v.NAME(r, OURS), ssize_t(text.NAME(pattern, THEIRS)));                                           \
+  ASSERT_EQ(v.NAME(z, OURS), ssize_t(text.NAME(z, THEIRS)));                                                 \
   ASSERT_EQ(v.NAME(p, OURS, pn), ssize_t(text.NAME(pattern, THEIRS)))
     SEARCH(find, forward, uf);
     SEARCH(find_first_of, forward, uf);
@@ -171,11 +172,14 @@ public:
     ASSERT_EQ(Std(v.substr(forward, kNpos)), text.substr(uf));
     const auto other = std::basic_string<T>(this->Text(12));
     const S o(other.data(), static_cast<ssize_t>(other.size()));
-    const auto u = [](T x) { return static_cast<std::make_unsigned_t<T>>(x); };
-    const auto less = [&](T a, T b) { return u(a) < u(b); };
-    const bool before =
-        std::lexicographical_compare(text.begin(), text.end(), other.begin(), other.end(), less);
-    const int expected = before ? -1 : text != other;
+    const auto order = [](const std::basic_string<T>& a, const std::basic_string<T>& b) {
+      const auto less = [](T x, T y) { return std::make_unsigned_t<T>(x) < std::make_unsigned_t<T>(y); };
+      return std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end(), less) ? -1 : a != b;
+    };
+    const int expected = order(text, other), expectedUpToZero = order(text, other.c_str());
+    ASSERT_EQ(sign(v.compare(other.c_str())), expectedUpToZero);
+    ASSERT_EQ(v._Eq(other.c_str()), expectedUpToZero == 0);
+    ASSERT_EQ(v._Lt(other.c_str()), expectedUpToZero < 0);
     ASSERT_EQ(sign(v.compare(o)), expected);
     ASSERT_EQ(sign(v.compare(0, v.size(), o, 0, o.size())), expected);
     ASSERT_EQ(sign(v.compare(o.data(), o.size())), expected);

@@ -26,20 +26,10 @@ TYPED_TEST(XString, ZeroTerminatedArguments) {
   const S text = Of<TypeParam>("abcabc"), bc = Of<TypeParam>("bc"), none;
   const TypeParam* const z = bc.c_str();
   S s = z;
-  EXPECT_TRUE(s._Eq(z) && s._Eq(bc) && !s._Lt(z) && s.compare(z) == 0 && s.compare(0, 1, z) < 0);
-  EXPECT_TRUE(none.compare(none.c_str()) == 0 && bc.compare(none.c_str()) > 0 && none._Lt(z));
   (s = text.c_str()).append(z) += z;
   s.insert(0, z).replace(2, 3, z).insert(s.size(), none.c_str());
   EXPECT_EQ(Std(s), Std(Of<TypeParam>("bcbcabcbcbc")));
-  EXPECT_EQ(text.find(z), 1);
-  EXPECT_EQ(text.find(z, 2), 4);
-  EXPECT_EQ(text.find(none.c_str(), 6), 6);
-  EXPECT_EQ(text.rfind(z), 4);
-  EXPECT_EQ(text.rfind(z, 3), 1);
-  EXPECT_EQ(text.find_first_of(z, 3), 4);
-  EXPECT_EQ(text.find_first_not_of(z, 1), 3);
-  EXPECT_EQ(text.find_last_of(z), 5);
-  EXPECT_EQ(text.find_last_not_of(z, 2), 0);
+  EXPECT_LT(s.compare(0, 1, z), 0);
   EXPECT_EQ(Std(S(text, 1, 2)) + Std(text.substr(4, 2)) + Std(S(z, z + 1)), Std(Of<TypeParam>("bcbcb")));
   HackToForcexstringIntoUtilsDll();
 }
