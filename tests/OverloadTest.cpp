@@ -8,9 +8,7 @@
 
 #include <iterator>
 #include <list>
-#include <sstream>
 #include <type_traits>
-#include <vector>
 
 using namespace mirel;
 
@@ -119,27 +117,6 @@ TYPED_TEST(Overload, LiteralNullIsNoString) {
         CALL(s.replace(0, 0, p)), CALL(s.compare(p)), CALL(s._Lt(p)), CALL(s.compare(0, 0, p)),
         CALL(s.find(p)), CALL(s.rfind(p, 0)), CALL(s.find_first_of(p)), CALL(s.find_last_of(p)),
         CALL(s.find_first_not_of(p)), CALL(s.find_last_not_of(p, 0)));
-}
-
-TYPED_TEST(Overload, AnyIteratorIsASource) {
-  using S = basic_xstring<TypeParam>;
-  const S r = Of<TypeParam>("abc");
-  const std::list<TypeParam> list(r.begin(), r.end());
-  const std::vector<int> ints(list.begin(), list.end());
-  std::basic_stringbuf<char> buffer("abc");
-  S s;
-  s.assign(list.begin(), list.end()), s.push_back(ints.begin(), ints.end()),
-      s.insert(0, r.rbegin(), r.rend());
-  s.push_back(2, list.begin(), list.end()), s.insert(1, ints.data(), ints.data() + 1);
-  s.push_back(std::istreambuf_iterator<char>(&buffer), std::istreambuf_iterator<char>());
-  EXPECT_EQ(Std(s), Std(Of<TypeParam>("cabaabcabcabcabcabc")));
-  EXPECT_EQ(s.find(list.begin(), list.end()), 4);
-  EXPECT_EQ(s.rfind(ints.begin(), ints.end()), 16);
-  EXPECT_EQ(s.find_first_not_of(list.begin(), list.end()), kNpos);
-  EXPECT_TRUE(s.contains(list.rbegin(), list.rend(), 0) == false && s.contains(ints.begin(), ints.end(), 4));
-  std::copy(list.begin(), list.end(), std::back_inserter(s));
-  EXPECT_EQ(s.size(), 22);
-  EXPECT_EQ(Std(xvector<TypeParam>{'a', 'b', 'c'}), Std(r));
 }
 
 template <class V> using Vector = xvector<typename V::value_type>;

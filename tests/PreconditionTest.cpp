@@ -2,9 +2,13 @@
 #include "Support.h"
 
 #include <csignal>
+#include <deque>
 #include <functional>
+#include <iterator>
 #include <limits>
+#include <list>
 #include <memory>
+#include <string>
 #include <tuple>
 #include <unistd.h>
 #include <utility>
@@ -39,6 +43,7 @@ const char kIterator[] = "begin() <= i && i < end()";
 const char kIterators[] = "begin() <= i1 && i1 <= i2 && i2 <= end()";
 const char kCount[] = "0 <= count";
 const char kNotEmpty[] = "size() > 0";
+const char kCopied[] = "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)";
 
 std::function<bool()> unchanged;
 
@@ -173,7 +178,69 @@ TYPED_TEST(Precondition, OfIndicesAndCounts) {
               {WITH_N(mirel::FillFrom(v, 0, filled(n)))});
 }
 
-TYPED_TEST(Precondition, OfPointersAndRanges) {
+/// Expects that the members that take [r1, r2) stop with one text where they copy and another where they
+/// search.
+template <class S, class It>
+void ExpectRangeStops(S& s, It from, It to, const char* copying, const char* searching) {
+  const std::vector<std::tuple<It, It>> range = {{from, to}};
+  ExpectStops(s, copying, range,
+              {WITH_R1_R2(S(r1, r2)), WITH_R1_R2(v.assign(r1, r2)), WITH_R1_R2(v.push_back(r1, r2)),
+               WITH_R1_R2(v.push_back(2, r1, r2)), WITH_R1_R2(v.insert(1, r1, r2))});
+  if (searching)
+    ExpectStops(
+        s, searching, range,
+        {WITH_R1_R2(v.contains(r1, r2, 0)), FORWARD(WITH_R1_R2, r1, r2), REVERSE(WITH_R1_R2, r1, r2)});
+}
+
+TYPED_TEST(Precondition, OfRanges) {
+  using T = TypeParam;
+  using S = basic_xstring<T>;
+  const S r = Of<T>("xyz");
+  const T *const q = r.data(), *const volatile null = nullptr;
+  const std::vector<int> ints = {'a', 1 << 16};
+  const int* const volatile nullInt = nullptr;
+  const std::deque<T> deque(3);
+  const std::string text = "xyz";
+  S s = Of<T>("abc");
+  const auto reversed = [&](auto r1, auto r2) { ExpectRangeStops(s, r1, r2, kRange, kRange); };
+  reversed(q + 1, q), reversed(ints.data() + 1, ints.data()), reversed(ints.end(), ints.begin());
+  reversed(text.end(), text.begin()), reversed(deque.end(), deque.begin());
+  reversed(deque.rend(), deque.rbegin()), reversed(r.rend(), r.rbegin()), reversed(s.rend(), s.rbegin());
+  reversed(q, +null);
+  const auto isNull = [&](auto r1, auto r2) {
+    ExpectRangeStops(s, r1, r2, kCopied, "r1 == r2 || r1 != nullptr");
+  };
+  isNull(+null, q), isNull(+nullInt, ints.data()), isNull(const_cast<T*>(null), s.end());
+  isNull(std::reverse_iterator<const T*>(q), std::reverse_iterator<const T*>(null));
+  isNull(typename S::const_reverse_iterator(q), typename S::const_reverse_iterator(null));
+  ExpectRangeStops(s, ints.begin(), ints.end(), "Fits<T>(*r1)", nullptr);
+  const std::list<short> negative(1, -1);
+  if (sizeof(T) == 1)
+    ExpectRangeStops(s, negative.begin(), negative.end(), "Fits<T>(*r1)", nullptr);
+  // What is checked before a range.
+  ExpectStops(s, kIndex, kBadIndex, {WITH_I(v.insert(i, +null, q)), WITH_I(v.insert(i, q + 1, q))});
+  ExpectStops(s, kCount, kBadCount, {WITH_N(v.push_back(n, +null, q)), WITH_N(v.push_back(n, q + 1, q))});
+  ExpectStops(s, kForward, kBadIndex, {FORWARD(WITH_I, +null, q, i), WITH_I(v.contains(+null, q, i))});
+  ExpectStops(s, kReverse, kBadReverse, {REVERSE(WITH_I, +null, q, i)});
+  ExpectStops(s, kRange, kOnce, {WITHOUT(v.push_back(0, q + 1, q))});
+  s.push_back(0, +null, q), s.push_back(0, ints.begin(), ints.end()); // copies nothing
+  EXPECT_EQ(Std(s), Std(Of<T>("abc")));
+}
+
+TYPED_TEST(Precondition, OfNullTerminatedArguments) {
+  using T = TypeParam;
+  using S = basic_xstring<T>;
+  S s = Of<T>("abc");
+  const T* const volatile null = nullptr;
+#define WITH_Z(...) CALL((auto& v, auto z), __VA_ARGS__)
+  ExpectStops(s, "s != nullptr", std::vector<std::tuple<const T*>>{{null}},
+              {WITH_Z(S{z}), WITH_Z(v = z), WITH_Z(v.assign(z)), WITH_Z(v += z), WITH_Z(v.append(z)),
+               WITH_Z(v.insert(99, z)), WITH_Z(v.replace(99, 9, z)), WITH_Z(v.compare(z)),
+               WITH_Z(v.compare(99, 9, z)), WITH_Z(v._Eq(z)), WITH_Z(v._Lt(z)), FORWARD(WITH_Z, z, 99),
+               REVERSE(WITH_Z, z, 99)});
+}
+
+TYPED_TEST(Precondition, OfPointersAndCounts) {
   using T = TypeParam;
   using S = basic_xstring<T>;
   const S r = Of<T>("xyz");
@@ -186,10 +253,6 @@ TYPED_TEST(Precondition, OfPointersAndRanges) {
        WITH_P_PN(v.insert(99, p, pn)), WITH_P_PN(v.replace(1, 1, p, pn)),
        WITH_P_PN(v.replace(v.begin(), v.end(), p, pn)), WITH_P_PN(v.compare(p, pn)),
        WITH_P_PN(v.compare(1, 1, p, pn)), FORWARD(WITH_P_PN, p, 99, pn), REVERSE(WITH_P_PN, p, 99, pn)});
-  ExpectStops(s, kRange, std::vector<std::tuple<const T*, const T*>>{{q + 1, q}},
-              {WITH_R1_R2(S(r1, r2)), WITH_R1_R2(v.assign(r1, r2)), WITH_R1_R2(v.push_back(r1, r2)),
-               WITH_R1_R2(v.push_back(2, r1, r2)), WITH_R1_R2(v.insert(0, r1, r2)),
-               WITH_R1_R2(v.contains(r1, r2, 0)), FORWARD(WITH_R1_R2, r1, r2), REVERSE(WITH_R1_R2, r1, r2)});
   const auto empty = std::make_unique<S>();
   const S& constEmpty = *empty;
   ExpectStops(s, kNotEmpty, kOnce,
@@ -206,8 +269,7 @@ TYPED_TEST(Precondition, OfElementRuns) {
   auto s = Of<T>("abc");
   T* const volatile null = nullptr, * const q = s.begin();
   ExpectStops(s, "r1 >= r2 || r1 != nullptr", kOnce, {WITHOUT(p_create(+null, q, 'x'))});
-  ExpectStops(s, "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)",
-              std::vector<std::tuple<const T*, const T*>>{{q + 1, q}, {null, q}},
+  ExpectStops(s, kCopied, std::vector<std::tuple<const T*, const T*>>{{q + 1, q}, {null, q}},
               {WITH_R1_R2(p_copy(q, r1, r2)), WITH_R1_R2(p_copy(+null, r1, r2))});
   ExpectStops(s, "src1 == src2 || dst != nullptr", kOnce, {WITHOUT(p_copy(+null, v.begin(), v.end()))});
   p_copy(+null, q, q), p_create(+null, +null, 'x'), p_create(q + 3, q, 'x'); // have nothing to do
@@ -238,9 +300,12 @@ TEST(Precondition, OfBuffers) {
   ExpectStops(b, kPointer,
               std::vector<std::tuple<const uint8_t*, ssize_t>>{{nullptr, 1}, {&byte, -1}, {&byte, kMin}},
               {WITH_P_PN(v.compare(0, 1, p, pn))});
-  ExpectStops(b, kRange, std::vector<std::tuple<const uint8_t*, const uint8_t*>>{{&byte + 1, &byte}},
-              {WITH_R1_R2(B(r1, r2)), WITH_R1_R2(v.insert(0, r1, r2)), WITH_R1_R2(v.assign(r1, r2)),
-               WITH_R1_R2(v.push_back(r1, r2))});
+  const uint8_t* const volatile null = nullptr;
+  for (const auto& [text, from] : {std::pair(kRange, &byte + 1), std::pair(kCopied, +null)})
+    ExpectStops(b, text, std::vector<std::tuple<const uint8_t*, const uint8_t*>>{{from, &byte}},
+                {WITH_R1_R2(B(r1, r2)), WITH_R1_R2(v.insert(0, r1, r2)), WITH_R1_R2(v.assign(r1, r2)),
+                 WITH_R1_R2(v.insert(v.begin(), r1, r2)), WITH_R1_R2(v.push_back(r1, r2))});
+  ExpectStops(b, kIndex, kBadIndex, {WITH_I(v.insert(i, +null, &byte))});
   const auto empty = std::make_unique<B>();
   const B& constEmpty = *empty;
   ExpectStops(b, kNotEmpty, kOnce,

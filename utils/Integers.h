@@ -55,8 +55,8 @@ void ConstantDoesNotFit()
 /// checked at run time.
 template <class T, class N> [[gnu::always_inline]] inline void RefuseConstant([[maybe_unused]] N x) {
 #ifdef __OPTIMIZE__
-  if (__builtin_constant_p(HasBitsFor<T>(x)) && !HasBitsFor<T>(x)) // decided by the compiler
-    ConstantDoesNotFit();                                          // decided by the compiler
+  if (__builtin_constant_p(x) && !HasBitsFor<T>(x)) // the compiler decides
+    ConstantDoesNotFit();                           // the compiler decides
 #endif
 }
 

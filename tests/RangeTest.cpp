@@ -1,0 +1,178 @@
+// Ranges of every kind of iterator, given to every member that takes one.
+#include "Support.h"
+
+#include <deque>
+#include <forward_list>
+#include <iterator>
+#include <list>
+#include <sstream>
+#include <string>
+#include <string_view>
+#include <vector>
+#if __cplusplus >= 202002L
+#include <span>
+#endif
+
+using namespace mirel;
+
+namespace {
+
+template <class T> class Range : public testing::Test {};
+TYPED_TEST_SUITE(Range, CodeUnits);
+
+const char kUnits[] = "ab\xE9\x80"; // the last two are negative where plain char has a sign
+constexpr std::size_t kSize = 4;
+
+/// Expects that [r1, r2) is the text of kUnits, for each member that copies it.
+template <class T, class It> void ExpectCopies(It r1, It r2) {
+  using S = basic_xstring<T>;
+  const auto text = Std(Of<T>(kUnits));
+  S s(r1, r2);
+  EXPECT_EQ(Std(s), text);
+  EXPECT_EQ(Std(xvector<T>(r1, r2)), text);
+  s.push_back(r1, r2);
+  EXPECT_EQ(Std(s), text + text);
+  s.push_back(2, r1, r2);
+  EXPECT_EQ(Std(s), text + text + text + text);
+  s.assign(r1, r2);
+  EXPECT_EQ(Std(s), text);
+  s.insert(1, r1, r2);
+  EXPECT_EQ(Std(s), text.substr(0, 1) + text + text.substr(1));
+}
+
+/// Expects that [r1, r2) is the text of kUnits, for each member that looks for it.
+template <class T, class It> void ExpectSearches(It r1, It r2) {
+  const auto s = Of<T>(std::string("-") + kUnits + kUnits + "-");
+  EXPECT_EQ(s.find(r1, r2), 1);
+  EXPECT_EQ(s.find(r1, r2, 2), 5);
+  EXPECT_EQ(s.rfind(r1, r2), 5);
+  EXPECT_EQ(s.rfind(r1, r2, 4), 1);
+  EXPECT_EQ(s.find_first_of(r1, r2), 1);
+  EXPECT_EQ(s.find_first_not_of(r1, r2, 1), 9);
+  EXPECT_EQ(s.find_last_of(r1, r2), 8);
+  EXPECT_EQ(s.find_last_not_of(r1, r2, 8), 0);
+  EXPECT_TRUE(s.contains(r1, r2, 5));
+  EXPECT_FALSE(s.contains(r1, r2, 4));
+  EXPECT_EQ(s.find(r1, r1, 3), 3);
+  EXPECT_EQ(allocation::Count([&] { s.find(r1, r2), s.rfind(r1, r2), s.find_last_of(r1, r2); }), 0);
+}
+
+/// How often an edit into storage with room allocates.
+template <class T, class It> long Allocations(It r1, It r2) {
+  basic_xstring<T> s;
+  s.reserve(100);
+  return allocation::Count([&] { s.push_back(r1, r2); });
+}
+
+template <class T, class Container> void ExpectAll(const Container& units, long allocations) {
+  ExpectCopies<T>(units.begin(), units.end());
+  ExpectSearches<T>(units.begin(), units.end());
+  EXPECT_EQ(Allocations<T>(units.begin(), units.end()), allocations);
+}
+
+template <class U> std::vector<U> Units() {
+  std::vector<U> units;
+  for (const char c : std::string(kUnits))
+    units.push_back(static_cast<U>(static_cast<unsigned char>(c)));
+  return units;
+}
+
+/// Ranges of elements of type U, of which those in one piece are copied without help if they are as wide as
+/// T.
+template <class T, class U> void ExpectElements() {
+  const auto v = Units<U>();
+  const std::list<U> list(v.begin(), v.end());
+  const std::deque<U> deque(v.rbegin(), v.rend());
+  const std::forward_list<U> forward(v.begin(), v.end());
+  const long help = sizeof(U) == sizeof(T) ? 0 : 1;
+  ExpectAll<T>(v, help);
+  ExpectAll<T>(list, 1);
+  ExpectAll<T>(forward, 1);
+  ExpectCopies<T>(deque.rbegin(), deque.rend());
+  ExpectSearches<T>(deque.rbegin(), deque.rend());
+  ExpectCopies<T>(v.data(), v.data() + kSize);
+  ExpectSearches<T>(v.data(), v.data() + kSize);
+  EXPECT_EQ((Allocations<T>(v.data(), v.data() + kSize)), help);
+  std::vector<U> other = v; // its iterators aren't const
+  EXPECT_EQ((Allocations<T>(other.begin(), other.end())), help);
+  EXPECT_EQ((Allocations<T>(v.end(), v.end())), 0);
+#if __cplusplus >= 202002L
+  ExpectAll<T>(std::span(v.data(), kSize), help);
+#endif
+}
+
+enum class Scoped : short {};
+template <class T, class... U> void ExpectEachElement() { (ExpectElements<T, U>(), ...); }
+
+TYPED_TEST(Range, OfElementsOfAnyTypeAndAnyIterators) {
+  ExpectEachElement<TypeParam, char, signed char, unsigned char, short, unsigned short, char16_t, int,
+                    wchar_t, char32_t, long long, Scoped>();
+}
+
+TYPED_TEST(Range, OfStringsAndViewsAndOurs) {
+  using T = TypeParam;
+  const auto units = Units<char16_t>();
+  const std::string narrow = kUnits;
+  const std::u16string wide(units.begin(), units.end());
+  const long helpNarrow = sizeof(T) == 1 ? 0 : 1, helpWide = 1 - helpNarrow;
+  ExpectAll<T>(narrow, helpNarrow);
+  ExpectAll<T>(std::string_view(narrow), helpNarrow);
+  ExpectAll<T>(Of<char8>(kUnits), helpNarrow);
+  ExpectAll<T>(wide, helpWide);
+  ExpectAll<T>(std::u16string_view(wide), helpWide);
+  ExpectAll<T>(Of<char16>(kUnits), helpWide);
+  auto reversed = Of<T>(std::string(narrow.rbegin(), narrow.rend()));
+  const auto& constant = reversed;
+  ExpectCopies<T>(reversed.rbegin(), reversed.rend());
+  ExpectSearches<T>(constant.rbegin(), constant.rend());
+}
+
+TYPED_TEST(Range, OfOneUseIsCopied) {
+  std::istringstream text(kUnits);
+  basic_xstring<TypeParam> s;
+  s.push_back(std::istreambuf_iterator<char>(text), std::istreambuf_iterator<char>());
+  EXPECT_EQ(Std(s), Std(Of<TypeParam>(kUnits)));
+}
+
+TYPED_TEST(Range, InTheStringItselfIsTakenAsItWas) {
+  using T = TypeParam;
+  using Other = std::conditional_t<sizeof(T) == 1, unsigned char, short>;
+  auto s = Of<T>("abcd");
+  const auto* const p = reinterpret_cast<const Other*>(s.data());
+  s.insert(1, p + 1, p + 4);
+  EXPECT_EQ(Std(s), Std(Of<T>("abcdbcd")));
+  s.assign(s.rbegin(), s.rend());
+  EXPECT_EQ(Std(s), Std(Of<T>("dcbdcba")));
+  s.push_back(2, s.begin(), s.begin() + 1);
+  EXPECT_EQ(Std(s), Std(Of<T>("dcbdcbadd")));
+}
+
+TYPED_TEST(Range, ElementsThatDontFitAreNowhere) {
+  const auto s = Of<TypeParam>("a\xFF");
+  const int high = sizeof(TypeParam) == 1 ? 0x161 : 0x10061;
+  for (const int unit : {high, -1, -159}) { // cut, they would be in the string
+    const std::vector<int> v = {unit};
+    const std::list<long long> list = {unit};
+    EXPECT_EQ(s.find(v.begin(), v.end()), kNpos) << unit;
+    EXPECT_EQ(s.rfind(list.begin(), list.end()), kNpos) << unit;
+    EXPECT_EQ(s.find_first_of(v.begin(), v.end()), kNpos) << unit;
+    EXPECT_EQ(s.find_last_not_of(list.begin(), list.end()), 1) << unit;
+    EXPECT_FALSE(s.contains(v.begin(), v.end(), 0)) << unit;
+  }
+}
+
+TEST(RangeTest, ASingleUnitCountsByItsUnsignedValue) {
+  string16 w;
+  const char c = '\xE9';
+  const signed char d = -23;
+  w += c, w.push_back(d), w.append(1, c), w.insert(0, c), w.insert(w.begin(), d), w.resize(6, c);
+  w.replace(5, 1, 1, d), w.push_front(c);
+  EXPECT_EQ(Std(w + c), (std::basic_string<char16>(8, 0xE9)));
+  EXPECT_EQ(Std(string16(8, c)), Std(w + d));
+  EXPECT_EQ(w.find(c, 1), 1);
+  EXPECT_EQ(w.find_last_not_of(d), kNpos);
+  EXPECT_EQ(w.FindAndEraseFirst(c), 1);
+  EXPECT_EQ(w.FindAndErase(d), 6);
+}
+
+} // namespace

@@ -1,0 +1,72 @@
+#!/usr/bin/python3
+"""Compiles each call of refused.txt, and compares what the compiler says with the text that stands above the call.
+
+usage: refused.py SOURCE-DIRECTORY WORK-DIRECTORY C++-COMPILER [OPTION...]
+"""
+
+import concurrent.futures
+import pathlib
+import subprocess
+import sys
+
+PRELUDE = """
+#include <algorithm>
+#include <functional>
+#include <iostream>
+#include <iterator>
+#include <string>
+#include <utils/xstring.h>
+using namespace mirel;
+enum class E { e };
+namespace Program { // has operators of its own, of every kind of match
+string8 operator+(const string8&, const char*);
+template <class T> bool operator==(const basic_xstring<T>&, const basic_xstring<T>&);
+template <class T> bool operator<(const xvector<T>&, const xvector<T>&);
+bool operator==(const string8&, std::string_view);
+template <class C, class Traits>
+std::basic_ostream<C, Traits>& operator<<(std::basic_ostream<C, Traits>&, const xvector<C>&);
+inline bool Use(const string8& s) { return s + "x" == s && s < s && s == "x" && std::cout << s << s + s; }
+}
+"""
+CALL = """void F(string8& s, string8& t, const string8& cs, string16& w, xvector<char8>& v, VectorOfByte& b, int n) {
+  [[maybe_unused]] double doubles[9]; (void)s, (void)t, (void)cs, (void)w, (void)v, (void)b, (void)n;
+  (void)(%s);
+}
+"""
+
+
+def main():
+    source, work, *compiler = sys.argv[1:]
+    work = pathlib.Path(work)
+    work.mkdir(exist_ok=True)
+    compiler += ["-std=c++17", "-I", source, "-x"]
+    prelude = work / "prelude.h"
+    prelude.write_text(PRELUDE)
+
+    def compile(call, level):
+        return subprocess.run([*compiler, "c++", level, "-include", work / level / "prelude.h", "-S", "-o", "/dev/null", "-"],
+                              input=CALL % call, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True)
+
+    def check(expected, call):
+        result = compile(call, "-O0" if expected.endswith("-O0") else "-O1")
+        good = result.returncode == 0 if expected.startswith("compiles") else expected in result.stdout
+        return "" if good else f"{call}: not '{expected}':\n{result.stdout}\n"
+
+    for level in ("-O0", "-O1"):
+        (work / level).mkdir(exist_ok=True)
+        (work / level / "prelude.h").write_text(PRELUDE)
+        subprocess.run([*compiler, "c++-header", level, work / level / "prelude.h", "-o", work / level / "prelude.h.gch"], check=True)
+    calls, expected = [], None
+    for line in (pathlib.Path(source) / "tests" / "refused.txt").read_text().splitlines():
+        if line.startswith("["):
+            expected = line.strip("[]")
+        elif line and not line.startswith("#"):
+            calls.append((expected, line))
+    with concurrent.futures.ThreadPoolExecutor(2) as pool:
+        failures = [text for text in pool.map(lambda call: check(*call), calls) if text]
+    print(*failures, f"{len(calls) - len(failures)} of {len(calls)} calls as expected")
+    return len(failures) > 0 or not calls
+
+
+if __name__ == "__main__":
+    sys.exit(main())
