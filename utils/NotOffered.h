@@ -2,12 +2,15 @@
 /// Operators that vectors and strings don't have, and what is written instead, as the compiler names it.
 ///
 /// They take their arguments by a conversion that a class defines, which is worse than any other: whatever
-/// operator a program or another header declares for such arguments is called in their place.
+/// operator a program or another header declares for such arguments is called in their place, among them
+/// those of utils/Std.h.
 
 #pragma once
 
 #include <iosfwd>
 #include <type_traits>
+
+#include <utils/xchar.h>
 
 namespace mirel {
 
@@ -22,6 +25,9 @@ std::false_type IsVector(...);
 struct AnyVector {
   template <class T> AnyVector(const xvector<T>&);
 };
+
+/// What vectors and strings of T convert to.
+template <class T> struct VectorOf { VectorOf(const xvector<T>&); };
 
 /// What everything converts to.
 struct Anything {
@@ -40,12 +46,13 @@ class NoUnit {
 };
 
 struct AppendToACopyInstead {};
+struct ConvertToUtf8First {};
 struct IncludeStdOrWrite_Eq {};
 struct IncludeStdOrWrite_Lt {};
 struct IncludeStdOrWriteCStr {};
+struct WriteAssignOfOneUnit {};
 struct WriteEraseElement {};
 struct WriteNullptr {};
-struct WriteAssignOfOneUnit {};
 
 } // namespace detail
 
@@ -61,8 +68,14 @@ detail::IncludeStdOrWrite_Lt operator<(detail::AnyVector, detail::Anything) = de
 detail::IncludeStdOrWrite_Lt operator<(detail::NoVector, detail::AnyVector) = delete;
 detail::IncludeStdOrWrite_Lt operator>(detail::AnyVector, detail::Anything) = delete;
 detail::IncludeStdOrWrite_Lt operator>(detail::NoVector, detail::AnyVector) = delete;
+detail::IncludeStdOrWrite_Lt operator<=(detail::AnyVector, detail::Anything) = delete;
+detail::IncludeStdOrWrite_Lt operator<=(detail::NoVector, detail::AnyVector) = delete;
+detail::IncludeStdOrWrite_Lt operator>=(detail::AnyVector, detail::Anything) = delete;
+detail::IncludeStdOrWrite_Lt operator>=(detail::NoVector, detail::AnyVector) = delete;
 template <class C, class Traits>
-detail::IncludeStdOrWriteCStr operator<<(std::basic_ostream<C, Traits>&, detail::AnyVector) = delete;
+detail::IncludeStdOrWriteCStr operator<<(std::basic_ostream<C, Traits>&, detail::VectorOf<char8>) = delete;
+template <class C, class Traits>
+detail::ConvertToUtf8First operator<<(std::basic_ostream<C, Traits>&, detail::VectorOf<char16>) = delete;
 
 /// @endcond
 
