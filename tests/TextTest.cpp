@@ -190,6 +190,16 @@ TYPED_TEST(UtfText, Mixtures) {
     ASSERT_NO_FATAL_FAILURE(CheckText(Mixture<TypeParam>(random, random() % 500)));
 }
 
+/// More than the lanes of a kernel can count before they are added up.
+TYPED_TEST(UtfText, LongTextIsCounted) {
+  const Text<TypeParam> text(1200000, 'a');
+  ForEachKernels([&](const mirel::detail::Kernels* kernels) {
+    const auto lengths = mirel::detail::Measure(kernels, text.data(), text.data() + text.size());
+    EXPECT_EQ(lengths.codePoints, 1200000);
+    EXPECT_EQ(lengths.units, 1200000);
+  });
+}
+
 /// The strict conversions, which tests/UtfTest.cpp compares with the same oracle, agree with the decoder.
 TEST(UtfText, EverySequenceIsClassifiedAsTheStandardDoes) {
   for (unsigned bytes = 0; bytes < 1u << 24; ++bytes) {
