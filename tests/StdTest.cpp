@@ -126,6 +126,7 @@ TYPED_TEST(StdLibrary, MapsAreSearchedWithoutCopies) {
   EXPECT_FALSE(Less()(p, long2.c_str()) || Less()(long2.c_str(), p));
   EXPECT_EQ(Hash()(p), Hash()(long2));
   EXPECT_NE(Hash()(p), Hash()(p + 1));
+  EXPECT_NE(Hash()(Of<TypeParam>("units")), Hash()(Of<TypeParam>("unity")));
   EXPECT_EQ(std::hash<S>()(long1), Hash()(p));
   EXPECT_EQ(std::hash<MovableString<TypeParam>>()(long1), Hash()(p));
   EXPECT_EQ((std::unordered_map<S, int>{{long1, 3}}[long2]), 3);

@@ -5,7 +5,7 @@
 #include <iterator>
 #include <version>
 
-#include <utils/xstring.h>
+#include <utils/Utf.h>
 
 using mirel::string16;
 using mirel::string8;
@@ -31,7 +31,7 @@ int main() {
   std::transform(letters.begin(), letters.end(), std::back_inserter(wide),
                  [](char unit) { return static_cast<mirel::char16>(unit - 'a' + 'A'); });
   string8 upper;
-  mirel::Utf8FromUtf16(upper, wide.data(), wide.size());
+  mirel::Utf8FromUtf16(upper, wide);
 
   const xvector<mirel::char16> squares = {1, 4, 9, 16};
   const auto at = std::lower_bound(squares.begin(), squares.end(), 9);

@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <cstdio>
 
-#include <utils/xstring.h>
+#include <utils/Utf.h>
 
 using mirel::ssize_t;
 using mirel::string16;
@@ -39,8 +39,7 @@ int main() {
   string16 text;
   mirel::Utf16FromUtf8(text, "café");
   string8 upper;
-  const string16 wide = Upper(text);
-  mirel::Utf8FromUtf16(upper, wide.data(), wide.size());
+  mirel::Utf8FromUtf16(upper, Upper(text));
   std::printf("%d %s\n", CountUnits(text.c_str()), upper.c_str());
 }
 
