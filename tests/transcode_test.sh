@@ -40,28 +40,57 @@ yes 'GET /' | head -c 200000 >ascii
 check "from ascii" 0 "$transcode" -f ascii -t utf-16be ascii
 same "from ascii" out <(iconv -f ascii -t utf-16be ascii)
 
-# Faults before, at and behind the end of a block: the text before is printed, and the place named.
-while read -r encoding width fault; do
+# Faults before, at and behind the end of a block: the text before is printed, and the fault and its place named.
+while read -r encoding width fault reason; do
   for bytes in 2 65528 65530 65532 65533 65534 65535 65536 65537 65538 131070 131072; do
     [ $((bytes % width)) = 0 ] || continue
     units=$((bytes / width))
     { echo; head -c $((units - 1)) /dev/zero | tr '\0' x; } | iconv -f ascii -t "$encoding" >before
     { cat before; printf "$fault"; } >bad
+    place="byte $bytes (line 2, column $units)"
     check "$fault" 1 "$transcode" -f "$encoding" -t "${encoding/ascii/utf-8}" bad
     same "$fault at $bytes" out before
-    expect "$fault" "$(cat err)" "transcode: bad: not well-formed $encoding at byte $bytes (line 2, column $units)"
+    expect "$fault" "$(cat err)" "transcode: bad: $reason at $place"
+    check "$fault, check" 1 "$transcode" -f "$encoding" --check bad
+    expect "$fault, check" "$(cat out err)" "transcode: bad: $reason at $place"
+    check "$fault, replace" 0 "$transcode" -f "$encoding" --replace bad
+    expect "$fault, replace" "$(grep -c ' malformed sequences\? replaced,.* at '"${place/(/.}" err)" 1
+    cmp -s <(head -c $units out; printf '\357\277\275') <(head -c $((units + 3)) out) || fail "$fault: not replaced"
   done
 done <<'ROWS'
-utf-8 1 \377x
-utf-8 1 \342\202x
-utf-8 1 \355\240\200
-utf-8 1 \360\237\230
-utf-16le 2 \75\330x\0
-utf-16le 2 \0\334
-utf-16be 2 \330\75
-utf-16be 2 \0
-ascii 1 \303\251
+utf-8 1 \377x invalid byte
+utf-8 1 \342\202x truncated sequence
+utf-8 1 \355\240\200 surrogate in UTF-8
+utf-8 1 \360\237\230 truncated sequence
+utf-8 1 \300\257 overlong sequence
+utf-16le 2 \75\330x\0 unpaired surrogate
+utf-16le 2 \0\334 unpaired surrogate
+utf-16be 2 \330\75 unpaired surrogate
+utf-16be 2 \0 truncated sequence
+ascii 1 \303\251 byte above 7F
 ROWS
+
+# A million mutated lines, replaced as Python does.
+python3 - >mutated <<'PYTHON'
+import random, sys
+random.seed(1)
+pieces = [s.encode() for s in ("a", "é", "€", "\U0001F600")] * 3 + [
+    b"\xC0\xAF", b"\xE0\x9F\xBF", b"\xED\xA0\x80", b"\xF0\x8F\xBF", b"\xF4\x90\x80", b"\xE2\x82", b"\xF1\x80\x80", b"\x80"]
+for _ in range(1000000):
+    line = bytearray(b"".join(random.choices(pieces, k=4)))
+    line[random.randrange(len(line))] = random.randrange(11, 256)
+    sys.stdout.buffer.write(line + b"\n")
+PYTHON
+check "mutated" 0 "$transcode" --replace mutated
+python3 -c 'import sys
+sys.stdout.buffer.write(open("mutated", "rb").read().decode("utf-8", "replace").encode())' >replaced
+same "mutated" out replaced
+check "mutated, to utf-16le" 0 "$transcode" --replace -t utf-16le mutated
+same "mutated, to utf-16le" out <(iconv -f utf-8 -t utf-16le replaced)
+check "well-formed" 0 "$transcode" --check long
+expect "well-formed" "$(cat out err)" ""
+check "replaced" 0 "$transcode" --replace long
+expect "replaced" "$(cat err)" ""
 
 echo old >kept
 chmod 640 kept
@@ -85,6 +114,7 @@ ln -s loop2 loop1; ln -s loop1 loop2
 check "a loop of links" 1 "$transcode" -o loop1 in
 check "no such encoding" 2 "$transcode" --to ebcdic
 check "ascii output" 2 "$transcode" --to ascii
+check "check and output" 2 "$transcode" --check -o kept in
 
 # The sanitizers reserve more than any limit lets them.
 if bash -c "ulimit -v 32000; '$transcode' --help; exit" >/dev/null 2>&1; then
@@ -101,7 +131,7 @@ while read -r name wanted command; do
 done <<'ROWS'
 percent (\|\|transcode:[0-9]+%)+\|\| $transcode long | { sleep 1; cat >copy; }
 bytes (\|\|transcode:[0-9.]+MB)+\|\| { cat in; sleep 1; cat long; } | $transcode -o copy
-fault (\|\|transcode:.*MB)+\|\|transcode:-:not.*\| { cat in; sleep 1; cat long; head -c 1 in; } | $transcode -o copy
+fault (\|\|transcode:.*MB)+\|\|transcode:-:truncated.*\| { cat in; sleep 1; cat long; head -c 1 in; } | $transcode -o copy
 text G\|G\| { echo G; sleep 1; echo G; } | $transcode
 short () $transcode -o copy in
 quiet G\|G\| { echo G; sleep 1; echo G; } | $transcode -q -o copy; cat copy

@@ -12,40 +12,10 @@ using mirel::char16;
 /// What a pipe holds. A block stays in the cache while it is decoded, counted and written; from half to four
 /// times the size was no faster.
 constexpr ssize_t kBlock = 1 << 16;
-/// The most bytes of a sequence that isn't whole.
+/// The most bytes that a block leaves to the next one: of a UTF-8 sequence, or a unit and a half of UTF-16.
 constexpr ssize_t kMaxUnfinished = 3;
 
 unsigned char Byte(char c) { return static_cast<unsigned char>(c); }
-
-/// How many of the n bytes at p may belong to a sequence that the last of them don't finish. Whether it is
-/// well-formed will be seen when the rest is there.
-ssize_t Unfinished(const char* p, ssize_t n, Encoding encoding) {
-  switch (encoding) {
-  case Encoding::kUtf8:
-    for (ssize_t k = 1; k <= std::min(n, kMaxUnfinished); ++k) {
-      const unsigned byte = Byte(p[n - k]);
-      if (byte >= 0xC0) {
-        const ssize_t length = byte >= 0xF0 ? 4 : byte >= 0xE0 ? 3 : 2;
-        return k < length ? k : 0;
-      }
-      if (byte < 0x80)
-        break;
-    }
-    return 0;
-  case Encoding::kUtf16Le:
-  case Encoding::kUtf16Be: {
-    const ssize_t odd = n % 2;
-    const bool isUnit = n >= 2;
-    const unsigned high = isUnit ? Byte(p[n - odd - (encoding == Encoding::kUtf16Be ? 2 : 1)]) : 0;
-    const bool isLeadSurrogate = (high & 0xFC) == 0xD8;
-    return odd + (isLeadSurrogate ? 2 : 0);
-  }
-  case Encoding::kAscii: break;
-  }
-  return 0;
-}
-
-bool IsUtf16(Encoding encoding) { return encoding == Encoding::kUtf16Le || encoding == Encoding::kUtf16Be; }
 
 /// Whether the machine keeps units in the other byte order than the encoding does.
 bool IsOtherOrder(Encoding encoding) {
@@ -76,54 +46,139 @@ ssize_t AsciiLength(const char* p, ssize_t n) {
   return std::find_if(p, p + n, [](char c) { return Byte(c) >= 0x80; }) - p;
 }
 
+mirel::OnMalformed PolicyOf(Mode mode) {
+  return mode == Mode::kReplace ? mirel::OnMalformed::kReplace : mirel::OnMalformed::kStop;
+}
+
 } // namespace
 
-Blocks::Blocks(Input& input, Encoding from)
-    : m_input(input), m_from(from), m_buffer(kBlock + kMaxUnfinished, '\0') {}
+Blocks::Blocks(Input& input, Encoding from, Mode mode)
+    : m_input(input), m_from(from), m_mode(mode), m_toUtf16(PolicyOf(mode)), m_toUtf8(PolicyOf(mode)),
+      m_buffer(kBlock + kMaxUnfinished, '\0') {}
 
 bool Blocks::Next() {
   bool isEnd = false;
+  m_fault.reset();
   do {
     m_buffer.move(0, m_size, m_filled - m_size);
     m_filled -= m_size;
-    const ssize_t count = m_input.Read(m_buffer.data() + m_filled, kBlock);
+    const ssize_t fed = m_filled, count = m_input.Read(m_buffer.data() + fed, kBlock);
     m_filled += count;
     isEnd = count == 0;
-    m_size = isEnd ? m_filled : m_filled - Unfinished(m_buffer.data(), m_filled, m_from);
-  } while (m_size == 0 && !isEnd);
-  const ssize_t wellFormed = Decode();
-  m_isWellFormed = wellFormed == m_size;
-  m_size = wellFormed;
-  return m_filled != 0;
+    if (m_filled == 0)
+      return false;
+    Decode(fed, isEnd);
+  } while (m_size == 0 && !isEnd && !m_fault);
+  return true;
 }
 
-/// Converts the block as far as it is well-formed. @return how many bytes that are
-ssize_t Blocks::Decode() {
-  const char* const p = m_buffer.data();
-  switch (m_from) {
-  case Encoding::kUtf8:
-    if (mirel::Utf16FromUtf8(m_text, p, m_size))
-      return m_size;
-    mirel::Utf8FromUtf16(m_back, m_text.data(), m_text.size());
-    return m_back.size();
-  case Encoding::kUtf16Le:
-  case Encoding::kUtf16Be:
-    m_text.resize(m_size / 2, 0);
-    if (m_size >= 2)
-      std::memcpy(m_text.data(), p, 2 * static_cast<std::size_t>(m_text.size()));
-    if (IsOtherOrder(m_from))
-      ExchangeBytes(m_text);
-    if (!mirel::Utf8FromUtf16(m_utf8, m_text.data(), m_text.size()))
-      mirel::Utf16FromUtf8(m_text, m_utf8.data(), m_utf8.size());
-    return 2 * m_text.size();
-  case Encoding::kAscii: break;
+/// Sets the block to what is well-formed or replaced; its first bytes, as many as fed, were seen before.
+void Blocks::Decode(ssize_t fed, bool isEnd) {
+  const ssize_t before = m_replacements;
+  if (IsUtf16(m_from))
+    DecodeUtf16(isEnd);
+  else if (m_from == Encoding::kAscii)
+    DecodeAscii();
+  else if (m_mode == Mode::kCheck)
+    m_size = Check(m_buffer.data(), m_filled, isEnd);
+  else
+    DecodeUtf8(fed, isEnd);
+  m_isReplaced = m_replacements != before;
+  if (!m_isReplaced)
+    return;
+  if (IsUtf16(m_from))
+    mirel::Utf16FromUtf8(m_text, m_utf8);
+  else
+    mirel::Utf8FromUtf16(m_utf8, m_text);
+}
+
+void Blocks::DecodeUtf8(ssize_t fed, bool isEnd) {
+  const ssize_t begin = m_toUtf16.position() - fed;
+  m_text.clear();
+  if (isEnd)
+    m_toUtf16.Finish(m_text);
+  else
+    m_toUtf16.Append(m_text, m_buffer.data() + fed, m_filled - fed);
+  m_size = m_filled - m_toUtf16.pending();
+  if (Note(m_toUtf16, begin, 1))
+    m_size = m_fault->offset;
+}
+
+void Blocks::DecodeUtf16(bool isEnd) {
+  m_text.resize(m_filled / 2, 0);
+  if (m_filled >= 2)
+    std::memcpy(m_text.data(), m_buffer.data(), 2 * static_cast<std::size_t>(m_text.size()));
+  if (IsOtherOrder(m_from))
+    ExchangeBytes(m_text);
+  const ssize_t fed = m_toUtf8.pending(), begin = m_toUtf8.position() - fed;
+  m_utf8.clear();
+  if (m_mode == Mode::kCheck) {
+    m_text.resize(Check(m_text.data(), m_text.size(), isEnd), 0);
+  } else {
+    m_toUtf8.Append(m_utf8, m_text.data() + fed, m_text.size() - fed);
+    if (isEnd)
+      m_toUtf8.Finish(m_utf8);
+    m_text.resize(m_text.size() - m_toUtf8.pending(), 0);
+    if (Note(m_toUtf8, begin, 2))
+      m_text.resize(m_fault->offset / 2, 0);
   }
-  const ssize_t length = AsciiLength(p, m_size);
-  mirel::Utf16FromAscii(m_text, p, length);
-  return length;
+  m_size = 2 * m_text.size();
+  if (isEnd && m_filled % 2 != 0 && m_size + 1 == m_filled)
+    EndOddly();
 }
 
-std::string_view Blocks::Utf8() const { return IsUtf16(m_from) ? BytesOf(m_utf8) : Bytes(); }
+/// The input ends with half a unit.
+void Blocks::EndOddly() {
+  if (m_mode == Mode::kReplace) {
+    mirel::AppendCodePoint(m_utf8, 0xFFFD);
+    m_size = m_filled;
+  }
+  if (m_replacements == 0)
+    m_fault = Fault{m_filled - 1, Describe(mirel::MalformedReason::kTruncated)};
+  m_replacements += m_mode == Mode::kReplace;
+}
+
+void Blocks::DecodeAscii() {
+  m_size = AsciiLength(m_buffer.data(), m_filled);
+  mirel::Utf16FromAscii(m_text, m_buffer.data(), m_size);
+  if (m_size == m_filled)
+    return;
+  if (m_replacements == 0)
+    m_fault = Fault{m_size, "byte above 7F"};
+  if (m_mode != Mode::kReplace)
+    return;
+  for (; m_size < m_filled; ++m_size) {
+    const bool isAscii = Byte(m_buffer[m_size]) < 0x80;
+    mirel::AppendCodePoint(m_text, isAscii ? Byte(m_buffer[m_size]) : 0xFFFD);
+    m_replacements += !isAscii;
+  }
+}
+
+/// How many of n units are well-formed. Those that the next block may complete, as a stream would keep them,
+/// are left for then.
+template <class T> ssize_t Blocks::Check(const T* p, ssize_t n, bool isEnd) {
+  const ssize_t size = mirel::FindMalformed(p, n);
+  if (size < 0)
+    return n;
+  const mirel::MalformedText malformed = mirel::ExplainMalformed(p, n, size);
+  std::conditional_t<sizeof(T) == 1, mirel::Utf8Stream, mirel::Utf16Stream> rest;
+  std::conditional_t<sizeof(T) == 1, string16, string8> none;
+  if (isEnd || size + malformed.length < n || !rest.Append(none, p + size, malformed.length))
+    m_fault = Fault{size * ssize_t(sizeof(T)), Describe(malformed.reason)};
+  return size;
+}
+
+/// Notes what a stream has found in a block that begins with the given unit. @return whether the block ends
+/// there
+template <class Stream> bool Blocks::Note(const Stream& stream, ssize_t begin, ssize_t unitBytes) {
+  const mirel::MalformedText& malformed = stream.malformed();
+  if (malformed.offset >= begin && m_replacements == 0)
+    m_fault = Fault{(malformed.offset - begin) * unitBytes, Describe(malformed.reason)};
+  m_replacements = stream.replacements();
+  return m_fault && m_mode != Mode::kReplace;
+}
+
+std::string_view Blocks::Utf8() const { return IsUtf16(m_from) || m_isReplaced ? BytesOf(m_utf8) : Bytes(); }
 
 std::string_view Blocks::In(Encoding to) {
   if (!IsUtf16(to))

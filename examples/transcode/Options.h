@@ -21,6 +21,7 @@ struct Options {
   Encoding to = Encoding::kUtf8;
   std::string input = "-";
   std::string output; ///< empty when not given
+  Mode mode = Mode::kConvert;
   bool report = false;
   bool quiet = false;
   bool help = false;

@@ -1,7 +1,9 @@
 #include "Statistics.h"
 
 #include <algorithm>
+#include <iterator>
 #include <limits>
+#include <type_traits>
 
 #include <utils/xostream.h>
 
@@ -13,22 +15,18 @@ using mirel::char16;
 
 /// How many units of [p, end) are of a kind. The inner loop counts in units, which lets compilers look at as
 /// many of them at once as there are in a wide register.
-template <class Predicate> ssize_t Count(const char16* p, const char16* end, Predicate isOfKind) {
-  constexpr ssize_t kMax = std::numeric_limits<char16>::max();
+template <class T, class Predicate> ssize_t Count(const T* p, const T* end, Predicate isOfKind) {
+  using Counter = std::make_unsigned_t<T>;
+  constexpr ssize_t kMax = std::numeric_limits<Counter>::max();
   ssize_t total = 0;
   while (p != end) {
-    const char16* const stop = p + std::min(end - p, kMax);
-    char16 count = 0;
+    const T* const stop = p + std::min(end - p, kMax);
+    Counter count = 0;
     for (; p != stop; ++p)
-      count = static_cast<char16>(count + isOfKind(*p));
+      count = static_cast<Counter>(count + isOfKind(*p));
     total += count;
   }
   return total;
-}
-
-/// A pair of surrogates is counted by the first of them.
-ssize_t CodePoints(const char16* p, const char16* end) {
-  return Count(p, end, [](char16 unit) { return (unit & 0xFC00) != 0xDC00; });
 }
 
 /// A sink that keeps what it is given.
@@ -42,28 +40,40 @@ struct MemorySink : mirel::IOutputStream {
 
 } // namespace
 
-void Statistics::Advance(const Blocks& block) {
-  const string16& text = block.Text();
-  m_bytes += static_cast<ssize_t>(block.Bytes().size());
-  const ssize_t newlines = Count(text.begin(), text.end(), [](char16 unit) { return unit == '\n'; });
-  const char16* lastLine = text.begin();
+void Statistics::Advance(const Blocks& block, ssize_t bytes) {
+  m_bytes += bytes;
+  if (IsUtf16(block.From()))
+    AdvanceOver(block.Text().data(), bytes / 2);
+  else
+    AdvanceOver(block.Bytes().data(), bytes);
+}
+
+template <class T> void Statistics::AdvanceOver(const T* p, ssize_t n) {
+  const ssize_t newlines = Count(p, p + n, [](T unit) { return unit == '\n'; });
+  const T* lastLine = p;
   if (newlines > 0) {
-    lastLine += text.rfind('\n') + 1;
+    lastLine = std::find(std::reverse_iterator(p + n), std::reverse_iterator(p), T('\n')).base();
     m_column = 0;
   }
   m_newlines += newlines;
-  m_column += CodePoints(lastLine, text.end());
+  m_column += mirel::CountCodePoints(lastLine, p + n - lastLine);
+}
+
+std::string Statistics::PlaceIn(const Blocks& block, ssize_t offset) const {
+  Statistics there = *this;
+  there.Advance(block, offset);
+  return there.Place();
 }
 
 void Statistics::Examine(Blocks& block) {
   const string16& text = block.Text();
   m_utf8Units += static_cast<ssize_t>(block.Utf8().size());
   m_utf16Units += text.size();
-  m_codePoints += CodePoints(text.begin(), text.end());
+  m_codePoints += mirel::CountCodePoints(text);
   m_asciiCodePoints += Count(text.begin(), text.end(), [](char16 unit) { return unit < 0x80; });
   for (const char16* p = text.begin(); p != text.end();) {
     const char16* const lineEnd = mirel::Find(p, text.end(), char16('\n'));
-    m_line += CodePoints(p, lineEnd);
+    m_line += mirel::CountCodePoints(p, lineEnd - p);
     m_longestLine = std::max(m_longestLine, m_line);
     p = lineEnd;
     if (p != text.end()) {
@@ -77,6 +87,19 @@ void Statistics::Examine(Blocks& block) {
 std::string Statistics::Place() const {
   return "byte " + std::to_string(m_bytes) + " (line " + std::to_string(m_newlines + 1) + ", column " +
          std::to_string(m_column + 1) + ")";
+}
+
+void Statistics::SetReplacements(ssize_t count, const std::string& first) {
+  m_replacements = count;
+  m_firstReplaced = first;
+}
+
+std::string Statistics::Replaced() const {
+  if (m_replacements == 0)
+    return "";
+  if (m_replacements == 1)
+    return "1 malformed sequence replaced, at " + m_firstReplaced;
+  return std::to_string(m_replacements) + " malformed sequences replaced, the first at " + m_firstReplaced;
 }
 
 string8 Statistics::Report(const std::string& title) const {

@@ -13,17 +13,24 @@ namespace transcode {
 /// A line ends with a newline, which isn't counted to it; what follows the last newline is a line too.
 class Statistics {
 public:
-  /// Counts what tells where the text has got to.
-  void Advance(const Blocks& block);
+  /// Counts what tells where the text has got to, in as many bytes of the block.
+  void Advance(const Blocks& block, ssize_t bytes);
   /// Counts the rest of what the report tells. Comes after Advance with the same block.
   void Examine(Blocks& block);
 
-  /// The place where the next block would start, in words: "byte 12 (line 2, column 1)".
-  std::string Place() const;
+  /// The place at an offset of the block that comes next, in words: "byte 12 (line 2, column 1)".
+  std::string PlaceIn(const Blocks& block, ssize_t offset) const;
+  /// Notes how many malformed sequences were replaced, and where the first was.
+  void SetReplacements(ssize_t count, const std::string& first);
+  /// Both in words: "2 malformed sequences replaced, the first at byte 3 (line 1, column 4)", or nothing.
+  std::string Replaced() const;
   /// The table of it all under the given title.
   string8 Report(const std::string& title) const;
 
 private:
+  std::string Place() const;
+  template <class T> void AdvanceOver(const T* p, ssize_t n);
+
   ssize_t m_bytes = 0;
   ssize_t m_newlines = 0;
   ssize_t m_column = 0; ///< code points behind the last newline
@@ -34,6 +41,8 @@ private:
   ssize_t m_longestLine = 0;
   ssize_t m_line = 0; ///< code points of the line that goes on in the next block
   bool m_comesBack = true;
+  ssize_t m_replacements = 0;
+  std::string m_firstReplaced;
 };
 
 } // namespace transcode

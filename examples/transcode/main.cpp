@@ -29,26 +29,31 @@ void Print(std::string_view text) { Output("-").Write(text); }
 /// Takes the whole input to the output, if there is one.
 Statistics Convert(const Options& options, Input& input, Output* output) {
   Statistics statistics;
-  Blocks blocks(input, options.from);
+  Blocks blocks(input, options.from, options.mode);
+  std::string firstFault;
   Progress progress(!options.quiet && !(output && output->IsTerminal()), input.BytesLeft());
   while (blocks.Next()) {
     if (output)
       output->Write(blocks.In(options.to));
-    statistics.Advance(blocks);
-    if (!blocks.IsWellFormed())
-      throw std::runtime_error(options.input + ": not well-formed " + Name(options.from) + " at " +
-                               statistics.Place());
+    if (const auto& fault = blocks.FirstFault()) {
+      const std::string place = statistics.PlaceIn(blocks, fault->offset);
+      if (options.mode != Mode::kReplace)
+        throw std::runtime_error(options.input + ": " + fault->reason + " at " + place);
+      firstFault = place;
+    }
+    statistics.Advance(blocks, static_cast<ssize_t>(blocks.Bytes().size()));
     if (options.report)
       statistics.Examine(blocks);
     progress.Add(static_cast<ssize_t>(blocks.Bytes().size()));
   }
+  statistics.SetReplacements(blocks.Replacements(), firstFault);
   return statistics;
 }
 
 void Run(const Options& options) {
   Input input(options.input);
   std::optional<Output> output;
-  if (!options.report || !options.output.empty()) {
+  if (options.mode != Mode::kCheck && (!options.report || !options.output.empty())) {
     output.emplace(options.output.empty() ? "-" : options.output);
     if (output->IsFedBackTo(input))
       throw std::runtime_error(options.input + ": is the output too");
@@ -56,6 +61,8 @@ void Run(const Options& options) {
   const Statistics statistics = Convert(options, input, output ? &*output : nullptr);
   if (output)
     output->Finish();
+  if (const std::string replaced = statistics.Replaced(); !replaced.empty())
+    std::fprintf(stderr, "transcode: %s: %s\n", options.input.c_str(), replaced.c_str());
   if (options.report) {
     const string8 report = statistics.Report(options.input + ", " + Name(options.from));
     Print({report.data(), static_cast<std::size_t>(report.size())});

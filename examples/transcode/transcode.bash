@@ -10,7 +10,7 @@ _transcode() {
   -f | --from) words='utf-8 utf-16le utf-16be ascii' ;;
   -t | --to) words='utf-8 utf-16le utf-16be' ;;
   -o | --output) ;;
-  *) [[ $word != -* ]] || words='--from --to --output --report --quiet --help --version' ;;
+  *) [[ $word != -* ]] || words='--from --to --output --report --replace --check --quiet --help --version' ;;
   esac
   if [ -n "$words" ]; then
     mapfile -t COMPREPLY < <(compgen -W "$words" -- "$word")
