@@ -19,7 +19,7 @@ block cpp >"$root/program/program.cpp"
   block cmake
 } >"$root/program/CMakeLists.txt"
 
-LC_ALL=C.UTF-8 DEBIAN_FRONTEND=noninteractive chroot "$root" /bin/bash -euo pipefail <<'BARE'
+cat >"$root/tmp/check" <<'BARE'
 quietly() { "$@" >/tmp/log 2>&1 || { cat /tmp/log; echo "failed: $*"; exit 1; }; }
 files() {
   find / -xdev \( -path /proc -o -path /tmp -o -path /var/lib/dpkg -o -path /var/cache -o -path /var/log \) -prune \
@@ -47,9 +47,10 @@ expect 'Grüße' sh -c "printf Grüße | transcode --to=utf-16be | transcode --f
 version=$(dpkg-query -W -f '${Version}' libmirel-dev)
 expect "transcode (mirel) $version" transcode --version
 expect "$version" pkg-config --modversion mirel
-test -e /usr/share/doc/libmirel-doc/html/index.html
+ls /usr/share/doc/libmirel-doc/html/index.html >/tmp/log
 quietly apt-get purge -y $(dpkg-query -W -f '${Package}\n' '*mirel*')
 files | diff /tmp/before -
 echo "$version: installed, used and removed, and nothing left"
 BARE
+LC_ALL=C.UTF-8 DEBIAN_FRONTEND=noninteractive chroot "$root" /bin/bash -euo pipefail /tmp/check </dev/null
 rm -rf "$root"
