@@ -49,6 +49,7 @@ make_base() {
 }
 
 mkdir -p "$out"
+trap wait EXIT # leaves nothing behind that still works on the root
 make_base &
 base=$!
 build amd64 -b

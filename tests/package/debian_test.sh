@@ -22,8 +22,8 @@ block cpp >"$root/program/program.cpp"
 cat >"$root/tmp/check" <<'BARE'
 quietly() { "$@" >/tmp/log 2>&1 || { cat /tmp/log; echo "failed: $*"; exit 1; }; }
 files() {
-  find / -xdev \( -path /proc -o -path /tmp -o -path /var/lib/dpkg -o -path /var/cache -o -path /var/log \) -prune \
-    -o -type d -print -o -printf '%p %s %l\n' | sort
+  find / -xdev \( -path /proc -o -path /tmp -o -path /var/lib/dpkg -o -path /var/lib/apt -o -path /var/cache \
+    -o -path /var/log \) -prune -o -type d -print -o -printf '%p %s %l\n' | sort
 }
 expect() { # WANTED COMMAND...
   local got
