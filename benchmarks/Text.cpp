@@ -153,6 +153,8 @@ void RegisterWalks(const Language& language, std::size_t size) {
                      sum += c;
                    return sum;
                  }));
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wsign-conversion" // within the macro
   walk16.Against("ICU", Over(utf16, [](const std::u16string& s) {
                    long long sum = 0;
                    const auto end = static_cast<int32_t>(s.size());
@@ -161,38 +163,50 @@ void RegisterWalks(const Language& language, std::size_t size) {
                      U16_NEXT(s.data(), i, end, c);
                    return sum;
                  }));
+#pragma GCC diagnostic pop
 }
 
-/// What the strict conversion of the text comes to, called again behind each fault, with one unit for that.
-template <class Dst, class Unit, class Convert>
-ssize_t StrictAgain(Dst& dst, const Unit* p, const Unit* end, const Convert& convert) {
+/// What the strict conversion of the text comes to, called again behind each FF, with one unit for that.
+ssize_t StrictAgain(mirel::string16& dst, const char* p, const char* end) {
   ssize_t units = 0;
-  while (!convert(dst, p, end - p)) {
+  while (!mirel::Utf16FromUtf8(dst, p, end - p)) {
     units += dst.size() + 1;
-    p = std::find(p, end, Unit(0xFF)) + 1; // the faults of these texts
+    p = std::find(p, end, '\xFF') + 1;
   }
   return units + dst.size();
 }
 
-/// Text with an FF at about every tenth byte, where that is malformed, or without.
+/// Puts a malformed unit at about every tenth. @return how many
+template <class Unit> ssize_t Spoil(std::basic_string<Unit>& text, Unit malformed) {
+  ssize_t count = 0;
+  for (std::size_t at = 10; at < text.size(); at += 11, ++count)
+    text.insert(at = BoundaryNear(text, at), 1, malformed);
+  return count;
+}
+
+/// Well-formed text, or the same with an FF at about every tenth byte; then our strict conversion stands for
+/// itself on the well-formed text, and again called behind each fault.
 void RegisterLossy(const Language& language, std::size_t size, bool isMalformed) {
-  auto& texts = *new std::vector<std::string>(TextsIn<char>(language, size));
-  const char* const work = isMalformed ? "lossy, malformed every 10 bytes" : "lossy, well-formed";
-  if (isMalformed)
-    for (std::string& text : texts)
-      for (std::size_t at = 10; at < text.size(); at += 11)
-        text.insert(at = BoundaryNear(text, at), 1, '\xFF');
+  const auto& wellFormed = *new std::vector<std::string>(TextsIn<char>(language, size));
+  auto& texts = *new std::vector<std::string>(wellFormed);
+  const ssize_t faults = isMalformed ? Spoil(texts[0], '\xFF') : 0;
   static auto& wide = *new mirel::string16;
-  Case lossy("Lossy conversions", std::string(work) + ", UTF-8 to UTF-16", language.name, size, "bytes");
+  Case lossy("Lossy conversions",
+             std::string(isMalformed ? "lossy, malformed" : "lossy, well-formed") + ", UTF-8 to UTF-16",
+             language.name, size, "bytes");
   lossy.Against("ours", Over(texts, [](const std::string& s) {
                   mirel::Utf16FromUtf8Lossy(wide, s.data(), Size(s));
                   return wide.size();
                 }));
-  lossy.Against("our strict one", Over(texts, [](const std::string& s) {
-                  return StrictAgain(
-                      wide, s.data(), s.data() + s.size(),
-                      [](auto& to, const char* p, ssize_t n) { return Utf16FromUtf8(to, p, n); });
+  lossy.Against(isMalformed ? "our strict one, well-formed" : "our strict one",
+                Over(wellFormed, [faults](const std::string& s) {
+                  mirel::Utf16FromUtf8(wide, s.data(), Size(s));
+                  return wide.size() + faults;
                 }));
+  if (isMalformed)
+    lossy.Against("our strict one, again and again", Over(texts, [](const std::string& s) {
+                    return StrictAgain(wide, s.data(), s.data() + s.size());
+                  }));
   lossy.Against("ICU", Over(texts, [](const std::string& s) {
                   static auto& buffer = *new std::vector<char16_t>(kMaxUnits + 64);
                   int32_t n = 0;
@@ -208,26 +222,24 @@ void RegisterLossy(const Language& language, std::size_t size, bool isMalformed)
 #endif
 }
 
-/// The way back, of the same texts; malformed, with a low surrogate at about every tenth unit.
+/// The way back; malformed, with a low surrogate at about every tenth unit.
 void RegisterLossyBack(const Language& language, std::size_t size, bool isMalformed) {
-  auto& texts = *new std::vector<std::u16string>(TextsIn<char16_t>(language, size));
-  const char* const work = isMalformed ? "lossy, malformed every 10 units" : "lossy, well-formed";
-  if (isMalformed)
-    for (std::u16string& text : texts)
-      for (std::size_t at = 10; at < text.size(); at += 11)
-        text.insert(at = BoundaryNear(text, at), 1, u'\xDC00');
+  const auto& wellFormed = *new std::vector<std::u16string>(TextsIn<char16_t>(language, size));
+  auto& texts = *new std::vector<std::u16string>(wellFormed);
+  const ssize_t faults = isMalformed ? Spoil(texts[0], u'\xDC00') : 0;
   static auto& narrow = *new mirel::string8;
-  Case lossy("Lossy conversions", std::string(work) + ", UTF-16 to UTF-8", language.name, size,
-             "16-bit units");
+  Case lossy("Lossy conversions",
+             std::string(isMalformed ? "lossy, malformed" : "lossy, well-formed") + ", UTF-16 to UTF-8",
+             language.name, size, "16-bit units");
   lossy.Against("ours", Over(texts, [](const std::u16string& s) {
                   mirel::Utf8FromUtf16Lossy(narrow, Units(s), Size(s));
                   return narrow.size();
                 }));
-  if (!isMalformed)
-    lossy.Against("our strict one", Over(texts, [](const std::u16string& s) {
-                    mirel::Utf8FromUtf16(narrow, Units(s), Size(s));
-                    return narrow.size();
-                  }));
+  lossy.Against(isMalformed ? "our strict one, well-formed" : "our strict one",
+                Over(wellFormed, [faults](const std::u16string& s) {
+                  mirel::Utf8FromUtf16(narrow, Units(s), Size(s));
+                  return narrow.size() + faults * 3; // bytes of U+FFFD
+                }));
   lossy.Against("ICU", Over(texts, [](const std::u16string& s) {
                   static auto& buffer = *new std::vector<char>(3 * kMaxUnits + 64);
                   int32_t n = 0;
