@@ -104,28 +104,6 @@ TYPED_TEST(Overload, ReverseSearchesFromTheFirstUnit) {
   check(r.begin(), r.end(), 0), check(list.begin(), list.end(), 0), check(r.data(), 0, 1);
 }
 
-// Calls with a string and a pointer, to be asked whether they would compile.
-#define CALL(EXPRESSION) [](auto&& s, auto p) -> decltype(EXPRESSION, void()) { static_cast<void>(s), p; }
-
-TYPED_TEST(Overload, LiteralNullIsNoString) {
-  const auto check = [](auto... calls) {
-    using S = basic_xstring<TypeParam>;
-    EXPECT_TRUE((std::is_invocable_v<decltype(calls), S, const TypeParam*> && ...));
-    EXPECT_FALSE((std::is_invocable_v<decltype(calls), S, std::nullptr_t> || ...));
-  };
-  check(CALL(s = p), CALL(s += p), CALL(s.assign(p)), CALL(s.append(p)), CALL(s._Eq(p)), CALL(s.insert(0, p)),
-        CALL(s.replace(0, 0, p)), CALL(s.compare(p)), CALL(s._Lt(p)), CALL(s.compare(0, 0, p)),
-        CALL(s.find(p)), CALL(s.rfind(p, 0)), CALL(s.find_first_of(p)), CALL(s.find_last_of(p)),
-        CALL(s.find_first_not_of(p)), CALL(s.find_last_not_of(p, 0)));
-}
-
-template <class V> using Vector = xvector<typename V::value_type>;
-template <class V, class = void> constexpr bool kFindsInConst = false;
-template <class V>
-constexpr bool kFindsInConst<
-    V, std::void_t<decltype(std::declval<const V&>().find_first_of(std::declval<const Vector<V>&>()))>> =
-    true;
-
 TYPED_TEST(Overload, DeclaredSignatures) {
   using T = TypeParam;
   using V = xvector<T>;
@@ -133,7 +111,6 @@ TYPED_TEST(Overload, DeclaredSignatures) {
   static_assert(sizeof(S) == sizeof(VectorOfByte) && !std::is_polymorphic_v<S>);
   static_assert(std::is_same_v<decltype(V() + V()), const V> && std::is_same_v<decltype(S() + 'x'), const V>);
   static_assert(std::is_same_v<decltype(std::declval<S>().substr(0)), S>);
-  static_assert(!kFindsInConst<V> && !kFindsInConst<S>);
   static_assert(std::is_convertible_v<const T*, S> && !std::is_convertible_v<const T*, V>);
   static_assert(!std::is_default_constructible_v<typename V::reverse_iterator>);
   static_assert(std::is_nothrow_destructible_v<S> && std::is_nothrow_destructible_v<VectorOfByte>);

@@ -137,11 +137,14 @@ template <class T> void CheckText(const Text<T>& text) {
 }
 
 const Text<char8> kPieces8[] = {
-    "a", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xED\x9F\xBF", "\xF4\x8F\xBF\xBF",
-    // malformed: overlong, surrogates, beyond U+10FFFF, cut off, invalid
-    "\xC0\xAF", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xF0\x8F\xBF\xBF", "\xF4\x90\x80\x80", "\xF5\x80\x80\x80",
-    "\x80", "\xC3", "\xE2\x82", "\xE0\xA0", "\xF0\x9F\x98", "\xF1\x80", "\xFF"};
-const Text<char16> kPieces16[] = {{'a'},    {0xE9},   {0x20AC}, {0xD83D, 0xDE00}, {0x7FF},
+    "a", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xDF\xBF", "\xEF\xBC\x8C", "\xED\x9F\xBF",
+    "\xF4\x8F\xBF\xBF",
+    // malformed: overlong, surrogates, beyond U+10FFFF, cut off or wrong in one byte, invalid
+    "\xC0\xAF", "\xC1\xA9", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xF0\x8F\xBF\xBF", "\xF4\x90\x80\x80",
+    "\xF5\x80\x80\x80", "\x80", "\xC3", "\xE1", "\xE2\x82", "\xE0\xA0", "\xF0\x9F\x98", "\xF1\x80", "\xFF",
+    "\xC3 ", "\x82\xAC", "\xC3\xA9\xA9", "\xE1 \xAC", "\xE1\x82 ", "\xE2\xC0\xAC", "\xF0\xA0\x80 "};
+const Text<char16> kPieces16[] = {{'a'},    {0xE9},   {0x20AC}, {0xD83D, 0xDE00}, {0x7F},
+                                  {0x80},   {0x7FF},  {0x800},  {0xFF0C},         {0xDBFF, 0xDFFF},
                                   {0xD800}, {0xDFFF}, {0xDBFF}, {0xDC00, 0xD800}};
 const auto& Pieces(char8) { return kPieces8; }
 const auto& Pieces(char16) { return kPieces16; }
@@ -151,7 +154,7 @@ const auto& Pieces(char16) { return kPieces16; }
 template <class T, class Random> Text<T> Mixture(Random& random, std::size_t size) {
   const auto& pieces = Pieces(T());
   const auto kinds = random(), rarity = 1 + random() % 60;
-  constexpr std::size_t kWellFormed = sizeof(T) == 1 ? 6 : 5;
+  constexpr std::size_t kWellFormed = sizeof(T) == 1 ? 8 : 10;
   Text<T> text;
   while (text.size() < size) {
     const std::size_t kind = random() % (random() % rarity == 0 ? std::size(pieces) : kWellFormed);
@@ -171,16 +174,18 @@ template <class T, class Random> Text<T> Mixture(Random& random, std::size_t siz
 template <class T> class UtfText : public testing::Test {};
 TYPED_TEST_SUITE(UtfText, CodeUnits);
 
+/// One or two sequences between n of another kind on both sides: kinds of blocks, places in them, and blocks'
+/// ends.
 TYPED_TEST(UtfText, OneOrTwoAmongOthers) {
   const auto& pieces = Pieces(TypeParam());
-  for (std::size_t n = 0; n < 70; ++n)
+  for (std::size_t n = 0; n < 135; ++n)
     for (const auto& filler : {pieces[0], pieces[1], pieces[2], pieces[3]})
       for (const auto& one : pieces) {
         Text<TypeParam> text;
         for (std::size_t k = 0; k < n; ++k)
           text += filler;
-        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one));
-        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + pieces[n % std::size(pieces)] + text));
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + text));
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + pieces[n % std::size(pieces)]));
       }
 }
 

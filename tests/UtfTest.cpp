@@ -55,30 +55,6 @@ TEST(Utf, SurrogatesMustPair) {
         ASSERT_NO_FATAL_FAILURE(CheckAmongLetters(Text<char16>{a, b, c}));
 }
 
-/// One sequence between n of another kind on both sides: kinds of blocks, places in them, and blocks' ends.
-TEST(Utf, OneThatIsDifferent) {
-  const char8* const bytes[] = {"a", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xDF\xBF",
-                                "\xEF\xBC\x8C", "\xED\x9F\xBF", "\xF4\x8F\xBF\xBF",
-                                // overlong, surrogates, beyond U+10FFFF, cut off or wrong in one byte
-                                "\xC1\xA9", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xF0\x8F\xBF\xBF",
-                                "\xF4\x90\x80\x80", "\xF5\x80\x80\x80", "\xC3", "\xE1", "\xE1\x82",
-                                "\xF0\x9F\x98", "\xFF", "\xC3 ", "\x82\xAC", "\xC3\xA9\xA9", "\xE1 \xAC",
-                                "\xE1\x82 ", "\xE2\xC0\xAC", "\xF0\xA0\x80 "};
-  const Text<char16> units[] = {{'a'},   {0xE9},   {0x20AC}, {0xD83D, 0xDE00}, {0x7F},   {0x80},
-                                {0x7FF}, {0x0800}, {0xFF0C}, {0xDBFF, 0xDFFF}, {0xD83D}, {0xDE00}};
-  for (std::size_t n = 0; n < 135; ++n)
-    for (int filler = 0; filler < 4; ++filler) {
-      Text<char8> text8;
-      Text<char16> text16;
-      for (std::size_t k = 0; k < n; ++k)
-        text8 += bytes[filler], text16 += units[filler];
-      for (const char8* one : bytes)
-        ASSERT_NO_FATAL_FAILURE(CheckExactly<char8>(text8 + one + text8));
-      for (const Text<char16>& one : units)
-        ASSERT_NO_FATAL_FAILURE(CheckExactly<char16>(text16 + one + text16));
-    }
-}
-
 TEST(Utf, CutOffAtEveryPlace) {
   Text<char8> text;
   Text<char16> units;
