@@ -74,6 +74,7 @@ TYPED_TEST(Overload, LiteralZeroIsANumber) {
   EXPECT_TRUE(S(nullptr, 0).empty() && S(nullptr, nullptr).empty() && xvector<TypeParam>(nullptr, 0).empty());
   EXPECT_EQ(xvector<TypeParam>(r.data(), 0).size(), 0);
   s = {};
+  EXPECT_EQ(s.size(), 0);
   enum { kZero };
   s.replace(s.begin(), s.end(), 0, 0x41), s.insert(0, kZero, x), s.insert(s.begin(), 0, 0x41),
       s.replace(0, 0, kZero, x);
