@@ -42,10 +42,12 @@ compare_interfaces() {
 make_base() {
   [ ! -e "$out/base.tar" ] || return 0
   local format='deb $(REPO_URI) $(RELEASE) $(COMPONENT)'
+  # Where apt has no lists, it doesn't know yet which of its archives are Debian's.
+  [ -n "$(apt-get indextargets 'Created-By: Packages' 'Origin: Debian')" ] || $as_root apt-get update >/dev/null
   apt-get indextargets --format "$format" 'Created-By: Packages' 'Origin: Debian' >"$out/sources.list"
-  $as_root mmdebstrap --quiet --mode=root --variant=apt --include=g++,make,cmake,pkg-config '' "$out/base.tar.part" \
+  $as_root mmdebstrap --quiet --mode=root --variant=apt --include=g++,make,cmake,pkg-config '' "$out/partial.tar" \
     "$out/sources.list"
-  mv "$out/base.tar.part" "$out/base.tar"
+  mv "$out/partial.tar" "$out/base.tar"
 }
 
 mkdir -p "$out"
