@@ -41,6 +41,10 @@ inline const TextKernels<char16>& TextKernelsOf(const Kernels& kernels, const ch
   return kernels.text16;
 }
 
+/// Shorter texts are decoded one code point at a time in the time that a kernel takes to copy them into a
+/// block.
+constexpr ssize_t kLeastForKernels = 24;
+
 /// After malformed text, so many units must be well-formed before the kernels are tried again: where faults
 /// are dense, each trial would be in vain.
 constexpr ssize_t kWellFormedBeforeKernels = 64;

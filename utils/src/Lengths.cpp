@@ -30,13 +30,14 @@ template <class T> const T* MeasureScalar(const T* p, const T* end, bool hasKern
 template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* end) {
   Lengths lengths{0, 0};
   while (p != end) {
-    if (kernels != nullptr) {
+    const bool hasKernels = kernels != nullptr && end - p >= kLeastForKernels;
+    if (hasKernels) {
       const Measured<T> measured = TextKernelsOf(*kernels, p).measure(p, end);
       lengths.codePoints += measured.lengths.codePoints;
       lengths.units += measured.lengths.units;
       p = measured.p;
     }
-    p = MeasureScalar(p, end, kernels != nullptr, lengths);
+    p = MeasureScalar(p, end, hasKernels, lengths);
   }
   return lengths;
 }

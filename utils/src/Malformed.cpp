@@ -58,7 +58,7 @@ ssize_t CutOffAtEnd(const char16* begin, const char16* end) {
 }
 
 template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end) {
-  if (kernels != nullptr)
+  if (kernels != nullptr && end - p >= kLeastForKernels)
     p = TextKernelsOf(*kernels, p).skip(p, end);
   while (p != end) {
     const Sequence sequence = Decode(p, end);
