@@ -408,6 +408,7 @@ template <class Tag> struct Utf16Block {
   static constexpr ssize_t kMost = 3 * kUnits + 4; // the last store is 16 bytes, of which 12 count at most
   static constexpr D d{};
   hn::Vec<D> low, high; ///< the bytes of the units
+  hn::Vec<D> any;       ///< the bits that any of them has, at the same place in two bytes
 
   static HWY_INLINE Utf16Block Load(const char16* p) {
     return Of(hn::LoadU(d, BytesOf(p)), hn::LoadU(d, BytesOf(p) + kUnits));
@@ -417,12 +418,16 @@ template <class Tag> struct Utf16Block {
     return Of(LoadPart(p, n), n > 8 ? LoadPart(p + 8, n - 8) : hn::Zero(d));
   }
   static HWY_INLINE Utf16Block Of(hn::Vec<D> first, hn::Vec<D> second) {
-    return {hn::ConcatEven(d, second, first), hn::ConcatOdd(d, second, first)};
+    return {hn::ConcatEven(d, second, first), hn::ConcatOdd(d, second, first), hn::Or(first, second)};
   }
 
   /// Bytes from 80 on where the unit isn't ASCII, and where it takes three bytes.
   HWY_INLINE hn::Vec<D> NonAscii() const { return hn::Or(hn::SaturatedAdd(high, Repeat(d, 0x7F)), low); }
-  HWY_INLINE bool IsAscii() const { return HighBits(d, NonAscii()) == 0; }
+  /// Without the bytes apart, which a block of ASCII then doesn't need.
+  HWY_INLINE bool IsAscii() const {
+    const ToUnits<D> du;
+    return hn::AllTrue(du, hn::Eq(hn::And(hn::BitCast(du, any), hn::Set(du, 0xFF80)), hn::Zero(du)));
+  }
   HWY_INLINE hn::Vec<D> ThreeBytes() const { return hn::SaturatedAdd(high, Repeat(d, 0x78)); }
   /// The units whose high byte is kind in the bits of mask.
   HWY_INLINE hn::Mask<D> Is(uint8_t kind, uint8_t mask) const {
