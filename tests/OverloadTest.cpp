@@ -6,6 +6,7 @@
 
 #include "Support.h"
 
+#include <algorithm>
 #include <iterator>
 #include <list>
 #include <type_traits>

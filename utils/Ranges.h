@@ -19,12 +19,13 @@
 
 #pragma once
 
-#include <iterator>
 #include <limits>
-#include <memory>
+#include <string> // has std::iterator_traits without the streams that <iterator> brings along
 #include <type_traits>
+#if __cplusplus >= 202002L
+#include <iterator>
+#endif
 #if __cpp_lib_concepts < 202002L
-#include <string>
 #include <vector>
 #endif
 
@@ -252,7 +253,7 @@ template <class T, class It> UnitSpan<T, ValueType<It>> Span(It r1, It r2) {
   if constexpr (std::is_pointer_v<It>)
     return {r1, r2 - r1};
   else
-    return {r1 == r2 ? nullptr : std::addressof(*r1), static_cast<ssize_t>(r2 - r1)};
+    return {r1 == r2 ? nullptr : __builtin_addressof(*r1), static_cast<ssize_t>(r2 - r1)};
 }
 
 /// The units of [r1, r2) in one piece, to be stored: those of a copy where the iterators aren't pointers,

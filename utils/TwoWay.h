@@ -5,7 +5,7 @@
 
 #pragma once
 
-#include <iterator>
+#include <string> // has std::reverse_iterator without the streams that <iterator> brings along
 #include <type_traits>
 
 #include "xchar.h"

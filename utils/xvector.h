@@ -6,11 +6,9 @@
 
 #pragma once
 
-#include <algorithm>
 #include <cstddef>
 #include <cstring>
 #include <initializer_list>
-#include <iterator>
 #include <limits>
 
 #include "Elements.h"
@@ -979,9 +977,16 @@ template <class T> void xvector<T>::AppendRepeated(ssize_t count, const T* p, ss
 
 template <class T> ssize_t xvector<T>::FindAndErase(const T& x) {
   const T value = x; // x may be an element that is overwritten on the way
-  T* const kept = std::remove(begin(), end(), value);
-  const ssize_t count = end() - kept;
-  erase(kept, end());
+  const ssize_t first = find(value);
+  if (first == npos)
+    return 0;
+  T* kept = begin() + first;
+  T* const last = end();
+  for (const T* p = kept + 1; p != last; ++p)
+    if (*p != value)
+      *kept++ = *p;
+  const ssize_t count = last - kept;
+  erase(kept, last);
   return count;
 }
 

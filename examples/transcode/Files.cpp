@@ -79,7 +79,7 @@ ssize_t Input::Read(char* p, ssize_t n) {
   }
 }
 
-ssize_t Input::BytesLeft() const {
+int64 Input::BytesLeft() const {
   struct stat status;
   if (fstat(m_fd, &status) != 0 || !S_ISREG(status.st_mode))
     return 0;

@@ -11,6 +11,7 @@
 
 namespace transcode {
 
+using mirel::int64;
 using mirel::ssize_t;
 
 /// The error that errno tells of, about the file of that name.
@@ -27,7 +28,7 @@ public:
   /// Reads up to n bytes, as many as there are at once. @return 0 at the end
   ssize_t Read(char* p, ssize_t n);
   /// The bytes from here to the end, or 0 where they can't be told.
-  ssize_t BytesLeft() const;
+  int64 BytesLeft() const;
   int Descriptor() const { return m_fd; }
 
 private:

@@ -24,7 +24,7 @@ void Print(const char* text) {
 
 } // namespace
 
-Progress::Progress(bool isWanted, ssize_t total)
+Progress::Progress(bool isWanted, int64 total)
     : m_isWanted(isWanted), m_total(total), m_next(Clock::now() + kMoment) {}
 
 Progress::~Progress() {
@@ -32,7 +32,7 @@ Progress::~Progress() {
     Print("");
 }
 
-void Progress::Add(ssize_t bytes) {
+void Progress::Add(int64 bytes) {
   m_done += bytes;
   if (!m_isWanted)
     return;

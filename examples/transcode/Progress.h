@@ -8,27 +8,27 @@
 
 namespace transcode {
 
-using mirel::ssize_t;
+using mirel::int64;
 
 /// A line on standard error, if that is the terminal that the program was started from. It appears only when
 /// the run takes longer than a moment, and goes with the object: before anything else is printed.
 class Progress {
 public:
   /// total is 0 where it isn't known.
-  Progress(bool isWanted, ssize_t total);
+  Progress(bool isWanted, int64 total);
   ~Progress();
   Progress(const Progress&) = delete;
   Progress& operator=(const Progress&) = delete;
 
   /// Counts bytes that are done.
-  void Add(ssize_t bytes);
+  void Add(int64 bytes);
 
 private:
   typedef std::chrono::steady_clock Clock;
 
   const bool m_isWanted;
-  const ssize_t m_total;
-  ssize_t m_done = 0;
+  const int64 m_total;
+  int64 m_done = 0;
   bool m_isShown = false;
   Clock::time_point m_next; ///< when to show something again
 };

@@ -105,7 +105,7 @@ std::string Statistics::Replaced() const {
 string8 Statistics::Report(const std::string& title) const {
   MemorySink sink;
   mirel::xostream os(sink);
-  const auto row = [&os](const char* name, ssize_t value) {
+  const auto row = [&os](const char* name, int64 value) {
     os << name;
     os.width(12);
     os.put(value);

@@ -10,6 +10,8 @@
 
 namespace transcode {
 
+using mirel::int64;
+
 /// A line ends with a newline, which isn't counted to it; what follows the last newline is a line too.
 class Statistics {
 public:
@@ -31,17 +33,17 @@ private:
   std::string Place() const;
   template <class T> void AdvanceOver(const T* p, ssize_t n);
 
-  ssize_t m_bytes = 0;
-  ssize_t m_newlines = 0;
-  ssize_t m_column = 0; ///< code points behind the last newline
-  ssize_t m_utf8Units = 0;
-  ssize_t m_utf16Units = 0;
-  ssize_t m_codePoints = 0;
-  ssize_t m_asciiCodePoints = 0;
-  ssize_t m_longestLine = 0;
-  ssize_t m_line = 0; ///< code points of the line that goes on in the next block
+  int64 m_bytes = 0;
+  int64 m_newlines = 0;
+  int64 m_column = 0; ///< code points behind the last newline
+  int64 m_utf8Units = 0;
+  int64 m_utf16Units = 0;
+  int64 m_codePoints = 0;
+  int64 m_asciiCodePoints = 0;
+  int64 m_longestLine = 0;
+  int64 m_line = 0; ///< code points of the line that goes on in the next block
   bool m_comesBack = true;
-  ssize_t m_replacements = 0;
+  int64 m_replacements = 0;
   std::string m_firstReplaced;
 };
 
