@@ -2,6 +2,7 @@
 #include "Cases.h"
 
 #include <algorithm>
+#include <memory>
 #include <random>
 #include <string_view>
 #include <unordered_map>

@@ -3,6 +3,7 @@
 #include <utils/UtfStream.h>
 
 #include <algorithm>
+#include <iterator>
 
 #include "Conversion.h"
 
