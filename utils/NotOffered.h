@@ -10,7 +10,7 @@
 #include <iosfwd>
 #include <type_traits>
 
-#include <utils/xchar.h>
+#include "xchar.h"
 
 namespace mirel {
 
