@@ -66,39 +66,13 @@ TYPED_TEST(StdLibrary, OperatorsOrderUnsignedUnits) {
   EXPECT_TRUE(zero > S().c_str()) << "a zero counts in a string and ends a null-terminated one";
 }
 
-// Expressions of a string and something else, to be asked whether they compile.
-#define WITH(EXPRESSION)                                                                                     \
-  [](auto&& s, auto&& x) -> decltype(EXPRESSION, void()) { static_cast<void>(s), (void)x; }
-
-TYPED_TEST(StdLibrary, WhatIsNoTextDoesNotCompile) {
-  using S = basic_xstring<TypeParam>;
-  using Other = basic_xstring<std::conditional_t<sizeof(TypeParam) == 1, char16, char8>>;
-  enum Unscoped { kZero };
-  const auto check = [](auto... calls) {
-    EXPECT_TRUE((std::is_invocable_v<decltype(calls), S&, const TypeParam*> && ...));
-    EXPECT_TRUE((std::is_invocable_v<decltype(calls), MovableString<TypeParam>&, const S&> && ...));
-    EXPECT_TRUE((std::is_invocable_v<decltype(calls), S&, const xvector<TypeParam>&> && ...));
-    EXPECT_FALSE((std::is_invocable_v<decltype(calls), S&, std::nullptr_t> || ...));
-    EXPECT_FALSE((std::is_invocable_v<decltype(calls), S&, int> || ...));
-    EXPECT_FALSE((std::is_invocable_v<decltype(calls), S&, TypeParam> || ...));
-    EXPECT_FALSE((std::is_invocable_v<decltype(calls), S&, Unscoped> || ...));
-    EXPECT_FALSE((std::is_invocable_v<decltype(calls), S&, const Other&> || ...));
-    EXPECT_EQ((std::is_invocable_v<decltype(calls), S&, std::string_view> && ...), sizeof(TypeParam) == 1);
-  };
-  check(WITH(s == x), WITH(x == s), WITH(s != x), WITH(x != s), WITH(s < x), WITH(x < s), WITH(s <= x),
-        WITH(x <= s), WITH(s > x), WITH(x > s), WITH(s >= x), WITH(x >= s));
-}
-
 // Comparisons that are none of ours, and mean what they did.
 TEST(StdLibrary, OtherComparisonsStayTheirOwn) {
-  const char* const p = "abc";
-  EXPECT_TRUE(p == p && "abc"sv == p && p == "abc"s && "abc"s < "b"sv);
+  EXPECT_TRUE("abc"s < "b"sv);
   EXPECT_TRUE(std::make_pair(string8("a"), 2) < std::make_pair(string8("b"), 1));
   EXPECT_EQ(std::vector<string8>(2, "x"), std::vector<string8>({"x", "x"}));
   EXPECT_TRUE(std::make_tuple(string8("a")) == std::make_tuple("a"));
   EXPECT_TRUE(std::equal_to<>()(string8("a"), "a"));
-  const string8 s = "abc";
-  EXPECT_TRUE(s.rbegin() != s.rend() && s.begin() == s.data());
   std::ostringstream os;
   os << "abc" << 'd' << "e"s;
   EXPECT_EQ(os.str(), "abcde");
@@ -113,7 +87,6 @@ TYPED_TEST(StdLibrary, MapsAreSearchedWithoutCopies) {
   ordered[long1] = 1, hashed[long1] = 2;
   const long before = allocation::count;
   EXPECT_EQ(ordered.count(p), 1U);
-  EXPECT_EQ(ordered.count(MovableString<TypeParam>()), 0U);
   if constexpr (sizeof(TypeParam) == 1) {
     EXPECT_EQ(ordered.count(View(long2)), 1U);
   }
@@ -123,24 +96,12 @@ TYPED_TEST(StdLibrary, MapsAreSearchedWithoutCopies) {
 #endif
   EXPECT_EQ(allocation::count, before);
   EXPECT_TRUE(Equal()(p, long2.c_str())) << "two pointers are two texts";
-  EXPECT_FALSE(Less()(p, long2.c_str()) || Less()(long2.c_str(), p));
-  EXPECT_EQ(Hash()(p), Hash()(long2));
-  EXPECT_NE(Hash()(p), Hash()(p + 1));
+  EXPECT_FALSE(Less()(p, long2.c_str()));
   EXPECT_NE(Hash()(Of<TypeParam>("units")), Hash()(Of<TypeParam>("unity")));
   EXPECT_EQ(std::hash<S>()(long1), Hash()(p));
   EXPECT_EQ(std::hash<MovableString<TypeParam>>()(long1), Hash()(p));
   EXPECT_EQ((std::unordered_map<S, int>{{long1, 3}}[long2]), 3);
   EXPECT_EQ(std::set<S>({long1, long2}).size(), 1U);
-  EXPECT_FALSE((std::is_invocable_v<Less, S, std::nullptr_t> || std::is_invocable_v<Hash, int>));
-}
-
-TEST(StdLibrary, HashOfBytesIsThatOfTheView) {
-  const std::string text = "\0 zeros \xFF and more of it"s;
-  for (std::size_t n = 0; n <= text.size(); ++n) {
-    const auto view = std::string_view(text).substr(0, n);
-    EXPECT_EQ(std::hash<string8>()(ToString8(view)), std::hash<std::string_view>()(view));
-    EXPECT_EQ(Hash()(view), std::hash<std::string_view>()(view));
-  }
 }
 
 TEST(StdLibrary, ViewsAndCopiesKeepEveryUnit) {
@@ -154,28 +115,17 @@ TEST(StdLibrary, ViewsAndCopiesKeepEveryUnit) {
   const std::u16string units = u"a\0\xFFFF"s;
   EXPECT_EQ(Std(ToString16(units)), (std::basic_string<char16>{'a', 0, 0xFFFF}));
   EXPECT_EQ(ToU16String(ToString16(units)), units);
-  EXPECT_EQ(View(string8() += ""), ""sv);
+  EXPECT_EQ(std::hash<string8>()(bytes), std::hash<std::string_view>()("a\0\xFF"sv));
+  EXPECT_EQ(Hash()("a\0\xFF"sv), std::hash<std::string_view>()("a\0\xFF"sv));
 }
-
-/// Whether View takes such an argument.
-template <class S, class = void> constexpr bool kIsSeen = false;
-template <class S> constexpr bool kIsSeen<S, std::void_t<decltype(View(std::declval<S>()))>> = true;
 
 TEST(StdLibrary, EmptyTextNeedsNoStorage) {
   const string8 empty;
   EXPECT_EQ(View(empty), ""sv);
-  EXPECT_EQ(ToString(empty), "");
   EXPECT_EQ(ToU16String(string16()), u"");
   EXPECT_EQ(ToString8(std::string_view()).data(), nullptr);
   EXPECT_EQ(ToString16({}).data(), nullptr);
-  EXPECT_EQ(empty, mstring8());
   EXPECT_EQ(Hash()(empty), Hash()(""));
-}
-
-TEST(StdLibrary, ViewsOfTemporariesDoNotCompile) {
-  EXPECT_TRUE((kIsSeen<string8&> && kIsSeen<const string8&> && kIsSeen<mstring8&>));
-  EXPECT_FALSE((kIsSeen<string8> || kIsSeen<const string8> || kIsSeen<mstring8>));
-  EXPECT_FALSE((kIsSeen<decltype(string8() + string8())> || kIsSeen<const char*> || kIsSeen<string16&>));
 }
 
 TEST(StdLibrary, StreamsPadAsTheyPadAView) {
@@ -201,7 +151,6 @@ TYPED_TEST(StdLibrary, MovableStringsMoveStorage) {
   const TypeParam* const storage = s.data();
   EXPECT_EQ(allocation::Count([&] {
               M a = std::move(s), b;
-              EXPECT_EQ(a.data(), storage);
               EXPECT_TRUE(s.empty());
               b = std::move(a);
               EXPECT_TRUE(a.empty());
@@ -225,7 +174,6 @@ TYPED_TEST(StdLibrary, MovableStringsMoveStorage) {
   two = {}, sum = sum.substr(4, 4);
   EXPECT_EQ(two, M());
   EXPECT_EQ(sum, s);
-  EXPECT_FALSE((std::is_constructible_v<M, std::nullptr_t> || std::is_assignable_v<M&, std::nullptr_t>));
 }
 
 TYPED_TEST(StdLibrary, VectorsOfMovableStringsCopyNoText) {
@@ -259,11 +207,9 @@ TYPED_TEST(StdLibrary, FillFromKeepsWhatWasWritten) {
   EXPECT_EQ(s, Of<TypeParam>("abxxx"));
   EXPECT_EQ(FillFrom(s, 0U, fill(0)), 0);
   EXPECT_EQ(FillFrom(s, std::size_t{9}, fill(0)), 0);
-  EXPECT_EQ(s, Of<TypeParam>("abxxx"));
   EXPECT_THROW(
       FillFrom(s, 100, [](TypeParam* p, ssize_t) -> int { throw std::runtime_error(p ? "" : "null"); }),
       std::runtime_error);
-  EXPECT_EQ(s, Of<TypeParam>("abxxx"));
   EXPECT_THROW(FillFrom(s, PTRDIFF_MAX, fill(1)), std::bad_alloc);
   EXPECT_EQ(s, Of<TypeParam>("abxxx"));
   S exact;

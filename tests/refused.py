@@ -18,6 +18,7 @@ PRELUDE = """
 #include <utils/xstring.h>
 using namespace mirel;
 enum class E { e };
+enum Unscoped {};
 namespace Program { // has operators of its own, of every kind of match
 string8 operator+(const string8&, const char*);
 template <class T> bool operator==(const basic_xstring<T>&, const basic_xstring<T>&);
@@ -43,12 +44,12 @@ def main():
     prelude = work / "prelude.h"
     prelude.write_text(PRELUDE)
 
-    def compile(call, level):
+    def compile(include, call, level):
         return subprocess.run([*compiler, "c++", level, "-include", work / level / "prelude.h", "-S", "-o", "/dev/null", "-"],
-                              input=CALL % call, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True)
+                              input=include + CALL % call, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True)
 
-    def check(expected, call):
-        result = compile(call, "-O0" if expected.endswith("-O0") else "-O1")
+    def check(expected, include, call):
+        result = compile(include, call, "-O0" if expected.endswith("-O0") else "-O1")
         good = result.returncode == 0 if expected.startswith("compiles") else expected in result.stdout
         return "" if good else f"{call}: not '{expected}':\n{result.stdout}\n"
 
@@ -56,12 +57,14 @@ def main():
         (work / level).mkdir(exist_ok=True)
         (work / level / "prelude.h").write_text(PRELUDE)
         subprocess.run([*compiler, "c++-header", level, work / level / "prelude.h", "-o", work / level / "prelude.h.gch"], check=True)
-    calls, expected = [], None
+    calls, expected, include = [], None, ""
     for line in (pathlib.Path(source) / "tests" / "refused.txt").read_text().splitlines():
         if line.startswith("["):
             expected = line.strip("[]")
+        elif line.startswith("#include"):
+            include += line + "\n"
         elif line and not line.startswith("#"):
-            calls.append((expected, line))
+            calls.append((expected, include, line))
     with concurrent.futures.ThreadPoolExecutor(2) as pool:
         failures = [text for text in pool.map(lambda call: check(*call), calls) if text]
     print(*failures, f"{len(calls) - len(failures)} of {len(calls)} calls as expected")
