@@ -144,11 +144,6 @@ template <class CharOut, class CharIn> void Check(View<CharIn> source) {
              << "converted: " << testing::PrintToString(units);
   });
 }
-/// Checks source where reading past either end of it is a fault that the sanitizers see.
-template <class CharIn> void CheckExactly(View<CharIn> source) {
-  const std::vector<CharIn> exact(source.begin(), source.end());
-  Check<std::conditional_t<sizeof(CharIn) == 1, char16, char8>>(View<CharIn>(exact.data(), exact.size()));
-}
 inline void CheckUtf8(View<char8> source) { Check<char16>(source); }
 inline void CheckUtf16(View<char16> source) { Check<char8>(source); }
 
