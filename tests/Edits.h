@@ -154,13 +154,16 @@ public:
     const ssize_t reverse = v.empty() ? kNpos : this->Number(v.size()) - 1;
     const auto uf = static_cast<std::size_t>(forward), ur = static_cast<std::size_t>(reverse);
     const T c = this->Unit();
+    const int number = std::make_unsigned_t<T>(c);
     const T *const z = r.c_str(), *const p = r.data();
     const ssize_t pn = r.size();
 #define SEARCH(NAME, OURS, THEIRS)                                                                           \
   ASSERT_EQ(v.NAME(c, OURS), ssize_t(text.NAME(c, THEIRS)));                                                 \
   ASSERT_EQ(v.NAME(r, OURS), ssize_t(text.NAME(pattern, THEIRS)));                                           \
   ASSERT_EQ(v.NAME(z, OURS), ssize_t(text.NAME(z, THEIRS)));                                                 \
-  ASSERT_EQ(v.NAME(p, OURS, pn), ssize_t(text.NAME(pattern, THEIRS)))
+  ASSERT_EQ(v.NAME(p, OURS, pn), ssize_t(text.NAME(pattern, THEIRS)));                                       \
+  ASSERT_EQ(v.NAME(p, p + pn, OURS), ssize_t(text.NAME(pattern, THEIRS)));                                   \
+  ASSERT_EQ(v.NAME(number, OURS), ssize_t(text.NAME(c, THEIRS)))
     SEARCH(find, forward, uf);
     SEARCH(find_first_of, forward, uf);
     SEARCH(find_first_not_of, forward, uf);

@@ -70,17 +70,12 @@ template <class T, class Container> void ExpectAll(const Container& units, long 
   EXPECT_EQ(Allocations<T>(units.begin(), units.end()), allocations);
 }
 
-template <class U> std::vector<U> Units() {
-  std::vector<U> units;
-  for (const char c : std::string(kUnits))
-    units.push_back(static_cast<U>(static_cast<unsigned char>(c)));
-  return units;
-}
-
 /// Ranges of elements of type U, of which those in one piece are copied without help if they are as wide as
 /// T.
 template <class T, class U> void ExpectElements() {
-  const auto v = Units<U>();
+  std::vector<U> v;
+  for (const unsigned char c : std::string(kUnits))
+    v.push_back(static_cast<U>(c));
   const std::list<U> list(v.begin(), v.end());
   const std::deque<U> deque(v.rbegin(), v.rend());
   const std::forward_list<U> forward(v.begin(), v.end());
@@ -93,8 +88,7 @@ template <class T, class U> void ExpectElements() {
   ExpectCopies<T>(v.data(), v.data() + kSize);
   ExpectSearches<T>(v.data(), v.data() + kSize);
   EXPECT_EQ((Allocations<T>(v.data(), v.data() + kSize)), help);
-  std::vector<U> other = v; // its iterators aren't const
-  EXPECT_EQ((Allocations<T>(other.begin(), other.end())), help);
+  EXPECT_EQ((Allocations<T>(v.begin(), v.end())), help) << "the iterators aren't const";
   EXPECT_EQ((Allocations<T>(v.end(), v.end())), 0);
 #if __cplusplus >= 202002L
   ExpectAll<T>(std::span(v.data(), kSize), help);
@@ -111,9 +105,8 @@ TYPED_TEST(Range, OfElementsOfAnyTypeAndAnyIterators) {
 
 TYPED_TEST(Range, OfStringsAndViewsAndOurs) {
   using T = TypeParam;
-  const auto units = Units<char16_t>();
   const std::string narrow = kUnits;
-  const std::u16string wide(units.begin(), units.end());
+  const std::u16string wide = u"ab\xE9\x80";
   const long helpNarrow = sizeof(T) == 1 ? 0 : 1, helpWide = 1 - helpNarrow;
   ExpectAll<T>(narrow, helpNarrow);
   ExpectAll<T>(std::string_view(narrow), helpNarrow);
@@ -129,8 +122,7 @@ TYPED_TEST(Range, OfStringsAndViewsAndOurs) {
 
 TYPED_TEST(Range, OfOneUseIsCopied) {
   std::istringstream text(kUnits);
-  basic_xstring<TypeParam> s;
-  s.push_back(std::istreambuf_iterator<char>(text), std::istreambuf_iterator<char>());
+  const basic_xstring<TypeParam> s(std::istreambuf_iterator<char>{text}, std::istreambuf_iterator<char>{});
   EXPECT_EQ(Std(s), Std(Of<TypeParam>(kUnits)));
 }
 

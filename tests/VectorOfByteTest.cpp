@@ -24,8 +24,6 @@ TYPED_TEST(RangeAlgorithms, OrderUnitsAsUnsigned) {
   const TypeParam* const constHigh = high;
   EXPECT_LT(LexicographicalCompareX(low, low + 2, constHigh, constHigh + 2), 0);
   EXPECT_GT(LexicographicalCompareX(high, high + 2, low, low + 2), 0);
-  EXPECT_EQ(LexicographicalCompareX(high, high + 1, low, low + 2), -1);
-  EXPECT_EQ(LexicographicalCompareX(low, low + 2, low, low + 1), 1);
   const TypeParam* const null = nullptr;
   EXPECT_EQ(LexicographicalCompareX(null, null, null, null), 0);
   EXPECT_EQ(LexicographicalCompareX(null, null, low, low + 1), -1);
@@ -109,15 +107,6 @@ template <class T> std::vector<Way<T>> Ways() {
       ways.push_back({kernels->name, kernels->search16});
 #endif
   return ways;
-}
-
-TEST(RangeAlgorithmsTest, EachKernelIsTested) {
-  std::string names;
-  for (const auto& way : Ways<char8>())
-    names += " " + way.name;
-  RecordProperty("searches", names);
-  if (Ways<char8>().size() < 3)
-    GTEST_SKIP() << "no kernels by themselves, in this build or on this processor; searches:" << names;
 }
 
 TYPED_TEST(RangeAlgorithms, NothingIsInNothing) {

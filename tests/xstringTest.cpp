@@ -7,20 +7,6 @@ namespace {
 template <class T> class XString : public testing::Test {};
 TYPED_TEST_SUITE(XString, CodeUnits);
 
-TYPED_TEST(XString, CStrWritesBehindTheContents) {
-  using S = basic_xstring<TypeParam>;
-  const S empty;
-  EXPECT_EQ(*empty.c_str(), 0);
-  EXPECT_TRUE(empty.empty() && empty.capacity() >= 1);
-  S s = Of<TypeParam>("abc");
-  const TypeParam* const p = s.c_str();
-  EXPECT_TRUE(s.size() == 3 && p[3] == 0 && s.c_str() == p && GetStringLength(p) == 3);
-  s.push_back('d');
-  EXPECT_TRUE(s.c_str()[3] == 'd' && s.c_str()[4] == 0);
-  s.push_back(0), s.push_back('e');
-  EXPECT_TRUE(s.size() == 6 && GetStringLength(s.c_str()) == 4);
-}
-
 TYPED_TEST(XString, ZeroTerminatedArguments) {
   using S = basic_xstring<TypeParam>;
   const S text = Of<TypeParam>("abcabc"), bc = Of<TypeParam>("bc"), none;
