@@ -258,6 +258,7 @@ template <class T> void CheckPieces(const Text<T>& text, const std::vector<std::
       ASSERT_EQ(Std(dst), Text<Other<T>>(1, 'x') + (isStrict ? expected.strict : expected.lossy));
       ASSERT_EQ(stream.malformed().offset, expected.first);
       ASSERT_EQ(stream.replacements(), isStrict ? 0 : expected.malformed);
+      ASSERT_EQ(stream.position(), isStrict && !ok ? expected.first : ssize_t(text.size()));
       if (expected.first != kNpos) {
         const auto whole = mirel::ExplainMalformed(text.data(), ssize_t(text.size()), expected.first);
         ASSERT_EQ(stream.malformed().length, whole.length);
@@ -285,7 +286,7 @@ TYPED_TEST(UtfText, InPiecesAsInOne) {
 TEST(UtfText, MalformedPiecesAreToldAtOnce) {
   mirel::Utf8Stream stream;
   mirel::string16 dst;
-  EXPECT_TRUE(stream.Append(dst, "ab\xE2", 3));
+  EXPECT_TRUE(stream.Append(dst, "ab\xE2"));
   EXPECT_EQ(stream.pending(), 1);
   EXPECT_EQ(stream.position(), 3);
   EXPECT_TRUE(stream.Append(dst, "\x82", 1));

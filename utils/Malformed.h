@@ -11,7 +11,7 @@ namespace mirel {
 enum class MalformedReason {
   kNone,                   ///< It is well-formed.
   kTruncated,              ///< The text ends, or goes on with another unit, before the sequence is complete.
-  kUnexpectedContinuation, ///< A byte 80 to BF that continues nothing.
+  kUnexpectedContinuation, ///< A byte 80 to BF that continues nothing: each one after an overlong lead, too.
   kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 begin no others.
   kSurrogate,              ///< A surrogate, D800 to DFFF, encoded in UTF-8.
   kBeyondUnicode,          ///< A code point above U+10FFFF: F4 followed by 90 or above.

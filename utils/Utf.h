@@ -143,7 +143,8 @@ MIREL_API bool Utf8FromUtf16(string8& dst, std::u16string_view text);
 /// Append the result to what the destination holds: false where the source is malformed, and what precedes
 /// the malformed sequence has then been appended. A failed allocation throws std::bad_alloc and leaves what
 /// the destination held and the beginning of the result. Where storage grows, it at least doubles, so that
-/// many small texts take amortised linear time. The source may not lie in the destination.
+/// many small texts take amortised linear time. The source may not lie in the destination. A UtfStream that
+/// replaces malformed text appends too.
 /// @{
 
 /// Appends UTF-8 as UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
@@ -169,7 +170,8 @@ inline bool AppendUtf8(string8& dst, const xvector<char16>& text) {
 /// Replace the contents of the destination with the text, in which each maximal subpart of malformed text has
 /// become U+FFFD, as in browsers and in Python (Unicode Standard 3.9, U+FFFD Substitution of Maximal
 /// Subparts). They return how many there are. A failed allocation throws std::bad_alloc and leaves the
-/// beginning of the result in the destination. The source may not lie in the destination.
+/// beginning of the result in the destination. The source may not lie in the destination. AppendCodePoint()
+/// of each of CodePoints() does it within one encoding.
 /// @{
 
 /// UTF-8 to UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"

@@ -3,6 +3,9 @@
 
 #pragma once
 
+#include <string_view>
+#include <type_traits>
+
 #include "Malformed.h"
 #include "xstring.h"
 
@@ -35,12 +38,22 @@ public:
   bool Append(basic_xstring<CharOut>& dst, const xvector<CharIn>& text) {
     return Append(dst, text.data(), text.size());
   }
+  /// Appends a piece of UTF-8 that a std::string_view sees, a std::string or a literal too.
+  template <class V,
+            std::enable_if_t<sizeof(CharIn) == 1 && std::is_convertible_v<const V&, std::string_view> &&
+                                 !std::is_null_pointer_v<V>,
+                             int> = 0>
+  bool Append(basic_xstring<CharOut>& dst, const V& text) {
+    const std::string_view view = text;
+    return Append(dst, view.data(), static_cast<ssize_t>(view.size()));
+  }
   /// Ends the text. What was kept is malformed, since nothing completes it, and becomes U+FFFD or stops the
-  /// stream. The next Append() begins another text; until then the members below tell of this one.
+  /// stream. The next call begins another text; until then the members below tell of this one.
   /// @return whether the text was well-formed, or has been replaced where it wasn't
   bool Finish(basic_xstring<CharOut>& dst);
 
-  /// The units of the text so far, those that were kept included.
+  /// The units of the text so far, those that were kept included; once the stream has stopped, the offset of
+  /// the malformed sequence.
   ssize_t position() const { return m_converted + m_pending; }
   /// How many of them are kept for the next piece.
   ssize_t pending() const { return m_pending; }

@@ -25,7 +25,7 @@ void UtfStream<CharOut, CharIn>::Convert(basic_xstring<CharOut>& dst, const Char
     m_malformed = {m_converted + (result.malformed - p), sequence.length,
                    detail::ReasonOf(result.malformed, end, sequence)};
   }
-  m_converted += pn;
+  m_converted = HasStopped() ? m_malformed.offset : m_converted + pn;
 }
 
 /// Adds to the units that were kept until they are a sequence or can't become one, and converts them. They
@@ -60,8 +60,8 @@ bool UtfStream<CharOut, CharIn>::Append(basic_xstring<CharOut>& dst, const CharI
   if (p != end && !HasStopped()) {
     const ssize_t cutOff = detail::CutOffAtEnd(p, end);
     Convert(dst, p, end - p - cutOff, end);
-    std::copy_n(end - cutOff, cutOff, m_kept);
-    m_pending = cutOff;
+    m_pending = HasStopped() ? 0 : cutOff;
+    std::copy_n(end - cutOff, m_pending, m_kept);
   }
   return !HasStopped();
 }
