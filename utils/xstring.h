@@ -81,7 +81,10 @@ public:
   /// Becomes a copy of r; keeps the storage where it is large enough.
   basic_xstring<T>& operator=(const basic_xstring<T>& r) = default;
   /// Becomes a copy of a null-terminated string.
-  basic_xstring<T>& operator=(const T* rhs) { return assign(rhs); }
+  basic_xstring<T>& operator=(const T* rhs) {
+    assign(rhs);
+    return *this;
+  }
   using Base::assign;
   /// Becomes a copy of a null-terminated string.
   basic_xstring<T>& assign(const T* s) {

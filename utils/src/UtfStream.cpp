@@ -34,7 +34,7 @@ void UtfStream<CharOut, CharIn>::Convert(basic_xstring<CharOut>& dst, const Char
 template <class CharOut, class CharIn>
 ssize_t UtfStream<CharOut, CharIn>::CompletePending(basic_xstring<CharOut>& dst, const CharIn* p,
                                                     ssize_t pn) {
-  CharIn units[std::size(decltype(m_kept){}) + 1];
+  CharIn units[std::size(decltype(m_kept){}) + 1] = {};
   std::copy_n(m_kept, m_pending, units);
   const ssize_t n = std::min(pn, ssize_t(std::size(units)) - m_pending);
   std::copy_n(p, n, units + m_pending);
