@@ -179,6 +179,7 @@ TYPED_TEST_SUITE(UtfText, CodeUnits);
 /// ends.
 TYPED_TEST(UtfText, OneOrTwoAmongOthers) {
   const auto& pieces = Pieces(TypeParam());
+  const Text<TypeParam> fault(1, static_cast<TypeParam>(sizeof(TypeParam) == 1 ? 0xFF : 0xDC00));
   for (std::size_t n = 0; n < 135; ++n)
     for (const auto& filler : {pieces[0], pieces[1], pieces[2], pieces[3]})
       for (const auto& one : pieces) {
@@ -186,7 +187,10 @@ TYPED_TEST(UtfText, OneOrTwoAmongOthers) {
         for (std::size_t k = 0; k < n; ++k)
           text += filler;
         ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + text));
-        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + pieces[n % std::size(pieces)]));
+        const auto& other = pieces[n % std::size(pieces)];
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + other));
+        // Blocks with replacements begin at a fault.
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(fault + text + one + other + text));
       }
 }
 

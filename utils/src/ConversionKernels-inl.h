@@ -3,9 +3,11 @@
 // A text is converted by blocks. For every position of a block it is computed what a code point beginning
 // there would give, also where none begins. A byte shuffle from a table then drops the positions where none
 // begins. No branch depends on where code points begin. Masks with one bit for each position tell whether the
-// block is well-formed; one that isn't is left to the scalar path. A block ends before a code point that its
-// end would cut off, so no state passes from one block to the next. The last block ends where the text ends.
-// It overlaps what is converted already, and may store that part again.
+// block is well-formed; one that isn't is left to the scalar path, which finds the fault. From there a lossy
+// conversion goes on by blocks in which masks tell where a maximal subpart begins; there U+FFFD takes the
+// place of what was computed. A block ends before a code point that its end would cut off, so no state passes
+// from one block to the next. The last block ends where the text ends. It overlaps what is converted already,
+// and may store that part again.
 //
 // There is no include guard: the file is included once for each instruction set.
 
@@ -40,6 +42,10 @@ template <class D> HWY_INLINE uint64_t HighBits(D, hn::Vec<D> v) {
 }
 template <class D> HWY_INLINE uint64_t BitsOf(D, hn::Mask<D> mask) {
   return HighBits(D(), hn::VecFromMask(D(), mask));
+}
+
+template <class D> HWY_INLINE hn::Mask<D> MaskOf(D d, uint64_t bits) {
+  return hn::LoadMaskBits(d, reinterpret_cast<const uint8_t*>(&bits));
 }
 
 template <class D> HWY_INLINE hn::Vec<D> Repeat(D d, uint8_t x) { return hn::Load(d, kRepeats.rows[x]); }
@@ -156,6 +162,12 @@ struct Converted {
   ssize_t in, out;
 };
 
+/// How much of a block was converted, and how many U+FFFD that took.
+struct Replaced {
+  Converted converted;
+  ssize_t replacements;
+};
+
 /// A conversion under way. A Block has, beside the functions called here:
 /// - kUnits: how many units of the source it has,
 /// - kMost: the most units that its Convert() writes from out on, with those that are no part of the result.
@@ -201,6 +213,16 @@ template <class Out, class In> struct Conversion {
       stop = Convert(Block::Load(p - from), from, kUnits);
     }
     return stop;
+  }
+
+  /// Converts blocks, with U+FFFD where they are malformed, up to one that is well-formed.
+  template <class Block> HWY_INLINE void Replace(ssize_t& replacements) {
+    while (end - p >= Block::kUnits && outEnd - out >= Block::kMost) {
+      const Replaced n = Block::Load(p).Replace(BytesOf(out));
+      if (n.replacements == 0)
+        return;
+      p += n.converted.in, out += n.converted.out, replacements += n.replacements;
+    }
   }
 
   /// Converts a text that is shorter than a block.
@@ -319,12 +341,18 @@ template <int kVectors, class D> struct Utf8Block {
     return static_cast<ssize_t>((hwy::Num0BitsBelowLS1Bit_Nonzero32(isLead | 8) + 1) % 4);
   }
 
-  /// Stores the units of the positions whose bits are set; their number.
-  template <int kMaxBytes> HWY_INLINE ssize_t Store(uint64_t keep, uint8_t* const out) const {
+  /// Stores the units of the positions whose bits are set, U+FFFD for those that are malformed; their number.
+  template <int kMaxBytes, bool kReplaces = false>
+  HWY_INLINE ssize_t Store(uint64_t keep, uint8_t* const out, uint64_t malformed = 0) const {
     uint8_t* end = out;
     for (int k = 0; k < kVectors; ++k) {
       const auto a = Get<0>(k), b = Get<1>(k), c = Get<2>(k);
-      const auto units = UnitsOf<kMaxBytes>(D(), a, b, c);
+      auto units = UnitsOf<kMaxBytes>(D(), a, b, c);
+      if constexpr (kReplaces) {
+        const auto isMalformed = MaskOf(D(), malformed >> k * kLanes<D>);
+        units = {Select(isMalformed, Repeat(D(), 0xFD), units.low),
+                 Select(isMalformed, Repeat(D(), 0xFF), units.high)};
+      }
       end = StorePairs<0, 2>(D(), units.low, units.high, kKeepUnits, keep, end);
       keep = keep >> (kLanes<D> - 1) >> 1;
     }
@@ -377,7 +405,54 @@ template <int kVectors, class D> struct Utf8Block {
         return ConvertThreeByteSequences(out);
     return {stop - from, Store<3>(positions & ~continuations, out)};
   }
+
+  /// Stores the units of a block without continuation bytes: U+FFFD for every byte that isn't ASCII.
+  HWY_INLINE void StoreLoneBytes(uint8_t* out) const {
+    const D d;
+    const hn::Repartition<int16_t, D> di;
+    const hn::Half<hn::RebindToSigned<D>> half;
+    for (int k = 0; k < kVectors; ++k) {
+      const auto bytes = Get<0>(k), replaced = Select(IsNonAscii(d, bytes), Repeat(d, 0xFD), bytes);
+      // With its sign, FD is widened to FFFD.
+      const auto v = hn::BitCast(hn::RebindToSigned<D>(), replaced);
+      hn::StoreU(hn::BitCast(d, hn::PromoteTo(di, hn::LowerHalf(half, v))), d, out + 2 * k * kLanes<D>);
+      hn::StoreU(hn::BitCast(d, hn::PromoteTo(di, hn::UpperHalf(half, v))), d, out + (2 * k + 1) * kLanes<D>);
+    }
+  }
+
+  /// Converts a block of more than one vector, with U+FFFD for each maximal subpart of malformed text.
+  HWY_INLINE Replaced Replace(uint8_t* out) const {
+    const ssize_t stop = kUnits - CutOff();
+    const uint64_t nonAscii = BitsAt<0>() & FirstBits(stop), highest2 = nonAscii & BitsAt<1>();
+    const uint64_t continuations = nonAscii & ~highest2;
+    if (continuations == 0) {
+      StoreLoneBytes(out);
+      return {{stop, stop}, Count(nonAscii)};
+    }
+    // The lead bytes that may stand before the byte behind them, if that is a continuation byte.
+    const uint64_t belowC2 = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC2); });
+    const uint64_t leads = highest2 & ~belowC2 & ~BadLeads<true>();
+    const uint64_t leads3 = leads & BitsAt<2>(), leads4 = leads3 & BitsAt<3>();
+    // The bytes that continue what a lead byte began. All others begin a sequence or a subpart.
+    const uint64_t second = leads << 1 & continuations;
+    const uint64_t third = leads3 << 2 & second << 1 & continuations;
+    const uint64_t fourth = leads4 << 3 & third << 1 & continuations;
+    const uint64_t begins = FirstBits(stop) & ~(second | third | fourth);
+    const uint64_t whole = (second >> 1 & ~leads3) | (third >> 2 & ~leads4) | fourth >> 3;
+    const uint64_t malformed = begins & nonAscii & ~whole;
+    const ssize_t units = third == 0    ? Store<2, true>(begins, out, malformed)
+                          : fourth == 0 ? Store<3, true>(begins, out, malformed)
+                                        : Store<4, true>(begins | fourth >> 2, out, malformed);
+    return {{stop, units}, Count(malformed)};
+  }
 };
+
+Progress<char16, char8> ReplaceUtf8(const char8* p, const char8* end, char16* out, char16* outEnd,
+                                    ssize_t& replacements) {
+  Conversion<char16, char8> text{p, end, out, outEnd};
+  text.Replace<Utf8Block<64 / kLanes<Wide>, Wide>>(replacements);
+  return text.At(Stop::kMalformed);
+}
 
 Progress<char16, char8> Utf16FromUtf8(const char8* p, const char8* end, char16* out, char16* outEnd) {
   Conversion<char16, char8> text{p, end, out, outEnd};
@@ -509,7 +584,27 @@ template <class Tag> struct Utf16Block {
     masks = {masks.two & ~lows, masks.three & ~lows}; // a low surrogate gives one byte, a high one three
     return {n - cutOff, StoreThree<true>(masks, out - masks.Bytes(from)) - out - behind - 3 * cutOff};
   }
+
+  /// Converts the block, with U+FFFD for each unpaired surrogate.
+  HWY_INLINE Replaced Replace(uint8_t* out) const {
+    const uint64_t highs = BitsOf(d, Is(0xD8, 0xFC)), lows = BitsOf(d, Is(0xDC, 0xFC));
+    const uint64_t cutOff = highs & uint64_t{1} << (kUnits - 1); // left to the next block
+    const uint64_t unpaired = (highs & ~(lows >> 1) & ~cutOff) | (lows & ~(highs << 1));
+    if (unpaired == 0)
+      return {{0, 0}, 0};
+    const auto isUnpaired = MaskOf(d, unpaired);
+    const Utf16Block block = {Select(isUnpaired, Repeat(d, 0xFD), low),
+                              Select(isUnpaired, Repeat(d, 0xFF), high), any};
+    return {block.Convert(0, kUnits, out), Count(unpaired)};
+  }
 };
+
+Progress<char8, char16> ReplaceUtf16(const char16* p, const char16* end, char8* out, char8* outEnd,
+                                     ssize_t& replacements) {
+  Conversion<char8, char16> text{p, end, out, outEnd};
+  text.Replace<Utf16Block<Wide>>(replacements);
+  return text.At(Stop::kMalformed);
+}
 
 Progress<char8, char16> Utf8FromUtf16(const char16* p, const char16* end, char8* out, char8* outEnd) {
   Conversion<char8, char16> text{p, end, out, outEnd};

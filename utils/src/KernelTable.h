@@ -49,6 +49,12 @@ struct Kernels {
   const char* name;
   Progress<char16, char8> (*utf16FromUtf8)(const char8* p, const char8* end, char16* out, char16* outEnd);
   Progress<char8, char16> (*utf8FromUtf16)(const char16* p, const char16* end, char8* out, char8* outEnd);
+  /// Go on from malformed text by blocks, with U+FFFD for each maximal subpart, and add how many there were.
+  /// They stop before a well-formed block, and where text or room is short of a block, which may be at once.
+  Progress<char16, char8> (*replaceUtf8)(const char8* p, const char8* end, char16* out, char16* outEnd,
+                                         ssize_t& replacements);
+  Progress<char8, char16> (*replaceUtf16)(const char16* p, const char16* end, char8* out, char8* outEnd,
+                                          ssize_t& replacements);
   /// As Utf16FromAscii(), for the first of n units; how many they are. It leaves less than a vector.
   ssize_t (*utf16FromAscii)(const char8* src, ssize_t n, char16* out);
   TextKernels<char8> text8;

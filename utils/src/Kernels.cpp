@@ -33,6 +33,8 @@ constexpr Kernels kKernels = {
     &HWY_STR(HWY_NAMESPACE)[2], // without "N_"
     Utf16FromUtf8,
     Utf8FromUtf16,
+    ReplaceUtf8,
+    ReplaceUtf16,
     Utf16FromAscii,
     {SkipUtf8, MeasureUtf8},
     {SkipUtf16, MeasureUtf16},

@@ -85,11 +85,20 @@ Progress<CharOut, CharIn> Convert(const Kernels* k, const CharIn* p, const CharI
   return progress.stop == Stop::kMalformed ? ConvertScalar(progress.p, end, progress.out, outEnd) : progress;
 }
 
-/// Converts one code point at a time from malformed text on, and replaces what is malformed, until the text
-/// seems to be well-formed.
+/// Converts from malformed text on, and replaces what is malformed, until the text seems to be well-formed:
+/// by blocks, and one code point at a time where there isn't text or room for one.
 template <class CharOut, class CharIn>
-Progress<CharOut, CharIn> Replace(const CharIn* p, const CharIn* end, CharOut* out, const CharOut* outEnd,
-                                  ssize_t& replacements) {
+Progress<CharOut, CharIn> Replace(const Kernels* k, const CharIn* p, const CharIn* end, CharOut* out,
+                                  CharOut* outEnd, ssize_t& replacements) {
+  if (k != nullptr) {
+    Progress<CharOut, CharIn> progress{p, out, Stop::kMalformed};
+    if constexpr (sizeof(CharIn) == 1)
+      progress = k->replaceUtf8(p, end, out, outEnd, replacements);
+    else
+      progress = k->replaceUtf16(p, end, out, outEnd, replacements);
+    if (progress.p != p)
+      return progress;
+  }
   for (const CharIn* malformed = p; p != end && p - malformed < kWellFormedBeforeKernels;) {
     const Sequence sequence = Decode(p, end);
     if (outEnd - out < EncodedLength<CharOut>(sequence.codePoint))
@@ -160,7 +169,7 @@ Appended<CharIn> AppendUtf(const Kernels* kernels, basic_xstring<CharOut>& dst, 
       if (result.malformed == nullptr)
         result.malformed = progress.p;
       if (onMalformed == OnMalformed::kReplace)
-        progress = Replace(progress.p, end, progress.out, destination.OutEnd(), result.replacements);
+        progress = Replace(kernels, progress.p, end, progress.out, destination.OutEnd(), result.replacements);
     }
     p = progress.p;
     destination.SetEnd(progress.out);
