@@ -42,6 +42,7 @@ extern "C" void* WRAPPED_REALLOC(void* p, std::size_t n) noexcept {
 namespace {
 
 const volatile ssize_t kMax = std::numeric_limits<ssize_t>::max(); // unknown to the compiler
+const volatile mirel::int64 kWide = mirel::int64(1) << 62;         // has nothing in its lower 32 bits
 
 /// An edit of s.
 #define EDIT(...) [&](auto& s) { __VA_ARGS__; }
@@ -168,6 +169,7 @@ TYPED_TEST(Allocation, AFailureChangesNothing) {
        EDIT(s.assign(kMax, 'x')), EDIT(s *= kMax), EDIT(s *= kMax / 3 + 1), EDIT(s.append(s.data(), kMax))});
   S empty;
   empty *= kMax;
+  EXPECT_THROW(empty.append(kWide, 'x'), std::bad_alloc);
   EXPECT_EQ(empty.capacity(), 0);
 }
 

@@ -60,10 +60,23 @@ template <class T, class N> [[gnu::always_inline]] inline void RefuseConstant([[
 #endif
 }
 
-/// An argument as a count or an index.
+/// A difference or count of any type as an ssize_t, the nearest one where that has fewer bits.
+template <class N> constexpr ssize_t Saturated(N n) {
+  if constexpr (sizeof(N) > sizeof(ssize_t)) {
+    using Limits = std::numeric_limits<ssize_t>;
+    return n < Limits::min() ? Limits::min() : n > Limits::max() ? Limits::max() : static_cast<ssize_t>(n);
+  } else {
+    return static_cast<ssize_t>(n);
+  }
+}
+
+/// An argument as a count or an index. One of more bits must not become one that is allowed.
 template <class N> [[gnu::always_inline]] inline ssize_t Count(N n) {
   RefuseConstant<ssize_t>(n);
-  return static_cast<ssize_t>(n);
+  if constexpr (sizeof(N) == sizeof(int64))
+    return Saturated(static_cast<int64>(n));
+  else
+    return static_cast<ssize_t>(n);
 }
 
 /// An argument as a code unit, by its unsigned value: the char E9 is the char16 00E9 on every processor.

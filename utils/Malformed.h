@@ -24,7 +24,7 @@ MIREL_API const char* Describe(MalformedReason reason);
 
 /// A malformed sequence in a text.
 struct MalformedText {
-  ssize_t offset;         ///< The index of its first unit.
+  int64 offset;           ///< The index of its first unit.
   ssize_t length;         ///< The units that one U+FFFD replaces.
   MalformedReason reason; ///< What is wrong with it.
 };

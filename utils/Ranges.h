@@ -187,16 +187,17 @@ public:
   ssize_t size() const { return m_units.size() / ssize_t(sizeof(T)); }
 
 private:
+  static constexpr ssize_t kMax = std::numeric_limits<ssize_t>::max();
+
   template <class It> static ssize_t Length(It r1, It r2) {
     if constexpr (kIsRandomAccess<It>)
-      return static_cast<ssize_t>(r2 - r1);
+      return Saturated(r2 - r1);
     ssize_t length = 0;
-    for (; r1 != r2; ++r1)
+    for (; r1 != r2 && length != kMax; ++r1)
       ++length;
     return length;
   }
   void Reserve(ssize_t length) {
-    constexpr ssize_t kMax = std::numeric_limits<ssize_t>::max();
     m_units.reserve(length <= kMax / ssize_t(sizeof(T)) ? length * ssize_t(sizeof(T)) : kMax);
   }
 
@@ -228,7 +229,7 @@ public:
   }
   ValueIterator operator+(ssize_t n) const { return ValueIterator(m_it + static_cast<Difference>(n)); }
   ValueIterator operator-(ssize_t n) const { return ValueIterator(m_it - static_cast<Difference>(n)); }
-  ssize_t operator-(const ValueIterator& y) const { return static_cast<ssize_t>(m_it - y.m_it); }
+  ssize_t operator-(const ValueIterator& y) const { return Saturated(m_it - y.m_it); }
   bool operator==(const ValueIterator& y) const { return m_it == y.m_it; }
   bool operator!=(const ValueIterator& y) const { return !(m_it == y.m_it); }
 

@@ -218,7 +218,7 @@ ssize_t FillFrom(xvector<T>& dst, N most, F&& f) {
   const ssize_t room = detail::Count(most);
   MIREL_ASSERT_AS(0 <= room, "0 <= most");
   T* const p = detail::Storage::Grow(dst, room);
-  const auto filled = static_cast<ssize_t>(f(p, room));
+  const ssize_t filled = detail::Count(f(p, room));
   MIREL_ASSERT_AS(0 <= filled && filled <= room, "0 <= filled && filled <= most");
   detail::Storage::SetSize(dst, dst.size() + filled);
   return filled;

@@ -88,7 +88,7 @@ inline ssize_t Utf16Length(const xvector<char8>& text) { return Utf16Length(text
 inline ssize_t Utf16Length(std::string_view text) { return Utf16Length(text.data(), detail::SizeOf(text)); }
 ssize_t Utf16Length(std::nullptr_t) = delete;
 
-/// The units of a UTF-16 text in UTF-8. No text in memory can have more than PTRDIFF_MAX of them.
+/// The units of a UTF-16 text in UTF-8, but PTRDIFF_MAX where a program of 32 bits can't count them.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf8Length(const char16* p, ssize_t pn);
 /// The units of a string in UTF-8.

@@ -54,11 +54,11 @@ public:
 
   /// The units of the text so far, those that were kept included; once the stream has stopped, the offset of
   /// the malformed sequence.
-  ssize_t position() const { return m_converted + m_pending; }
+  int64 position() const { return m_converted + m_pending; }
   /// How many of them are kept for the next piece.
   ssize_t pending() const { return m_pending; }
   /// How many U+FFFD stand for malformed text so far.
-  ssize_t replacements() const { return m_replacements; }
+  int64 replacements() const { return m_replacements; }
   /// The first malformed sequence; the offset is from the beginning of the text. Its reason is kNone and its
   /// offset npos while there is none.
   const MalformedText& malformed() const { return m_malformed; }
@@ -72,8 +72,8 @@ private:
   bool m_isFinished = false;
   CharIn m_kept[3] = {};
   ssize_t m_pending = 0;
-  ssize_t m_converted = 0;
-  ssize_t m_replacements = 0;
+  int64 m_converted = 0;
+  int64 m_replacements = 0;
   MalformedText m_malformed = {-1, 0, MalformedReason::kNone};
 };
 

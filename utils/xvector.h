@@ -1005,9 +1005,9 @@ ssize_t xvector<T>::rfind(It r1, It r2, ssize_t offset) const {
   MIREL_ASSERT_NEEDLE(r1, r2);
   if (r1 == r2)
     return offset == npos ? size() : offset;
-  const ssize_t pn = std::distance(r1, r2);
+  const auto pn = std::distance(r1, r2); // may have more bits than an ssize_t
   // The last occurrence that may count starts at offset and so ends pn elements later.
-  const T* const last = end() - After(offset) < pn ? end() : After(offset) + pn - 1;
+  const T* const last = end() - After(offset) < pn ? end() : After(offset) + (pn - 1);
   const auto needle = detail::Needle<T>(r1, r2);
   return Index(FindLastSubSequence(begin(), last, needle.begin(), needle.end()), last);
 }

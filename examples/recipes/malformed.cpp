@@ -16,7 +16,7 @@ int main() {
   // What is wrong, as a message has it.
   if (const ssize_t at = mirel::FindMalformed(input); at >= 0) {
     const mirel::MalformedText fault = mirel::ExplainMalformed(input, at);
-    std::printf("%s at byte %td\n", Describe(fault.reason), fault.offset);
+    std::printf("%s at byte %jd\n", Describe(fault.reason), fault.offset);
   }
 
   // With U+FFFD where it is malformed; the lengths are known before.
@@ -40,7 +40,7 @@ int main() {
   for (const char& byte : input)
     stream.Append(received, &byte, 1);
   stream.Finish(received);
-  std::printf("%d, the first fault at byte %td\n", received._Eq(wide), stream.malformed().offset);
+  std::printf("%d, the first fault at byte %jd\n", received._Eq(wide), stream.malformed().offset);
 }
 
 /* Prints:

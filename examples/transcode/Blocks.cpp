@@ -74,7 +74,7 @@ bool Blocks::Next() {
 
 /// Sets the block to what is well-formed or replaced; its first bytes, as many as fed, were seen before.
 void Blocks::Decode(ssize_t fed, bool isEnd) {
-  const ssize_t before = m_replacements;
+  const int64 before = m_replacements;
   if (IsUtf16(m_from))
     DecodeUtf16(isEnd);
   else if (m_from == Encoding::kAscii)
@@ -93,7 +93,7 @@ void Blocks::Decode(ssize_t fed, bool isEnd) {
 }
 
 void Blocks::DecodeUtf8(ssize_t fed, bool isEnd) {
-  const ssize_t begin = m_toUtf16.position() - fed;
+  const int64 begin = m_toUtf16.position() - fed;
   m_text.clear();
   if (isEnd)
     m_toUtf16.Finish(m_text);
@@ -110,7 +110,8 @@ void Blocks::DecodeUtf16(bool isEnd) {
     std::memcpy(m_text.data(), m_buffer.data(), 2 * static_cast<std::size_t>(m_text.size()));
   if (IsOtherOrder(m_from))
     ExchangeBytes(m_text);
-  const ssize_t fed = m_toUtf8.pending(), begin = m_toUtf8.position() - fed;
+  const ssize_t fed = m_toUtf8.pending();
+  const int64 begin = m_toUtf8.position() - fed;
   m_utf8.clear();
   if (m_mode == Mode::kCheck) {
     m_text.resize(Check(m_text.data(), m_text.size(), isEnd), 0);
@@ -170,10 +171,10 @@ template <class T> ssize_t Blocks::Check(const T* p, ssize_t n, bool isEnd) {
 
 /// Notes what a stream has found in a block that begins with the given unit. @return whether the block ends
 /// there
-template <class Stream> bool Blocks::Note(const Stream& stream, ssize_t begin, ssize_t unitBytes) {
+template <class Stream> bool Blocks::Note(const Stream& stream, int64 begin, ssize_t unitBytes) {
   const mirel::MalformedText& malformed = stream.malformed();
   if (malformed.offset >= begin && m_replacements == 0)
-    m_fault = Fault{(malformed.offset - begin) * unitBytes, Describe(malformed.reason)};
+    m_fault = Fault{static_cast<ssize_t>(malformed.offset - begin) * unitBytes, Describe(malformed.reason)};
   m_replacements = stream.replacements();
   return m_fault && m_mode != Mode::kReplace;
 }

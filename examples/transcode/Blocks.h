@@ -42,7 +42,7 @@ public:
   /// The first fault of the text, if it is in the block; the block ends before it unless it is replaced.
   const std::optional<Fault>& FirstFault() const { return m_fault; }
   /// How many U+FFFD stand for malformed text so far.
-  ssize_t Replacements() const { return m_replacements; }
+  int64 Replacements() const { return m_replacements; }
 
   /// The block as it stands in the input, as UTF-16 in the machine's byte order, and as UTF-8.
   std::string_view Bytes() const { return {m_buffer.data(), static_cast<std::size_t>(m_size)}; }
@@ -61,7 +61,7 @@ private:
   void DecodeAscii();
   void EndOddly();
   template <class T> ssize_t Check(const T* p, ssize_t n, bool isEnd);
-  template <class Stream> bool Note(const Stream& stream, ssize_t begin, ssize_t unitBytes);
+  template <class Stream> bool Note(const Stream& stream, int64 begin, ssize_t unitBytes);
 
   Input& m_input;
   const Encoding m_from;
@@ -74,7 +74,7 @@ private:
   string16 m_text;      ///< the block
   string8 m_utf8;       ///< the block, where the input isn't UTF-8 itself or has been replaced in part
   bool m_isReplaced = false; ///< whether a part of this block is
-  ssize_t m_replacements = 0;
+  int64 m_replacements = 0;
   std::optional<Fault> m_fault;
   string16 m_otherOrder; ///< room for units whose bytes are exchanged
   string8 m_back;        ///< room for UTF-8 that is compared with the input

@@ -89,7 +89,7 @@ std::string Statistics::Place() const {
          std::to_string(m_column + 1) + ")";
 }
 
-void Statistics::SetReplacements(ssize_t count, const std::string& first) {
+void Statistics::SetReplacements(int64 count, const std::string& first) {
   m_replacements = count;
   m_firstReplaced = first;
 }

@@ -23,7 +23,7 @@ public:
   /// The place at an offset of the block that comes next, in words: "byte 12 (line 2, column 1)".
   std::string PlaceIn(const Blocks& block, ssize_t offset) const;
   /// Notes how many malformed sequences were replaced, and where the first was.
-  void SetReplacements(ssize_t count, const std::string& first);
+  void SetReplacements(int64 count, const std::string& first);
   /// Both in words: "2 malformed sequences replaced, the first at byte 3 (line 1, column 4)", or nothing.
   std::string Replaced() const;
   /// The table of it all under the given title.

@@ -27,7 +27,7 @@ template <class CharOut, class CharIn> struct Progress {
 /// The lengths of a text.
 struct Lengths {
   ssize_t codePoints;
-  ssize_t units; ///< in the other encoding
+  int64 units; ///< in the other encoding, which in 32 bits may be more than fit in memory
 };
 
 /// How far a text was measured, and what that part comes to.

@@ -55,9 +55,13 @@ template <class T> Lengths MeasureText(const T* p, ssize_t pn) {
 
 } // namespace detail
 
-ssize_t Utf16Length(const char8* p, ssize_t pn) { return detail::MeasureText(p, pn).units; }
+ssize_t Utf16Length(const char8* p, ssize_t pn) {
+  return detail::Saturated(detail::MeasureText(p, pn).units);
+}
 
-ssize_t Utf8Length(const char16* p, ssize_t pn) { return detail::MeasureText(p, pn).units; }
+ssize_t Utf8Length(const char16* p, ssize_t pn) {
+  return detail::Saturated(detail::MeasureText(p, pn).units);
+}
 
 ssize_t CountCodePoints(const char8* p, ssize_t pn) { return detail::MeasureText(p, pn).codePoints; }
 

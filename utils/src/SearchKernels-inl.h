@@ -79,13 +79,14 @@ HWY_INLINE bool HasHit(D d, const T* p, const T* q, const T* r, const T* s, cons
 /// In one vector or more.
 template <bool kReverse, class D, class T, class Is>
 HWY_INLINE const T* ScanVectors(D d, const T* x1, const T* x2, const Is& is) {
-  constexpr ssize_t n = ssize_t(hn::MaxLanes(D()));
-  const ssize_t length = x2 - x1, last = length - n;
-  const auto at = [=](ssize_t i) { return kReverse ? x2 - n - i : x1 + i; };
-  const auto clamped = [=](ssize_t i) { return at(i < last ? i : last); };
+  constexpr std::size_t n = hn::MaxLanes(D());
+  // Without a sign: i passes the length, which in 32 bits may be the most that an ssize_t can count.
+  const std::size_t length = static_cast<std::size_t>(x2 - x1), last = length - n;
+  const auto at = [=](std::size_t i) { return kReverse ? x2 - n - i : x1 + i; };
+  const auto clamped = [=](std::size_t i) { return at(i < last ? i : last); };
   if (const T* const hit = HitIn<kReverse>(d, at(0), is))
     return hit;
-  ssize_t i = n;
+  std::size_t i = n;
   if constexpr (Is::kIsCheap) {
     while (length - i >= 4 * n && !HasHit(d, at(i), at(i + n), at(i + 2 * n), at(i + 3 * n), is))
       i += 4 * n;
@@ -181,7 +182,7 @@ private:
   static constexpr ssize_t kRare = 256;
   ssize_t m_last; ///< the index of the last unit
   T m_first, m_middle, m_final;
-  ssize_t m_credit = 2 * kRare;
+  int64 m_credit = 2 * kRare; // may pass the length searched
 };
 
 template <bool kReverse, class T>

@@ -254,7 +254,7 @@ HWY_INLINE Measured<char16> ScanUtf16(const char16* const begin, const char16* e
   if constexpr (kIsCounted)
     scan.Flush();
   const ssize_t n = p - begin;
-  return {p, {n - scan.surrogates / 2, 3 * n - scan.lacking - scan.surrogates}};
+  return {p, {n - scan.surrogates / 2, 3 * int64(n) - scan.lacking - scan.surrogates}};
 }
 
 const char8* SkipUtf8(const char8* p, const char8* end) { return ScanUtf8<false>(p, end).p; }
