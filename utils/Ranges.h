@@ -266,7 +266,12 @@ template <class T, class It> auto Source(It r1, It r2) {
     return UnitCopy<T>(r1, r2);
 }
 
-/// The units of [r1, r2), to be searched for.
+/// Refuses ranges that can be read only once, where a search reads them again and again.
+template <class It> constexpr void RequireForward() {
+  static_assert(kIsForward<It>, "a search reads its needle more than once: copy it into a string first");
+}
+
+/// The units of [r1, r2), to be searched for. A search reads them more than once, contains() only once.
 template <class T, class It> auto Needle(It r1, It r2) {
   if constexpr (StandsForPointer<T, It>())
     return Span<T>(r1, r2);

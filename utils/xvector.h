@@ -549,6 +549,7 @@ public:
   /// Finds the first occurrence of [r1, r2); an empty one at offset.
   template <class It, detail::IfIterator<It> = 0> ssize_t find(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
+    detail::RequireForward<It>();
     MIREL_ASSERT_NEEDLE(r1, r2);
     if (r1 == r2)
       return offset;
@@ -587,6 +588,7 @@ public:
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_first_of(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
+    detail::RequireForward<It>();
     MIREL_ASSERT_NEEDLE(r1, r2);
     const auto set = detail::Needle<T>(r1, r2);
     return Index(FindFirstOf(begin() + offset, end(), set.begin(), set.end()), end());
@@ -609,6 +611,7 @@ public:
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_first_not_of(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
+    detail::RequireForward<It>();
     MIREL_ASSERT_NEEDLE(r1, r2);
     const auto set = detail::Needle<T>(r1, r2);
     return Index(FindFirstNotOf(begin() + offset, end(), set.begin(), set.end()), end());
@@ -629,6 +632,7 @@ public:
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_last_of(It r1, It r2, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
+    detail::RequireForward<It>();
     MIREL_ASSERT_NEEDLE(r1, r2);
     const auto set = detail::Needle<T>(r1, r2);
     return Index(FindLastOf(begin(), After(offset), set.begin(), set.end()), After(offset));
@@ -651,6 +655,7 @@ public:
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_last_not_of(It r1, It r2, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
+    detail::RequireForward<It>();
     MIREL_ASSERT_NEEDLE(r1, r2);
     const auto set = detail::Needle<T>(r1, r2);
     return Index(FindLastNotOf(begin(), After(offset), set.begin(), set.end()), After(offset));
@@ -763,6 +768,15 @@ public:
 
   iterator erase(std::nullptr_t) = delete;
   template <class N, detail::IfIntegers<N> = 0> detail::WriteEraseElement erase(N) = delete;
+  // The pointer that a reverse iterator converts to isn't at the element that it designates.
+  template <class... A> detail::ReverseIteratorsOnlyStep erase(const detail::ReversePointer&, A...) = delete;
+  template <class... A> detail::ReverseIteratorsOnlyStep insert(const detail::ReversePointer&, A...) = delete;
+  template <class... A>
+  detail::ReverseIteratorsOnlyStep replace(const detail::ReversePointer&, A...) = delete;
+  template <class N, detail::IfIntegers<N> = 0>
+  detail::ReverseIteratorsOnlyStep assign(const detail::ReversePointer&, N) = delete;
+  template <class N, detail::IfIntegers<N> = 0>
+  detail::ReverseIteratorsOnlyStep append(const detail::ReversePointer&, N) = delete;
   template <class... N, detail::IfIntegers<N...> = 0> detail::WriteNullptr compare(N...) const = delete;
   /// @endcond
 
@@ -1002,6 +1016,7 @@ template <class T>
 template <class It, detail::IfIterator<It>>
 ssize_t xvector<T>::rfind(It r1, It r2, ssize_t offset) const {
   MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
+  detail::RequireForward<It>();
   MIREL_ASSERT_NEEDLE(r1, r2);
   if (r1 == r2)
     return offset == npos ? size() : offset;

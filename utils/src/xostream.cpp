@@ -35,6 +35,8 @@ protected:
   }
 
   std::streamsize xsputn(const char* p, std::streamsize n) override {
+    if (sink == nullptr)
+      return n;
     for (const char* const end = p + n; p != end;) {
       AddIndent();
       const char* const newline = indent == 0 ? end : mirel::Find(p, end, '\n');
@@ -139,7 +141,9 @@ public:
   }
 
   void PutText(const char* p, ssize_t pn) {
-    for (streamsize padded = width(0); padded > pn; --padded)
+    const streamsize padding = buffer.sink != nullptr ? width() - pn : 0;
+    width(0);
+    for (streamsize k = 0; k < padding; ++k)
       buffer.sputc(' ');
     PutBytes(p, pn);
   }
@@ -165,8 +169,9 @@ xostream::xostream(IOutputStream& os) : m_os(new IndentingOutputStreamToOStream(
 xostream::~xostream() { delete m_os; }
 
 void xostream::close() {
-  flush();
-  m_os->buffer.sink = nullptr;
+  m_os->buffer.Deliver();
+  if (IOutputStream* const sink = std::exchange(m_os->buffer.sink, nullptr))
+    sink->FlushStream();
 }
 
 void xostream::write(const xchar* p, ssize_t pn) {
