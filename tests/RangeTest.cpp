@@ -74,8 +74,8 @@ template <class T, class Container> void ExpectAll(const Container& units, long 
 /// T.
 template <class T, class U> void ExpectElements() {
   std::vector<U> v;
-  for (const unsigned char c : std::string(kUnits))
-    v.push_back(static_cast<U>(c));
+  for (const char c : std::string(kUnits))
+    v.push_back(static_cast<U>(static_cast<unsigned char>(c)));
   const std::list<U> list(v.begin(), v.end());
   const std::deque<U> deque(v.rbegin(), v.rend());
   const std::forward_list<U> forward(v.begin(), v.end());
