@@ -261,6 +261,13 @@ TYPED_TEST(Precondition, OfElementRuns) {
   ExpectStops(s, kCopied, std::vector<std::tuple<const T*, const T*>>{{q + 1, q}, {null, q}},
               {WITH_R1_R2(p_copy(q, r1, r2)), WITH_R1_R2(p_copy(+null, r1, r2))});
   ExpectStops(s, "src1 == src2 || dst != nullptr", kOnce, {WITHOUT(p_copy(+null, v.begin(), v.end()))});
+  const T* const c = q;
+  ExpectStops(s, kCopied, kOnce, {WITHOUT(p_copy(+null, c, c + 1))});
+  ExpectStops(s, kCount, kOnce, {WITHOUT(xvector<T>(int{-1}, T('x')))});
+  T copied[3] = {};
+  p_copy(copied, q, q + 3);
+  EXPECT_EQ(copied[2], 'c');
+  EXPECT_EQ((xvector<T>{'a', 'b', 'c'}).size(), 3);
   p_copy(+null, q, q), p_create(+null, +null, 'x'), p_create(q + 3, q, 'x'); // have nothing to do
   EXPECT_EQ(Std(s), Std(Of<T>("abc")));
 }

@@ -1,6 +1,7 @@
 // Ranges of every kind of iterator, given to every member that takes one.
 #include "Support.h"
 
+#include <cstdint>
 #include <deque>
 #include <forward_list>
 #include <iterator>
@@ -153,6 +154,14 @@ TYPED_TEST(Range, ElementsThatDontFitAreNowhere) {
   }
 }
 
+TEST(RangeTest, MoreThanMemoryHoldsIsAFailedAllocation) {
+  mirel::string16 w;
+  const auto at = [](std::size_t address) {
+    return std::make_move_iterator(reinterpret_cast<const char*>(address));
+  };
+  EXPECT_THROW(w.assign(at(1), at(SIZE_MAX / 2)), std::bad_alloc);
+}
+
 TEST(RangeTest, ASingleUnitCountsByItsUnsignedValue) {
   string16 w;
   const char c = '\xE9';
@@ -162,6 +171,7 @@ TEST(RangeTest, ASingleUnitCountsByItsUnsignedValue) {
   EXPECT_EQ(Std(w + c), (std::basic_string<char16>(8, 0xE9)));
   EXPECT_EQ(Std(string16(8, c)), Std(w + d));
   EXPECT_EQ(w.find(c, 1), 1);
+  EXPECT_EQ(w.find(true), kNpos);
   EXPECT_EQ(w.find_last_not_of(d), kNpos);
   EXPECT_EQ(w.FindAndEraseFirst(c), 1);
   EXPECT_EQ(w.FindAndErase(d), 6);

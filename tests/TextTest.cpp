@@ -306,6 +306,7 @@ TEST(UtfText, MalformedPiecesAreToldAtOnce) {
   EXPECT_EQ(stream.malformed().offset, kNpos);
   EXPECT_TRUE(stream.Append(dst, nullptr, 0));
   EXPECT_TRUE(stream.Finish(dst));
+  EXPECT_TRUE(stream.Finish(dst)) << "of an empty text";
   EXPECT_EQ(dst.size(), 3);
 }
 
@@ -329,13 +330,24 @@ TEST(UtfText, StringsViewsAndLiterals) {
   EXPECT_TRUE(mirel::IsWellFormed("a"));
   EXPECT_EQ(mirel::CountCodePoints("a\u20AC\xFF"), 3);
   EXPECT_EQ(mirel::Utf16Length("\U0001F600"), 2);
+  EXPECT_STREQ(mirel::Describe(static_cast<MalformedReason>(99)), "well-formed sequence");
+  EXPECT_FALSE(mirel::IsWellFormed(text));
+  EXPECT_EQ(mirel::ExplainMalformed(text, 4).reason, MalformedReason::kInvalidByte);
+  EXPECT_DEATH(mirel::ExplainMalformed("", 0, 0), "0 <= offset && offset < pn");
+  EXPECT_EQ(mirel::Utf16Length(text), 3);
+  EXPECT_EQ((--mirel::CodePoints(text).end()).position(), 4);
+  EXPECT_EQ(*mirel::CodePoints("b").begin(), U'b');
   mirel::string16 wide;
   EXPECT_EQ(mirel::Utf16FromUtf8Lossy(wide, "a\u20AC\xFF"), 1);
   EXPECT_EQ(Std(wide), (Text<char16>{'a', 0x20AC, 0xFFFD}));
   EXPECT_TRUE(mirel::AppendUtf16(wide, std::string("b")));
   EXPECT_TRUE(mirel::IsWellFormed(wide));
+  EXPECT_EQ(*--mirel::CodePoints(wide).end(), U'b');
   EXPECT_EQ(mirel::CountCodePoints(wide), 4);
   EXPECT_EQ(mirel::Utf8Length(wide), 8);
+  EXPECT_FALSE(mirel::AppendUtf16(wide, text));
+  EXPECT_EQ(mirel::Utf16FromUtf8Lossy(wide, text), 1);
+  EXPECT_FALSE(mirel::Utf8Stream().Append(wide, text));
   EXPECT_FALSE(mirel::Utf16FromUtf8(wide, text));
   EXPECT_EQ(Std(wide), (Text<char16>{'a', 0x20AC}));
   EXPECT_TRUE(mirel::Utf16FromUtf8(wide, "yz\0 after the end"));

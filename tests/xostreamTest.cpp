@@ -90,6 +90,8 @@ TEST(XOStream, WritesNothingOnceClosed) {
   Sink sink;
   xostream os(sink);
   os.close();
+  os.close();
+  EXPECT_EQ(os.width(), 0);
   os.Indent(ssize_t(1) << 30);
   os.width(1 << 30); // padding and indent of such a size would take seconds
   os << "x\nx";

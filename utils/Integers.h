@@ -40,11 +40,13 @@ template <class N> constexpr auto UnsignedValue(N x) {
 template <class T, class N> constexpr bool HasBitsFor(N x) {
   using Unsigned = decltype(UnsignedValue(x));
   using Max = std::numeric_limits<std::make_unsigned_t<T>>;
-  if constexpr (std::numeric_limits<Unsigned>::digits <= Max::digits)
+  if constexpr (std::numeric_limits<Unsigned>::digits <= Max::digits) {
     return true;
-  else
-    return UnsignedValue(x) <= Max::max() ||
-           (x < N{} && UnsignedValue(x) >= static_cast<Unsigned>(~static_cast<Unsigned>(Max::max() / 2)));
+  } else {
+    constexpr Unsigned kLeastNegative = static_cast<Unsigned>(~static_cast<Unsigned>(Max::max() / 2));
+    return UnsignedValue(x) <= Max::max() ||                // the compiler decides
+           (x < N{} && UnsignedValue(x) >= kLeastNegative); // the compiler decides
+  }
 }
 
 /// Isn't defined: a call that is left in a program doesn't compile.
@@ -62,7 +64,7 @@ template <class T, class N> [[gnu::always_inline]] inline void RefuseConstant([[
 
 /// A difference or count of any type as an ssize_t, the nearest one where that has fewer bits.
 template <class N> constexpr ssize_t Saturated(N n) {
-  if constexpr (sizeof(N) > sizeof(ssize_t)) {
+  if constexpr (sizeof(N) > sizeof(ssize_t)) { // the compiler decides
     using Limits = std::numeric_limits<ssize_t>;
     return n < Limits::min() ? Limits::min() : n > Limits::max() ? Limits::max() : static_cast<ssize_t>(n);
   } else {

@@ -76,7 +76,7 @@ constexpr bool kIsUnit = (std::is_integral_v<V> || std::is_enum_v<V>)&&!std::is_
                          sizeof(V) == sizeof(T);
 
 /// Whether iterators stand for pointers to units of the width of T. Asks for the containers of such only.
-template <class T, class It> constexpr bool StandsForPointer() {
+template <class T, class It> constexpr bool StandsForPointer() { // the compiler decides
   if constexpr (!kIsUnit<T, ValueType<It>> || std::is_volatile_v<std::remove_pointer_t<It>>)
     return false;
   else
@@ -136,7 +136,7 @@ constexpr bool IsInMemory(const std::reverse_iterator<It>& r1, const std::revers
 /// The unsigned value of an element of a range for a vector of T. What is no integer is one once it is a T.
 template <class T, class V, class X> constexpr auto SourceValue(const X& x) {
   static_assert(!std::is_floating_point_v<V>, "code units are integers: convert the numbers first");
-  if constexpr (std::is_integral_v<V> || std::is_enum_v<V>)
+  if constexpr (std::is_integral_v<V> || std::is_enum_v<V>) // the compiler decides
     return UnsignedValue(static_cast<V>(x));
   else
     return UnsignedValue(static_cast<T>(x));
@@ -162,7 +162,7 @@ public:
 
 private:
   void Settle() {
-    if constexpr (sizeof(T) > 1 && !std::is_same_v<T, V>)
+    if constexpr (sizeof(T) > 1 && !std::is_same_v<T, V>) // the compiler decides
       __asm__ volatile("" : "+r"(m_p) : : "memory");
   }
 
@@ -190,12 +190,14 @@ private:
   static constexpr ssize_t kMax = std::numeric_limits<ssize_t>::max();
 
   template <class It> static ssize_t Length(It r1, It r2) {
-    if constexpr (kIsRandomAccess<It>)
+    if constexpr (kIsRandomAccess<It>) {
       return Saturated(r2 - r1);
-    ssize_t length = 0;
-    for (; r1 != r2 && length != kMax; ++r1)
-      ++length;
-    return length;
+    } else {
+      ssize_t length = 0;
+      for (; r1 != r2; ++r1)
+        length += length != kMax;
+      return length;
+    }
   }
   void Reserve(ssize_t length) {
     m_units.reserve(length <= kMax / ssize_t(sizeof(T)) ? length * ssize_t(sizeof(T)) : kMax);

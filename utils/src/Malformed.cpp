@@ -53,9 +53,7 @@ ssize_t CutOffAtEnd(const char8* begin, const char8* end) {
   return 0;
 }
 
-ssize_t CutOffAtEnd(const char16* begin, const char16* end) {
-  return begin != end && IsHighSurrogate(end[-1]) ? 1 : 0;
-}
+ssize_t CutOffAtEnd(const char16*, const char16* end) { return IsHighSurrogate(end[-1]) ? 1 : 0; }
 
 template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end) {
   if (kernels != nullptr && end - p >= kLeastForKernels)

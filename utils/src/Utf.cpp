@@ -255,7 +255,7 @@ bool Utf8FromUtf16(string8& dst, std::u16string_view text) {
     isWellFormed = stream.Append(dst, block, static_cast<ssize_t>(part.size()));
     text.remove_prefix(part.size());
   }
-  isWellFormed = stream.Finish(dst) && isWellFormed;
+  isWellFormed = stream.Finish(dst);
   detail::Storage::GiveBack(dst, std::max(oldCapacity, dst.size() + 1));
   return isWellFormed;
 }

@@ -55,7 +55,7 @@ bool UtfStream<CharOut, CharIn>::Append(basic_xstring<CharOut>& dst, const CharI
   if (m_isFinished)
     *this = UtfStream(m_onMalformed);
   const CharIn* const end = p + pn;
-  while (m_pending != 0 && p != end && !HasStopped())
+  while (m_pending != 0 && p != end) // none is pending once it has stopped
     p += CompletePending(dst, p, end - p);
   if (p != end && !HasStopped()) {
     const ssize_t cutOff = detail::CutOffAtEnd(p, end);
