@@ -222,7 +222,7 @@ void RegisterLossy(const Language& language, std::size_t size, bool isMalformed)
 #endif
 }
 
-/// The way back; malformed, with a low surrogate at about every tenth unit.
+/// UTF-16 to UTF-8; malformed, with a low surrogate at about every tenth unit.
 void RegisterLossyBack(const Language& language, std::size_t size, bool isMalformed) {
   const auto& wellFormed = *new std::vector<std::u16string>(TextsIn<char16_t>(language, size));
   auto& texts = *new std::vector<std::u16string>(wellFormed);

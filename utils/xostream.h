@@ -36,7 +36,7 @@ public:
   /// @name Construction
   /// @{
 
-  /// Will write to os. Memory that can't be had is std::bad_alloc.
+  /// Will write to os. A failed allocation throws std::bad_alloc.
   xostream(IOutputStream& os);
   /// Flushes nothing: all that was written is with the sink already.
   ~xostream();
@@ -51,7 +51,7 @@ public:
 
   /// The pn bytes at p, handed to the sink before it returns. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void write(const xchar* p, ssize_t pn);
-  /// The same for bytes. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// Hands the pn bytes at p to the sink before it returns. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void writebytes(const uint8* p, ssize_t pn);
 
   /// @}
@@ -80,7 +80,7 @@ public:
   void put(double x);             ///< A number of precision() significant digits.
   void put(long double x);        ///< A number of precision() significant digits.
   void put(const void* x);        ///< An address, in hexadecimal.
-  /// A zero-terminated run. @pre "x"
+  /// Writes a null-terminated string. @pre "x"
   void put(ConstString8Z x);
   /// A counted run. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void put(const char8* p, ssize_t pn);

@@ -42,8 +42,9 @@ inline ssize_t GetStringLength(const char16* s) {
 /// pointer isn't taken for one.
 /// @pre "s != nullptr" of every null-terminated argument
 ///
-/// In braces two integers are a count and a unit, never a list: string8{3, 'x'} has three units, and
-/// `s = {3, 'x'}` doesn't compile. Only `s = {}` is an assignment, and empties the string.
+/// In braces two integers are a count and a unit where a string is made of them, and a list where a vector
+/// is, as for assign() or append(): string8{3, 'x'} has three units, and `s = {3, 'x'}` doesn't compile. Only
+/// `s = {}` is an assignment, and empties the string.
 template <class T> class MIREL_DESCRIBED MIREL_API basic_xstring : public xvector<T> {
   typedef xvector<T> Base;
 

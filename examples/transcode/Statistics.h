@@ -35,7 +35,7 @@ private:
 
   int64 m_bytes = 0;
   int64 m_newlines = 0;
-  int64 m_column = 0; ///< code points behind the last newline
+  int64 m_column = 0; ///< code points after the last newline
   int64 m_utf8Units = 0;
   int64 m_utf16Units = 0;
   int64 m_codePoints = 0;
