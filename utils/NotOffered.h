@@ -14,7 +14,8 @@
 
 namespace mirel {
 
-template <class T> class xvector;
+// Clang takes the visibility from the first declaration that it sees.
+template <class T> class MIREL_API xvector;
 
 namespace detail {
 
