@@ -140,6 +140,7 @@ inline ssize_t SizeOf(std::string_view text) { return static_cast<ssize_t>(text.
 /// the same ones in both directions.
 ///
 /// It decodes the code point at which it stands once, when it gets there. It yields values, not references.
+/// @snippet examples/reference.cpp code point iterators
 template <class T> class CodePointIterator {
 public:
   typedef std::bidirectional_iterator_tag iterator_concept; ///< For C++20, which lets values be yielded.
@@ -215,6 +216,7 @@ private:
 
 /// The code points of a text that it doesn't own, as CodePoints() makes it. Changing the text's storage
 /// invalidates it and its iterators.
+/// @snippet examples/reference.cpp code points
 template <class T> class CodePointRange {
 public:
   typedef CodePointIterator<T> iterator;       ///< Walks the code points.
@@ -246,6 +248,7 @@ private:
 /// A range for `for (char32_t c : CodePoints(s))`: the code points of a UTF-8 or UTF-16 text, and U+FFFD for
 /// each maximal subpart of malformed text, as the lossy conversions replace it. The range refers to the text,
 /// so a temporary string doesn't compile.
+/// @snippet examples/reference.cpp code points
 /// @{
 
 /// The code points of the pn units at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
@@ -267,6 +270,7 @@ CodePointRange<char8> CodePoints(std::nullptr_t) = delete;
 /// @name Appending a code point
 /// Append the units of c, or of U+FFFD where c is no Unicode scalar value: a surrogate or above U+10FFFF. A
 /// failed allocation throws std::bad_alloc and leaves dst as it was. Amortised constant time.
+/// @snippet examples/reference.cpp code points
 /// @{
 
 /// In UTF-8, one to four units.

@@ -17,6 +17,7 @@ namespace mirel {
 /// @name Element ranges
 /// A range is half open and given by two pointers; an empty one may be a pair of null pointers. Overload
 /// resolution picks the way: a `const T*` source is one block copy, any other source an element loop.
+/// @snippet examples/reference.cpp element ranges
 /// @{
 
 /// Assigns x to the elements of [r1, r2), in ascending order; a reversed range is empty.

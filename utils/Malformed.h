@@ -23,6 +23,7 @@ enum class MalformedReason {
 MIREL_API const char* Describe(MalformedReason reason);
 
 /// A malformed sequence in a text.
+/// @snippet examples/reference.cpp checking
 struct MalformedText {
   int64 offset;           ///< The index of its first unit.
   ssize_t length;         ///< The units that one U+FFFD replaces.

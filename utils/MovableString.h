@@ -20,6 +20,7 @@ namespace mirel {
 /// It takes over the storage of a temporary or moved basic_xstring, and `s.swap(m)` gives storage back to a
 /// basic_xstring `s`. Members that are inherited return what they return there: `substr()` a basic_xstring,
 /// whose storage is taken over without a copy, and `+` a vector, which is copied.
+/// @snippet examples/reference.cpp MovableString
 template <class T> class MIREL_DESCRIBED MovableString : public basic_xstring<T> {
   typedef basic_xstring<T> Base;
 

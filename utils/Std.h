@@ -71,11 +71,13 @@ template <class T> std::size_t HashText(TextRef<T> text) {
 } // namespace detail
 
 /// @name Comparison
-/// Of strings, vectors and sums of one width with each other, and with null-terminated strings and, in 8
-/// bits, whatever converts to `std::string_view`, on either side. Code units compare as unsigned values; of a
-/// string and its proper prefix, the prefix is first. A literal null pointer or 0 doesn't compile. Nothing is
-/// allocated; the cost is at worst linear in the shorter length.
+/// Of strings, vectors and sums of one width with each other, and with an Operand on either side: a
+/// null-terminated string or, in 8 bits, whatever converts to `std::string_view`. Code units compare as
+/// unsigned values; of a string and its proper prefix, the prefix is first. A literal null pointer or 0
+/// doesn't compile. Nothing is allocated; the cost is at worst linear in the shorter length.
 /// @pre "s != nullptr" of a null-terminated string
+///
+/// @snippet examples/reference.cpp operators
 /// @{
 
 /// Same code units, as _Eq().
@@ -128,9 +130,11 @@ template <class T> bool operator>=(detail::Operand<T> a, const xvector<T>& b) { 
 /// What a map is told to compare and hash by, so that it is searched with whatever the operators compare, and
 /// copies nothing: a `std::map` from C++17 on, an unordered one from C++20 on. Pointers are null-terminated
 /// strings, two of them too: never addresses.
+/// @snippet examples/reference.cpp keys
 /// @{
 
 /// The order of the operator `<`.
+/// @snippet examples/reference.cpp keys
 struct Less {
   typedef void is_transparent; ///< Look-ups take other types than the key's.
   /// Whether a orders before b.
@@ -141,6 +145,7 @@ struct Less {
 };
 
 /// The equality of the operator `==`.
+/// @snippet examples/reference.cpp keys
 struct Equal {
   typedef void is_transparent; ///< Look-ups take other types than the key's.
   /// Whether a and b have the same code units.
@@ -153,6 +158,7 @@ struct Equal {
 /// The hash of a text, whatever holds it; of 8-bit text that of the `std::string_view`. `std::hash` of a
 /// string is the same, for the default of unordered containers. Neither is noexcept: GNU's containers then
 /// keep the hash with each key, as they do for their own strings.
+/// @snippet examples/reference.cpp keys
 struct Hash {
   typedef void is_transparent; ///< Look-ups take other types than the key's.
   /// The hash of the code units.
@@ -165,6 +171,7 @@ struct Hash {
 /// @name Views, and copies to and from standard strings
 /// A char16 is no char16_t, and neither may be read through a pointer to the other; so 16-bit text has copies
 /// only.
+/// @snippet examples/reference.cpp views
 /// @{
 
 /// The units of s. The view is valid until the next change of s, c_str() included; of a temporary it doesn't

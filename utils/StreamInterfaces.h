@@ -10,6 +10,7 @@ namespace mirel {
 /// Where the bytes of an xostream go: implement it for a file, a socket or a string.
 /// What an implementation throws leaves the stream member that called it, which counts the bytes of that call
 /// as not written.
+/// @snippet examples/reference.cpp sinks
 struct MIREL_API IOutputStream {
   virtual ~IOutputStream();
   /// Takes the count bytes at address, all of them; count is above 0.

@@ -24,6 +24,7 @@
 namespace mirel {
 
 /// @name Checking
+/// @snippet examples/reference.cpp checking
 /// @{
 
 /// Where the first sequence begins that isn't well-formed, in units, or npos (-1) where there is none.
@@ -78,6 +79,7 @@ MalformedText ExplainMalformed(std::nullptr_t, ssize_t) = delete;
 /// @name Counting
 /// Lengths are those of what the lossy conversions give, which on well-formed text is what the strict ones
 /// do.
+/// @snippet examples/reference.cpp counting
 /// @{
 
 /// The units of a UTF-8 text in UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
@@ -120,6 +122,7 @@ ssize_t CountCodePoints(std::nullptr_t) = delete;
 /// is malformed, and the destination then holds what precedes the malformed sequence. A failed allocation
 /// throws std::bad_alloc and leaves the beginning of the result in the destination. The source may not lie in
 /// the destination.
+/// @snippet examples/reference.cpp strict conversions
 /// @{
 
 /// UTF-8 to UTF-16.
@@ -145,6 +148,7 @@ MIREL_API bool Utf8FromUtf16(string8& dst, std::u16string_view text);
 /// the destination held and the beginning of the result. Where storage grows, it at least doubles, so that
 /// many small texts take amortised linear time. The source may not lie in the destination. A UtfStream that
 /// replaces malformed text appends too.
+/// @snippet examples/reference.cpp appending conversions
 /// @{
 
 /// Appends UTF-8 as UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
@@ -172,6 +176,7 @@ inline bool AppendUtf8(string8& dst, const xvector<char16>& text) {
 /// Subparts). They return how many there are. A failed allocation throws std::bad_alloc and leaves the
 /// beginning of the result in the destination. The source may not lie in the destination. AppendCodePoint()
 /// of each of CodePoints() does it within one encoding.
+/// @snippet examples/reference.cpp lossy conversions
 /// @{
 
 /// UTF-8 to UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"

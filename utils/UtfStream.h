@@ -19,6 +19,7 @@ enum class OnMalformed {
 
 /// A conversion of text in pieces: Utf8Stream and Utf16Stream. Any way of cutting a text into pieces gives
 /// the result of the whole text.
+/// @snippet examples/reference.cpp streams
 template <class CharOut, class CharIn> class MIREL_API UtfStream {
 public:
   /// A stream at the beginning of a text.

@@ -32,6 +32,7 @@ struct Storage; // what the conversions know of a vector's storage
 /// A range is a pair of pointers or iterators, the second one past the last element. Code units compare as
 /// unsigned values in both widths. An empty range may be a pair of null pointers. At worst the cost is linear
 /// in the shorter length.
+/// @snippet examples/reference.cpp comparing ranges
 /// @{
 
 /// Orders two ranges by their first differing element; of a range and its proper prefix, the prefix is first.
@@ -92,6 +93,7 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 /// a set. It is linear in the sum of the lengths for needles of integers that both sides reach by
 /// random-access iterators, and for all that pointers to code units look for: these have overloads of the
 /// same names and results, which go by wide instructions where the processor has them.
+/// @snippet examples/reference.cpp searching ranges
 /// @{
 
 /// The first element equal to v, or i2.
@@ -301,12 +303,14 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 /// A failed allocation throws std::bad_alloc before anything has changed. Whatever may grow the buffer may
 /// move its storage and so invalidates pointers into it; erasing keeps the storage and moves down the bytes
 /// behind. A sequence of edits costs amortised constant time per byte added, plus the bytes that it moves.
+/// @snippet examples/reference.cpp VectorOfByte
 class MIREL_DESCRIBED MIREL_API VectorOfByte {
 public:
   typedef uint8 value_type;     ///< A byte.
   typedef value_type* iterator; ///< A pointer into the storage.
 
   /// @name Construction, copy
+  /// @snippet examples/reference.cpp bytes construction
   /// @{
 
   /// An empty buffer without storage.
@@ -336,6 +340,7 @@ public:
 
   /// @}
   /// @name Capacity
+  /// @snippet examples/reference.cpp bytes capacity
   /// @{
 
   ssize_t size() const { return size_; }          ///< Bytes in use.
@@ -361,6 +366,7 @@ public:
   /// @}
   /// @name Access
   /// data() and begin() are null in a buffer that has no storage yet.
+  /// @snippet examples/reference.cpp bytes access
   /// @{
 
   value_type* begin() { return m_buffer; }                        ///< The first byte.
@@ -408,6 +414,7 @@ public:
 
   /// @}
   /// @name Assigning, appending
+  /// @snippet examples/reference.cpp bytes assigning
   /// @{
 
   /// Becomes a copy of [r1, r2). @pre "r1 <= r2"
@@ -442,6 +449,7 @@ public:
   /// @}
   /// @name Inserting
   /// Before an iterator the precondition is on its distance from begin().
+  /// @snippet examples/reference.cpp bytes inserting
   /// @{
 
   /// Opens a gap of n bytes, of no particular value. @pre "0 <= i && i <= size()", then "0 <= n"
@@ -461,6 +469,7 @@ public:
 
   /// @}
   /// @name Moving, erasing
+  /// @snippet examples/reference.cpp bytes moving
   /// @{
 
   /// Moves n bytes from offset s to offset d, also where the two ranges overlap.
@@ -479,6 +488,7 @@ public:
   /// @name Comparison
   /// The sign of compare() tells the order of the bytes as unsigned values. The cost is at worst linear in
   /// the shorter length.
+  /// @snippet examples/reference.cpp bytes comparison
   /// @{
 
   /// Compares all bytes with those of r.
@@ -495,6 +505,7 @@ public:
   /// @}
   /// @name Relations
   /// In the order of compare(); buffers of different sizes are unequal at once.
+  /// @snippet examples/reference.cpp bytes relations
   /// @{
 
   bool operator==(const VectorOfByte& r) const {

@@ -28,12 +28,15 @@ class IndentingOutputStreamToOStream;
 /// ends the member that was called, and its exception goes to the caller. The bytes of the throwing call
 /// count as not written, and what the member had still to write is dropped. The next member calls the sink
 /// again; spaces of an indent that the sink has already taken aren't repeated.
+///
+/// @snippet examples/reference.cpp xostream
 class MIREL_API xostream {
 public:
   /// A function that does something to a stream, for use with <<.
   typedef xostream& (*Manipulator)(xostream&);
 
   /// @name Construction
+  /// @snippet examples/reference.cpp closing
   /// @{
 
   /// Will write to os. A failed allocation throws std::bad_alloc.
@@ -47,6 +50,7 @@ public:
   /// @name Writing bytes as they are
   /// Zeros included; width and precision don't matter, the indent does. A null pointer may come with a count
   /// of 0.
+  /// @snippet examples/reference.cpp writing bytes
   /// @{
 
   /// The pn bytes at p, handed to the sink before it returns. @pre "pn == 0 || (pn > 0 && p != nullptr)"
@@ -59,6 +63,7 @@ public:
   /// As `<<` of the standard streams, padded to width(), which is 0 again afterwards. Wide characters are
   /// written as UTF-8, and as U+FFFD where they are no code points by themselves. `<<` takes
   /// strings and manipulators only.
+  /// @snippet examples/reference.cpp writing values
   /// @{
 
   void put(bool x);               ///< 0 or 1.
@@ -93,6 +98,7 @@ public:
 
   /// @}
   /// @name Line ends, flushing
+  /// @snippet examples/reference.cpp line ends
   /// @{
 
   /// Passes the sink's FlushStream() on.
@@ -105,6 +111,7 @@ public:
   /// @}
   /// @name Format
   /// The setters return the old value.
+  /// @snippet examples/reference.cpp format
   /// @{
 
   streamsize precision() const;       ///< Significant digits of a number with a point, 6 at first.

@@ -45,11 +45,13 @@ inline ssize_t GetStringLength(const char16* s) {
 /// In braces two integers are a count and a unit where a string is made of them, and a list where a vector
 /// is, as for assign() or append(): string8{3, 'x'} has three units, and `s = {3, 'x'}` doesn't compile. Only
 /// `s = {}` is an assignment, and empties the string.
+/// @snippet examples/reference.cpp basic_xstring
 template <class T> class MIREL_DESCRIBED MIREL_API basic_xstring : public xvector<T> {
   typedef xvector<T> Base;
 
 public:
   /// @name Construction
+  /// @snippet examples/reference.cpp string construction
   /// @{
 
   /// An empty string, without storage.
@@ -77,6 +79,7 @@ public:
 
   /// @}
   /// @name Assignment
+  /// @snippet examples/reference.cpp string assignment
   /// @{
 
   /// Becomes a copy of r; keeps the storage where it is large enough.
@@ -95,6 +98,7 @@ public:
 
   /// @}
   /// @name Null termination
+  /// @snippet examples/reference.cpp null termination
   /// @{
 
   /// The contents with a null past the end, which is not part of the string.
@@ -116,6 +120,7 @@ public:
 
   /// @}
   /// @name Appending, inserting, replacing
+  /// @snippet examples/reference.cpp string edits
   /// @{
 
   using Base::operator+=;
@@ -143,6 +148,7 @@ public:
 
   /// @}
   /// @name Comparison
+  /// @snippet examples/reference.cpp string comparison
   /// @{
 
   using Base::compare;
@@ -165,6 +171,8 @@ public:
   ///
   /// and from offset down to 0 in reverse, npos being the last unit.
   /// @pre "offset == npos || (0 <= offset && offset < size())"
+  ///
+  /// @snippet examples/reference.cpp string search
   /// @{
 
   using Base::find;
@@ -261,6 +269,7 @@ extern template class basic_xstring<char16>;
 /// the result in the destination, the one from ASCII what was there before. On return the destination has the
 /// capacity that it had, or as much as the result and the terminator of c_str() need if that is more. The
 /// source may not lie in the destination; a null pointer may come with a count of 0.
+/// @snippet examples/reference.cpp conversions
 /// @{
 
 /// One unit for each byte: its value, or "?" for bytes from 0x80 on. @pre "newSize >= 0", of srcLen

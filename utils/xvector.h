@@ -50,12 +50,15 @@ namespace mirel {
 /// A run of edits takes amortised constant time per element added, plus that of the elements that move.
 /// @par Threads
 /// Different threads may use different vectors, and may read one vector that no thread changes.
+///
+/// @snippet examples/reference.cpp xvector
 template <class T> class MIREL_DESCRIBED MIREL_API xvector {
   static_assert(std::is_same_v<T, char8> || std::is_same_v<T, char16>,
                 "a vector is of char8 or char16; use std::vector for other elements");
 
 public:
   /// @name Types
+  /// @snippet examples/reference.cpp types
   /// @{
 
   typedef T value_type;                   ///< An element.
@@ -75,6 +78,7 @@ public:
   /// @}
   /// @name Construction, copy
   /// There is no move: copies copy, and swap() exchanges storage. A new vector's capacity is its size.
+  /// @snippet examples/reference.cpp construction
   /// @{
 
   /// An empty vector, without storage.
@@ -117,6 +121,7 @@ public:
 
   /// @}
   /// @name Capacity
+  /// @snippet examples/reference.cpp capacity
   /// @{
 
   /// Makes room for size elements in all, exactly; does nothing where there is room. @pre "size >= 0"
@@ -135,6 +140,7 @@ public:
   /// @}
   /// @name Access
   /// data() is null in a vector that has no storage yet. The elements stand one behind the other.
+  /// @snippet examples/reference.cpp access
   /// @{
 
   /// The first element.
@@ -177,6 +183,7 @@ public:
 
   /// @}
   /// @name Iterators
+  /// @snippet examples/reference.cpp iterators
   /// @{
 
   const_iterator begin() const { return data(); }   ///< The first element.
@@ -193,6 +200,7 @@ public:
   /// @}
   /// @name Assignment
   /// Replaces the whole contents; keeps the storage where it is large enough.
+  /// @snippet examples/reference.cpp assignment
   /// @{
 
   /// Becomes a copy of [r1, r2), which may be any iterators. @pre "r1 <= r2"
@@ -227,6 +235,7 @@ public:
 
   /// @}
   /// @name Appending
+  /// @snippet examples/reference.cpp appending
   /// @{
 
   /// Appends x. When the vector is full, the new capacity is the new size plus the old capacity.
@@ -306,6 +315,7 @@ public:
 
   /// @}
   /// @name Moving
+  /// @snippet examples/reference.cpp moving
   /// @{
 
   /// Copies n elements from index s to index d, also where the two ranges overlap. The size stays.
@@ -320,6 +330,7 @@ public:
   /// @}
   /// @name Inserting
   /// Before index or iterator i. Before an iterator the precondition is on its distance from begin().
+  /// @snippet examples/reference.cpp inserting
   /// @{
 
   /// Inserts the elements of [r1, r2), which may be any iterators.
@@ -377,6 +388,7 @@ public:
   /// @}
   /// @name Replacing
   /// Puts other elements in the place of the n from index i on, or of those of [i1, i2).
+  /// @snippet examples/reference.cpp replacing
   /// @{
 
   /// Replaces the n elements by those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
@@ -428,6 +440,7 @@ public:
   /// @name Erasing
   /// The elements behind move down in one step, which invalidates what points there; the storage stays. A
   /// count can't be npos.
+  /// @snippet examples/reference.cpp erasing
   /// @{
 
   /// Removes the elements of [i1, i2). @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
@@ -479,6 +492,7 @@ public:
   /// By the first differing element as an unsigned value; of a vector and its proper prefix, the prefix is
   /// first. compare() is negative, 0 or positive: for char8 a difference is the value of memcmp, otherwise
   /// -1, 0 or 1. The cost is at worst linear in the shorter length.
+  /// @snippet examples/reference.cpp comparison
   /// @{
 
   /// Compares all elements with those of r.
@@ -539,6 +553,7 @@ public:
   /// Nothing is allocated. At worst the cost is linear in the length searched for one element; in the sum of
   /// both lengths for needles and sets of code units, and for needles of integers by random-access iterators;
   /// and their product otherwise.
+  /// @snippet examples/reference.cpp search
   /// @{
 
   /// Finds the first element that is c.
@@ -837,6 +852,8 @@ private:
 /// Goes from the last element to the first: designates the element before the pointer that it holds. It only
 /// steps; for more use std::reverse_iterator.
 /// @pre "p" of every dereference and step: only a null pointer is caught
+///
+/// @snippet examples/reference.cpp reverse iterators
 template <class T> class xvector<T>::const_reverse_iterator : public detail::ReversePointer {
 public:
   typedef std::bidirectional_iterator_tag iterator_category; ///< It goes both ways.
@@ -891,6 +908,7 @@ protected:
 };
 
 /// Goes from the last element to the first, which may be changed.
+/// @snippet examples/reference.cpp reverse iterators
 template <class T> class xvector<T>::reverse_iterator : public xvector<T>::const_reverse_iterator {
 public:
   typedef T* pointer;   ///< What -> gives.

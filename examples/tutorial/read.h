@@ -34,7 +34,7 @@ inline bool Decode(mirel::string8& text, const mirel::string8& bytes, const Enco
   const int width = encoding.width;
   if (width == 1) {
     text = bytes;
-    return mirel::FindMalformed(text) == mirel::string8::npos;
+    return mirel::IsWellFormed(text);
   }
   mirel::string16 wide;
   for (mirel::ssize_t i = 0; i < bytes.size(); i += width) {

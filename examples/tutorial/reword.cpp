@@ -25,7 +25,7 @@ int main(int argc, char** argv) {
     result.append(file.text, from, file.text.size() - from);
     file.text.swap(result);
 
-    if (mirel::FindMalformed(file.text) != mirel::string8::npos)
+    if (!mirel::IsWellFormed(file.text))
       throw std::runtime_error("the new text would be malformed");
     Write(argv[1], file);
     std::printf("%d replaced\n%s", count, file.text.c_str());
