@@ -37,7 +37,7 @@ def calls(page):
     declarations = re.search(r"^```cpp\n(.*?)^```$", text, re.MULTILINE | re.DOTALL)[1]
     includes, rest = re.match(r"((?:#include.*\n|\n)*)(.*)", declarations, re.DOTALL).groups()
     rows = [re.split(r"(?<!\\)\|", line)[2] for line in text.splitlines() if line.startswith("| ")]
-    spans = [span.replace("\\|", "|") for row in rows for span in re.findall("`([^`]+)`", row)]
+    spans = [span.replace("\\|", "|") for row in rows for span in re.findall("`+([^`]+)`+", row)]
     assert spans, f"{page} has no calls"
     return f"{includes}\nvoid Calls() {{\n{rest}" + "".join(f"  {{ {span}; }}\n" for span in spans) + "}\n"
 
