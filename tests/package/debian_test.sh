@@ -1,16 +1,17 @@
 #!/usr/bin/env bash
-# Installs the packages in a bare root, uses them as README.md says, removes them, and looks for what is left.
+# Installs the packages in a bare root, uses them as README.md and the tutorial say, removes them, and looks for what is
+# left.
 # usage: debian_test.sh DIRECTORY-OF-PACKAGES ROOT.tar ROOT
 set -euo pipefail
 packages=$1 base=$2 root=$3
-readme=$(dirname "$0")/../../README.md
+top=$(dirname "$0")/../..
 rm -rf "$root"
 mkdir -p "$root/packages"
 tar -x --numeric-owner -f "$base" -C "$root"
 cp "$packages"/*.deb "$root/packages"
 mkdir "$root/program"
 
-block() { sed -n "/^\`\`\`$1\$/,/^\`\`\`\$/p" "$readme" | sed -n "/^\`\`\`$1\$/,/^\`\`\`\$/{/^\`\`\`/!p;/^\`\`\`\$/q}"; }
+block() { sed -n "/^\`\`\`$1\$/,/^\`\`\`\$/p" "$top/${2:-README.md}" | sed -n "/^\`\`\`$1\$/,/^\`\`\`\$/{/^\`\`\`/!p;/^\`\`\`\$/q}"; }
 block cpp >"$root/program/program.cpp"
 {
   echo 'cmake_minimum_required(VERSION 3.22)'
@@ -18,6 +19,14 @@ block cpp >"$root/program/program.cpp"
   echo 'add_executable(program program.cpp)'
   block cmake
 } >"$root/program/CMakeLists.txt"
+# The programs of the tutorial, which are the same in its page.
+mkdir "$root/tmp/tutorial"
+cp "$top"/examples/tutorial/*.{cpp,h,txt} "$root/tmp/tutorial"
+{
+  block cmake docs/tutorial.md
+  echo 'add_executable(count count.cpp)'
+  echo 'add_executable(reword reword.cpp)'
+} >"$root/tmp/tutorial/CMakeLists.txt"
 
 cat >"$root/tmp/check" <<'BARE'
 quietly() { "$@" >/tmp/log 2>&1 || { cat /tmp/log; echo "failed: $*"; exit 1; }; }
@@ -43,6 +52,10 @@ quietly cmake --build /tmp/cmake
 for program in /tmp/bare /tmp/pkg-config /tmp/static /tmp/cmake/program; do
   expect 'Grüße!! 世界 has 10 units' "$program"
 done
+cd /tmp/tutorial
+quietly cmake -B build
+quietly cmake --build build
+expect $'2 replaced\nGuten Tag, 世界!\nGuten Tag, 🌍!' build/reword greeting.txt Hallo 'Guten Tag'
 expect 'Grüße' sh -c "printf Grüße | transcode --to=utf-16be | transcode --from=utf-16be --to=utf-8"
 version=$(dpkg-query -W -f '${Version}' libmirel-dev)
 expect "transcode (mirel) $version" transcode --version
