@@ -1,205 +1,212 @@
 #include "Blocks.h"
 
 #include <algorithm>
-#include <cstring>
+#include <type_traits>
 
 namespace transcode {
 
 namespace {
 
-using mirel::char16;
-
 /// What a pipe holds. A block stays in the cache while it is decoded, counted and written; from half to four
 /// times the size was no faster.
 constexpr ssize_t kBlock = 1 << 16;
-/// The most bytes that a block leaves to the next one: of a UTF-8 sequence, or a unit and a half of UTF-16.
+/// The most bytes that a block leaves to the next one: of a UTF-8 sequence, a unit and a half of UTF-16, or
+/// of a unit of UTF-32.
 constexpr ssize_t kMaxUnfinished = 3;
 
-unsigned char Byte(char c) { return static_cast<unsigned char>(c); }
+/// The first of some units, which are well-formed, and what comes behind them: nothing, the beginning of a
+/// sequence, or a malformed one.
+struct Piece {
+  ssize_t size;
+  ssize_t malformed;  ///< the units of the malformed sequence
+  const char* reason; ///< null where it is none
+};
 
-/// Whether the machine keeps units in the other byte order than the encoding does.
-bool IsOtherOrder(Encoding encoding) {
-  const char16 one = 1;
-  char first;
-  std::memcpy(&first, &one, 1);
-  return (first == 1) != (encoding == Encoding::kUtf16Le);
+/// Finds the first fault of UTF-8 or UTF-16. What the next block may complete, as a stream would keep it, is
+/// none.
+template <class T> Piece FindPiece(const T* p, ssize_t n, bool isEnd) {
+  const ssize_t size = mirel::FindMalformed(p, n);
+  if (size < 0)
+    return {n, 0, nullptr};
+  const mirel::MalformedText malformed = mirel::ExplainMalformed(p, n, size);
+  std::conditional_t<sizeof(T) == 1, mirel::Utf8Stream, mirel::Utf16Stream> rest;
+  std::conditional_t<sizeof(T) == 1, string16, string8> none;
+  if (!isEnd && size + malformed.length == n && rest.Append(none, p + size, malformed.length))
+    return {size, 0, nullptr};
+  return {size, malformed.length, Describe(malformed.reason)};
 }
 
-void ExchangeBytes(string16& units) {
-  for (char16& unit : units)
-    unit = static_cast<char16>(unit << 8 | unit >> 8);
+Piece FindPieceOfUtf32(const char32_t* p, ssize_t n) {
+  const auto isSurrogate = [](char32_t c) { return c >> 11 == 0xD800 >> 11; };
+  const ssize_t size = std::find_if(p, p + n, [&](char32_t c) { return c > 0x10FFFF || isSurrogate(c); }) - p;
+  if (size == n)
+    return {n, 0, nullptr};
+  return {size, 1,
+          isSurrogate(p[size]) ? "surrogate in UTF-32" : Describe(mirel::MalformedReason::kBeyondUnicode)};
 }
 
-std::string_view BytesOf(const string8& s) { return {s.data(), static_cast<std::size_t>(s.size())}; }
-
-std::string_view BytesOf(const string16& s) {
-  return {reinterpret_cast<const char*>(s.data()), 2 * static_cast<std::size_t>(s.size())};
+Piece FindPieceOfAscii(const char16* p, ssize_t n) {
+  const ssize_t size = LengthBelow(0x80, p, n);
+  return {size, size < n, size < n ? "byte above 7F" : nullptr};
 }
 
-/// How many of the n bytes at p stand before the first that isn't ASCII.
-ssize_t AsciiLength(const char* p, ssize_t n) {
-  unsigned char all = 0;
-  for (ssize_t i = 0; i < n; ++i)
-    all = static_cast<unsigned char>(all | Byte(p[i]));
-  if (all < 0x80)
-    return n;
-  return std::find_if(p, p + n, [](char c) { return Byte(c) >= 0x80; }) - p;
+void AppendText(string16& text, const char* p, ssize_t n) { mirel::AppendUtf16(text, p, n); }
+void AppendText(string16& text, const char16* p, ssize_t n) { text.push_back(p, p + n); }
+void AppendText(string16& text, const char32_t* p, ssize_t n) {
+  std::for_each(p, p + n, [&text](char32_t c) { mirel::AppendCodePoint(text, c); });
 }
 
-mirel::OnMalformed PolicyOf(Mode mode) {
-  return mode == Mode::kReplace ? mirel::OnMalformed::kReplace : mirel::OnMalformed::kStop;
+void SetFromBytes(string16& units, const char* p, ssize_t n) {
+  units.resize(n, 0);
+  std::transform(p, p + n, units.data(), [](char c) { return static_cast<unsigned char>(c); });
 }
 
 } // namespace
 
-Blocks::Blocks(Input& input, Encoding from, Mode mode)
-    : m_input(input), m_from(from), m_mode(mode), m_toUtf16(PolicyOf(mode)), m_toUtf8(PolicyOf(mode)),
+Blocks::Blocks(Input& input, const Encoding& from, Mode mode, char16 replacement)
+    : m_input(input), m_from(from), m_mode(mode), m_replacement(replacement), m_order(from.order),
       m_buffer(kBlock + kMaxUnfinished, '\0') {}
 
 bool Blocks::Next() {
   bool isEnd = false;
+  m_isFirst = m_isFirst && m_size == 0;
   m_fault.reset();
   do {
     m_buffer.move(0, m_size, m_filled - m_size);
     m_filled -= m_size;
-    const ssize_t fed = m_filled, count = m_input.Read(m_buffer.data() + fed, kBlock);
+    const ssize_t count = m_input.Read(m_buffer.data() + m_filled, kBlock);
     m_filled += count;
     isEnd = count == 0;
     if (m_filled == 0)
       return false;
-    Decode(fed, isEnd);
+    Decode(isEnd);
   } while (m_size == 0 && !isEnd && !m_fault);
   return true;
 }
 
-/// Sets the block to what is well-formed or replaced; its first bytes, as many as fed, were seen before.
-void Blocks::Decode(ssize_t fed, bool isEnd) {
-  const int64 before = m_replacements;
-  if (IsUtf16(m_from))
-    DecodeUtf16(isEnd);
-  else if (m_from == Encoding::kAscii)
-    DecodeAscii();
-  else if (m_mode == Mode::kCheck)
-    m_size = Check(m_buffer.data(), m_filled, isEnd);
-  else
-    DecodeUtf8(fed, isEnd);
-  m_isReplaced = m_replacements != before;
-  if (!m_isReplaced)
-    return;
-  if (IsUtf16(m_from))
-    mirel::Utf16FromUtf8(m_text, m_utf8);
-  else
-    mirel::Utf8FromUtf16(m_utf8, m_text);
+/// Sets the block to what is well-formed, replaced or dropped.
+void Blocks::Decode(bool isEnd) {
+  m_utf8.clear();
+  m_resumptions.clear();
+  m_hasUtf8 = false;
+  m_isInPieces = false;
+  m_size = 0;
+  if (m_order == ByteOrder::kByMark) {
+    if (m_filled < UnitSize(m_from.form) && !isEnd)
+      return;
+    m_order = OrderByMark();
+  }
+  switch (m_from.form) {
+  case Form::kUtf8: DecodeUtf8(isEnd); break;
+  case Form::kUtf16: DecodeUtf16(isEnd); break;
+  case Form::kUtf32: DecodeUtf32(); break;
+  case Form::kLatin1:
+  case Form::kAscii: DecodeBytes(); break;
+  }
+  const ssize_t rest = m_filled - m_size; // a part of a unit?
+  if (isEnd && rest > 0 && rest < UnitSize(m_from.form) &&
+      GoesOnBehind({m_size, Describe(mirel::MalformedReason::kTruncated)}, rest))
+    m_size = m_filled;
 }
 
-void Blocks::DecodeUtf8(ssize_t fed, bool isEnd) {
-  const int64 begin = m_toUtf16.position() - fed;
+/// The order that the first bytes tell. Without a mark it is big-endian: RFC 2781, section 4.3, and the
+/// Unicode Standard, definitions D98 and D101.
+ByteOrder Blocks::OrderByMark() const {
+  const ssize_t size = UnitSize(m_from.form);
+  const std::string_view mark =
+      size == 2 ? std::string_view("\xFF\xFE", 2) : std::string_view("\xFF\xFE\0\0", 4);
+  const bool isLittle = std::string_view(m_buffer.data(), std::size_t(std::min(m_filled, size))) == mark;
+  return isLittle ? ByteOrder::kLittle : ByteOrder::kBig;
+}
+
+void Blocks::DecodeUtf8(bool isEnd) {
   m_text.clear();
-  if (isEnd)
-    m_toUtf16.Finish(m_text);
-  else
-    m_toUtf16.Append(m_text, m_buffer.data() + fed, m_filled - fed);
-  m_size = m_filled - m_toUtf16.pending();
-  if (Note(m_toUtf16, begin, 1))
-    m_size = m_fault->offset;
+  mirel::Utf8Stream stream;
+  if (m_mode != Mode::kCheck && stream.Append(m_text, m_buffer.data(), m_filled) &&
+      !(isEnd && stream.pending() > 0)) {
+    m_size = m_filled - stream.pending();
+    return;
+  }
+  DecodePieces(m_buffer.data(), m_filled,
+               [isEnd](const char* p, ssize_t n) { return FindPiece(p, n, isEnd); });
 }
 
 void Blocks::DecodeUtf16(bool isEnd) {
-  m_text.resize(m_filled / 2, 0);
-  if (m_filled >= 2)
-    std::memcpy(m_text.data(), m_buffer.data(), 2 * static_cast<std::size_t>(m_text.size()));
-  if (IsOtherOrder(m_from))
-    ExchangeBytes(m_text);
-  const ssize_t fed = m_toUtf8.pending();
-  const int64 begin = m_toUtf8.position() - fed;
-  m_utf8.clear();
-  if (m_mode == Mode::kCheck) {
-    m_text.resize(Check(m_text.data(), m_text.size(), isEnd), 0);
-  } else {
-    m_toUtf8.Append(m_utf8, m_text.data() + fed, m_text.size() - fed);
-    if (isEnd)
-      m_toUtf8.Finish(m_utf8);
-    m_text.resize(m_text.size() - m_toUtf8.pending(), 0);
-    if (Note(m_toUtf8, begin, 2))
-      m_text.resize(m_fault->offset / 2, 0);
+  ReadUnits(m_text, m_buffer.data(), m_filled, m_order);
+  mirel::Utf16Stream stream;
+  if (m_mode != Mode::kCheck && stream.Append(m_utf8, m_text) && !(isEnd && stream.pending() > 0)) {
+    m_text.resize(m_text.size() - stream.pending(), 0);
+    m_size = 2 * m_text.size();
+    m_hasUtf8 = true;
+    return;
   }
-  m_size = 2 * m_text.size();
-  if (isEnd && m_filled % 2 != 0 && m_size + 1 == m_filled)
-    EndOddly();
+  m_units16.swap(m_text);
+  DecodePieces(m_units16.data(), m_units16.size(),
+               [isEnd](const char16* p, ssize_t n) { return FindPiece(p, n, isEnd); });
 }
 
-/// The input ends with half a unit.
-void Blocks::EndOddly() {
-  if (m_mode == Mode::kReplace) {
-    mirel::AppendCodePoint(m_utf8, 0xFFFD);
+void Blocks::DecodeUtf32() {
+  ReadUnits(m_units32, m_buffer.data(), m_filled, m_order);
+  DecodePieces(m_units32.data(), static_cast<ssize_t>(m_units32.size()), FindPieceOfUtf32);
+}
+
+void Blocks::DecodeBytes() {
+  SetFromBytes(m_text, m_buffer.data(), m_filled);
+  if (m_from.form == Form::kLatin1 || LengthBelow(0x80, m_text.data(), m_filled) == m_filled) {
     m_size = m_filled;
-  }
-  if (m_replacements == 0)
-    m_fault = Fault{m_filled - 1, Describe(mirel::MalformedReason::kTruncated)};
-  m_replacements += m_mode == Mode::kReplace;
-}
-
-void Blocks::DecodeAscii() {
-  m_size = AsciiLength(m_buffer.data(), m_filled);
-  mirel::Utf16FromAscii(m_text, m_buffer.data(), m_size);
-  if (m_size == m_filled)
     return;
-  if (m_replacements == 0)
-    m_fault = Fault{m_size, "byte above 7F"};
-  if (m_mode != Mode::kReplace)
-    return;
-  for (; m_size < m_filled; ++m_size) {
-    const bool isAscii = Byte(m_buffer[m_size]) < 0x80;
-    mirel::AppendCodePoint(m_text, isAscii ? Byte(m_buffer[m_size]) : 0xFFFD);
-    m_replacements += !isAscii;
+  }
+  m_units16.swap(m_text);
+  DecodePieces(m_units16.data(), m_filled, FindPieceOfAscii);
+}
+
+/// Decodes a block that isn't known to be well-formed.
+template <class T, class FindPiece> void Blocks::DecodePieces(const T* p, ssize_t n, FindPiece findPiece) {
+  const ssize_t unitSize = UnitSize(m_from.form);
+  m_text.clear();
+  m_utf8.clear();
+  m_isInPieces = true;
+  for (ssize_t i = 0;;) {
+    const Piece piece = findPiece(p + i, n - i);
+    if (m_mode != Mode::kCheck)
+      AppendText(m_text, p + i, piece.size);
+    i += piece.size;
+    m_size = i * unitSize;
+    if (piece.reason == nullptr || !GoesOnBehind({m_size, piece.reason}, piece.malformed * unitSize))
+      return;
+    i += piece.malformed;
   }
 }
 
-/// How many of n units are well-formed. Those that the next block may complete, as a stream would keep them,
-/// are left for then.
-template <class T> ssize_t Blocks::Check(const T* p, ssize_t n, bool isEnd) {
-  const ssize_t size = mirel::FindMalformed(p, n);
-  if (size < 0)
-    return n;
-  const mirel::MalformedText malformed = mirel::ExplainMalformed(p, n, size);
-  std::conditional_t<sizeof(T) == 1, mirel::Utf8Stream, mirel::Utf16Stream> rest;
-  std::conditional_t<sizeof(T) == 1, string16, string8> none;
-  if (isEnd || size + malformed.length < n || !rest.Append(none, p + size, malformed.length))
-    m_fault = Fault{size * ssize_t(sizeof(T)), Describe(malformed.reason)};
-  return size;
+/// Notes a fault of as many bytes, and replaces it if it is to be. @return whether the text goes on behind it
+bool Blocks::GoesOnBehind(const Fault& fault, ssize_t length) {
+  if (m_faults == 0)
+    m_fault = fault;
+  if (m_mode != Mode::kReplace && m_mode != Mode::kDrop)
+    return false;
+  ++m_faults;
+  m_hasUtf8 = false;
+  if (m_mode == Mode::kReplace)
+    m_text.push_back(m_replacement);
+  m_resumptions.push_back({fault.offset + length, m_text.size()});
+  return true;
 }
 
-/// Notes what a stream has found in a block that begins with the given unit. @return whether the block ends
-/// there
-template <class Stream> bool Blocks::Note(const Stream& stream, int64 begin, ssize_t unitBytes) {
-  const mirel::MalformedText& malformed = stream.malformed();
-  if (malformed.offset >= begin && m_replacements == 0)
-    m_fault = Fault{static_cast<ssize_t>(malformed.offset - begin) * unitBytes, Describe(malformed.reason)};
-  m_replacements = stream.replacements();
-  return m_fault && m_mode != Mode::kReplace;
+std::string_view Blocks::Utf8() {
+  if (m_from.form == Form::kUtf8 && m_resumptions.empty())
+    return Bytes();
+  if (!m_hasUtf8)
+    mirel::Utf8FromUtf16(m_utf8, m_text);
+  m_hasUtf8 = true;
+  return BytesOf(m_utf8);
 }
 
-std::string_view Blocks::Utf8() const { return IsUtf16(m_from) || m_isReplaced ? BytesOf(m_utf8) : Bytes(); }
-
-std::string_view Blocks::In(Encoding to) {
-  if (!IsUtf16(to))
-    return Utf8();
-  if (!IsOtherOrder(to))
-    return BytesOf(m_text);
-  m_otherOrder = m_text;
-  ExchangeBytes(m_otherOrder);
-  return BytesOf(m_otherOrder);
-}
-
-bool Blocks::ComesBack() {
-  if (!IsUtf16(m_from)) {
-    mirel::Utf8FromUtf16(m_back, m_text.data(), m_text.size());
-    return BytesOf(m_back) == Bytes();
-  }
-  mirel::Utf16FromUtf8(m_otherOrder, m_utf8.data(), m_utf8.size());
-  if (IsOtherOrder(m_from))
-    ExchangeBytes(m_otherOrder);
-  return BytesOf(m_otherOrder) == Bytes();
+ssize_t Blocks::OffsetOf(ssize_t index) const {
+  Resumption last = {0, 0};
+  for (const Resumption& resumption : m_resumptions)
+    if (resumption.index <= index)
+      last = resumption;
+  return last.offset + EncodedSize(m_from.form, m_text.data() + last.index, index - last.index);
 }
 
 } // namespace transcode

@@ -1,5 +1,6 @@
 #include "Files.h"
 
+#include <algorithm>
 #include <atomic>
 #include <cerrno>
 #include <csignal>
@@ -7,6 +8,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
+#include <iterator>
 #include <system_error>
 
 #include <fcntl.h>
@@ -27,18 +29,39 @@ extern "C" void RemoveUnfinished(int signal) {
   raise(signal); // with its own effect now
 }
 
+/// Whether a signal that nobody handles lets the process live, if only after a stop.
+bool IsHarmless(int signal) {
+  constexpr int kHarmless[] = {SIGCHLD, SIGCONT, SIGTSTP, SIGTTIN, SIGTTOU, SIGURG, SIGWINCH};
+  return std::find(std::begin(kHarmless), std::end(kHarmless), signal) != std::end(kHarmless);
+}
+
 void RemoveWhenInterrupted(const char* name) {
   unfinished = name;
-  for (const int signal : {SIGHUP, SIGINT, SIGQUIT, SIGPIPE, SIGTERM, SIGXCPU, SIGXFSZ}) {
+  for (int signal = 1; signal <= SIGRTMAX; ++signal) {
     struct sigaction action = {};
-    sigaction(signal, nullptr, &action);
-    if (action.sa_handler != SIG_DFL)
+    if (IsHarmless(signal) || sigaction(signal, nullptr, &action) != 0 || action.sa_handler != SIG_DFL)
       continue; // who started the program wants it ignored
     action.sa_handler = RemoveUnfinished;
     action.sa_flags = static_cast<int>(SA_RESETHAND);
     sigaction(signal, &action, nullptr);
   }
 }
+
+/// Holds signals back, so that none comes between the making of a file and the note that it is to be removed.
+class SignalBlocker {
+public:
+  SignalBlocker() {
+    sigset_t all;
+    sigfillset(&all);
+    sigprocmask(SIG_SETMASK, &all, &m_before);
+  }
+  ~SignalBlocker() { sigprocmask(SIG_SETMASK, &m_before, nullptr); }
+  SignalBlocker(const SignalBlocker&) = delete;
+  SignalBlocker& operator=(const SignalBlocker&) = delete;
+
+private:
+  sigset_t m_before;
+};
 
 /// What a link, or a chain of them, leads to; it need not exist.
 std::string FollowLinks(const std::string& name) {
@@ -52,6 +75,12 @@ std::string FollowLinks(const std::string& name) {
 }
 
 } // namespace
+
+void HoldClosedStreams() {
+  for (const int fd : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
+    if (fcntl(fd, F_GETFD) == -1) // the first that is free is taken
+      open("/dev/null", fd == STDIN_FILENO ? O_WRONLY : O_RDONLY);
+}
 
 std::runtime_error SystemError(const std::string& name) {
   return std::runtime_error(name + ": " + std::strerror(errno));
@@ -79,11 +108,16 @@ ssize_t Input::Read(char* p, ssize_t n) {
   }
 }
 
-int64 Input::BytesLeft() const {
-  struct stat status;
-  if (fstat(m_fd, &status) != 0 || !S_ISREG(status.st_mode))
-    return 0;
-  return status.st_size - lseek(m_fd, 0, SEEK_CUR);
+int64 BytesLeft(const std::vector<std::string>& names) {
+  int64 left = 0;
+  for (const std::string& name : names) {
+    struct stat status;
+    if ((name == "-" ? fstat(STDIN_FILENO, &status) : stat(name.c_str(), &status)) != 0 ||
+        !S_ISREG(status.st_mode))
+      return 0;
+    left += status.st_size - (name == "-" ? lseek(STDIN_FILENO, 0, SEEK_CUR) : 0);
+  }
+  return left;
 }
 
 Output::Output(const std::string& name) : m_name(name), m_fd(STDOUT_FILENO) {
@@ -101,15 +135,23 @@ Output::Output(const std::string& name) : m_name(name), m_fd(STDOUT_FILENO) {
       throw SystemError(name);
     return;
   }
+  if (exists && faccessat(AT_FDCWD, name.c_str(), W_OK, AT_EACCESS) != 0)
+    throw SystemError(name); // to rename asks for no leave of the file that goes
   m_target = FollowLinks(name);
-  m_temporary = m_target + ".XXXXXX";
-  m_fd = mkstemp(m_temporary.data());
-  if (m_fd == -1)
-    throw SystemError(name);
-  RemoveWhenInterrupted(m_temporary.c_str());
   const mode_t mask = umask(0);
   umask(mask);
-  fchmod(m_fd, exists ? old.st_mode & 07777 : 0666 & ~mask);
+  OpenTemporary(exists ? old.st_mode & 07777 : 0666 & ~mask);
+}
+
+/// Its name is a short one, so that a target may have one of any length that is allowed.
+void Output::OpenTemporary(unsigned mode) {
+  m_temporary = std::filesystem::path(m_target).replace_filename(".transcode-XXXXXX");
+  const SignalBlocker blocker;
+  m_fd = mkstemp(m_temporary.data());
+  if (m_fd == -1)
+    throw SystemError(m_name);
+  RemoveWhenInterrupted(m_temporary.c_str());
+  fchmod(m_fd, static_cast<mode_t>(mode));
 }
 
 Output::~Output() {
@@ -134,6 +176,9 @@ void Output::Write(std::string_view bytes) {
 void Output::Finish() {
   if (m_target.empty())
     return;
+  // Without it, a machine that goes down soon may come up with the new name for no text.
+  if (fsync(m_fd) != 0 && errno != EINVAL) // which tells of a file system that can't
+    throw SystemError(m_name);
   const int fd = m_fd;
   m_fd = -1;
   if (close(fd) != 0 || std::rename(m_temporary.c_str(), m_target.c_str()) != 0)

@@ -1,91 +1,151 @@
 #include "Options.h"
 
-#include <cstring>
+#include <optional>
+#include <string_view>
 
 #include <getopt.h>
 
 namespace transcode {
 
-const char kUsage[] = "Usage: transcode [--from ENC] [--to ENC] [-o OUT] [--report] [--replace | --check]\n  "
-                      "               [--quiet] [FILE]\n";
+const char kUsage[] =
+    "Usage: transcode [--from ENC] [--to ENC] [-o OUT] [--report] [--replace | -c] [--bom HOW]\n"
+    "                 [--line-endings ENDS] [--quiet] [FILE...]\n"
+    "       transcode --check [--from ENC] [--quiet] [FILE...]\n"
+    "       transcode --list | --help | --version\n";
 const char kHelp[] =
     "Converts text from one encoding to another, of any length in little memory.\n"
     "\n"
-    "  -f, --from ENC    encoding of the input: utf-8 (default), utf-16le, utf-16be or ascii\n"
-    "  -t, --to ENC      encoding of the output: utf-8 (default), utf-16le or utf-16be\n"
-    "  -o, --output OUT  write to the file OUT instead of standard output\n"
-    "  -r, --report      print what is in the text instead of the text; with -o, both\n"
-    "  -R, --replace     replace malformed text by U+FFFD, and say how much of it there was\n"
-    "  -c, --check       write nothing: only say whether the input is well-formed\n"
-    "  -q, --quiet       show no progress on the terminal\n"
-    "  -h, --help        print this help\n"
-    "  -V, --version     print the version\n"
+    "  -f, --from ENC           encoding of the input, utf-8 by default\n"
+    "  -t, --to ENC             encoding of the output, utf-8 by default\n"
+    "  -l, --list               print the encodings, each with its other names\n"
+    "  -o, --output OUT         write to the file OUT instead of standard output\n"
+    "  -r, --report             print what is in the text instead of the text; with -o, both\n"
+    "  -R, --replace            replace malformed text by U+FFFD, and by ? what the output's encoding\n"
+    "                           lacks; say how much of it there was\n"
+    "  -c, --drop               leave it out instead\n"
+    "  -C, --check              write nothing: only say whether the input is well-formed\n"
+    "      --bom HOW            keep, strip or add the byte order mark. By default utf-16 and utf-32\n"
+    "                           have one in the output and lose it in the input; others keep it\n"
+    "      --line-endings ENDS  end each line with lf or crlf\n"
+    "  -q, --quiet              show no progress on the terminal\n"
+    "  -h, --help               print this help\n"
+    "  -V, --version            print the version\n"
     "\n"
-    "Without FILE, or with - for FILE or OUT, the standard streams are used. A byte order mark\n"
-    "is text like any other. When the input is malformed, the first fault and its place are named\n"
-    "and the exit code is 1; 2 tells of wrong usage. A file OUT then stays as it was, but what\n"
-    "goes to standard output or a device has been written up to the fault.\n";
+    "Without FILE, or with - for FILE or OUT, the standard streams are used. The text of several\n"
+    "files is written one behind the other. When the input is malformed, or has a character that\n"
+    "the output's encoding lacks, the first fault and its place are named and the exit code is 1;\n"
+    "2 tells of wrong usage. A file OUT then stays as it was, but what goes to standard output or\n"
+    "a device has been written up to the fault.\n";
 
 namespace {
 
-struct EncodingName {
-  const char* name;
-  Encoding encoding;
-};
-constexpr EncodingName kEncodings[] = {{"utf-8", Encoding::kUtf8},
-                                       {"utf-16le", Encoding::kUtf16Le},
-                                       {"utf-16be", Encoding::kUtf16Be},
-                                       {"ascii", Encoding::kAscii}};
+enum LongOnly { kBom = 256, kLineEndings };
 
-Encoding ParseEncoding(const char* text) {
-  for (const EncodingName& e : kEncodings)
-    if (strcasecmp(text, e.name) == 0)
-      return e.encoding;
-  throw UsageError(std::string("unknown encoding '") + text + "'");
+constexpr option kOptions[] = {
+    {"from", required_argument, nullptr, 'f'}, {"to", required_argument, nullptr, 't'},
+    {"list", no_argument, nullptr, 'l'},       {"output", required_argument, nullptr, 'o'},
+    {"report", no_argument, nullptr, 'r'},     {"replace", no_argument, nullptr, 'R'},
+    {"drop", no_argument, nullptr, 'c'},       {"check", no_argument, nullptr, 'C'},
+    {"bom", required_argument, nullptr, kBom}, {"line-endings", required_argument, nullptr, kLineEndings},
+    {"quiet", no_argument, nullptr, 'q'},      {"help", no_argument, nullptr, 'h'},
+    {"version", no_argument, nullptr, 'V'},    {nullptr, 0, nullptr, 0}};
+
+/// What is known of the options before it is seen whether they go together.
+struct Parsed {
+  Options options;
+  bool replace = false;
+  bool drop = false;
+  bool check = false;
+  std::optional<Mark> mark;
+};
+
+const Encoding* ParseEncoding(const char* name) {
+  if (const Encoding* const encoding = FindEncoding(name))
+    return encoding;
+  const std::string nearest = NearestNames(name);
+  throw UsageError(
+      std::string("unknown encoding '") + name + "'; " +
+      (nearest.empty() ? "--list prints those that are known" : "did you mean " + nearest + "?"));
+}
+
+Mark ParseMark(std::string_view how) {
+  if (how == "keep")
+    return Mark::kKeep;
+  if (how == "strip")
+    return Mark::kStrip;
+  if (how == "add")
+    return Mark::kAdd;
+  throw UsageError("--bom takes keep, strip or add, not '" + std::string(how) + "'");
+}
+
+LineEnds ParseLineEnds(std::string_view ends) {
+  if (ends == "lf")
+    return LineEnds::kLf;
+  if (ends == "crlf")
+    return LineEnds::kCrLf;
+  throw UsageError("--line-endings takes lf or crlf, not '" + std::string(ends) + "'");
+}
+
+std::string ParseOutput(std::string_view name) {
+  if (name.empty())
+    throw UsageError("OUT has no name");
+  return std::string(name);
+}
+
+void ParseOption(Parsed& parsed, int option) {
+  Options& options = parsed.options;
+  switch (option) {
+  case 'f': options.from = ParseEncoding(optarg); break;
+  case 't': options.to = ParseEncoding(optarg); break;
+  case 'l': options.list = true; break;
+  case 'o': options.output = ParseOutput(optarg); break;
+  case 'r': options.report = true; break;
+  case 'R': parsed.replace = true; break;
+  case 'c': parsed.drop = true; break;
+  case 'C': parsed.check = true; break;
+  case kBom: parsed.mark = ParseMark(optarg); break;
+  case kLineEndings: options.lineEnds = ParseLineEnds(optarg); break;
+  case 'q': options.quiet = true; break;
+  case 'h': options.help = true; break;
+  case 'V': options.version = true; break;
+  default: throw UsageError("");
+  }
+}
+
+/// A mark is what utf-16 and utf-32 tell the byte order by, and no text; elsewhere it is.
+Mark UsualMark(const Encoding& from, const Encoding& to) {
+  if (to.IsByMark())
+    return Mark::kAdd;
+  return from.IsByMark() ? Mark::kStrip : Mark::kKeep;
+}
+
+void Combine(Parsed& parsed) {
+  Options& options = parsed.options;
+  if (parsed.check && (parsed.replace || parsed.drop || options.report || !options.output.empty() ||
+                       parsed.mark || options.lineEnds != LineEnds::kKeep))
+    throw UsageError("--check goes with --from and --quiet only");
+  if (parsed.replace && parsed.drop)
+    throw UsageError("--replace and --drop exclude each other");
+  if (parsed.mark == Mark::kAdd && !options.to->IsUnicode())
+    throw UsageError(std::string(options.to->name) + " has no byte order mark to add");
+  options.mark = parsed.mark.value_or(UsualMark(*options.from, *options.to));
+  options.mode = parsed.check     ? Mode::kCheck
+                 : parsed.replace ? Mode::kReplace
+                 : parsed.drop    ? Mode::kDrop
+                                  : Mode::kConvert;
+  if (options.inputs.empty())
+    options.inputs = {"-"};
 }
 
 } // namespace
 
-const char* Name(Encoding encoding) { return kEncodings[static_cast<int>(encoding)].name; }
-
 Options ParseOptions(int argc, char** argv) {
-  static const option kOptions[] = {
-      {"from", required_argument, nullptr, 'f'},   {"to", required_argument, nullptr, 't'},
-      {"output", required_argument, nullptr, 'o'}, {"report", no_argument, nullptr, 'r'},
-      {"replace", no_argument, nullptr, 'R'},      {"check", no_argument, nullptr, 'c'},
-      {"quiet", no_argument, nullptr, 'q'},        {"help", no_argument, nullptr, 'h'},
-      {"version", no_argument, nullptr, 'V'},      {nullptr, 0, nullptr, 0}};
-  Options options;
-  bool replace = false;
-  for (int c; (c = getopt_long(argc, argv, "f:t:o:rRcqhV", kOptions, nullptr)) != -1;) {
-    switch (c) {
-    case 'f': options.from = ParseEncoding(optarg); break;
-    case 't': options.to = ParseEncoding(optarg); break;
-    case 'o':
-      if (*optarg == '\0')
-        throw UsageError("OUT has no name");
-      options.output = optarg;
-      break;
-    case 'r': options.report = true; break;
-    case 'R': replace = true; break;
-    case 'c': options.mode = Mode::kCheck; break;
-    case 'q': options.quiet = true; break;
-    case 'h': options.help = true; break;
-    case 'V': options.version = true; break;
-    default: throw UsageError("");
-    }
-  }
-  if (argc - optind > 1)
-    throw UsageError("more than one FILE");
-  if (options.to == Encoding::kAscii)
-    throw UsageError("ascii is for input only: ASCII text is UTF-8 already");
-  if (options.mode == Mode::kCheck && (replace || options.report || !options.output.empty()))
-    throw UsageError("--check goes without --output, --report and --replace");
-  if (replace)
-    options.mode = Mode::kReplace;
-  if (optind < argc)
-    options.input = argv[optind];
-  return options;
+  Parsed parsed;
+  for (int option; (option = getopt_long(argc, argv, "f:t:lo:rRcCqhV", kOptions, nullptr)) != -1;)
+    ParseOption(parsed, option);
+  parsed.options.inputs.assign(argv + optind, argv + argc);
+  Combine(parsed);
+  return parsed.options;
 }
 
 } // namespace transcode

@@ -4,8 +4,9 @@
 
 #include <stdexcept>
 #include <string>
+#include <vector>
 
-#include "Blocks.h"
+#include "Outgoing.h"
 
 namespace transcode {
 
@@ -17,19 +18,19 @@ struct UsageError : std::runtime_error {
 };
 
 struct Options {
-  Encoding from = Encoding::kUtf8;
-  Encoding to = Encoding::kUtf8;
-  std::string input = "-";
+  const Encoding* from = &kDefaultEncoding;
+  const Encoding* to = &kDefaultEncoding;
+  std::vector<std::string> inputs;
   std::string output; ///< empty when not given
   Mode mode = Mode::kConvert;
+  Mark mark = Mark::kKeep;
+  LineEnds lineEnds = LineEnds::kKeep;
   bool report = false;
   bool quiet = false;
+  bool list = false;
   bool help = false;
   bool version = false;
 };
-
-/// An encoding as it is called on the command line.
-const char* Name(Encoding encoding);
 
 /// @throw UsageError with what is wrong, or without words when the parser has printed them
 Options ParseOptions(int argc, char** argv);

@@ -16,11 +16,11 @@ using mirel::char16;
 /// How many units of [p, end) are of a kind. The inner loop counts in units, which lets compilers look at as
 /// many of them at once as there are in a wide register.
 template <class T, class Predicate> ssize_t Count(const T* p, const T* end, Predicate isOfKind) {
-  using Counter = std::make_unsigned_t<T>;
+  using Counter = std::conditional_t<sizeof(T) == 1, unsigned char, char16>;
   constexpr ssize_t kMax = std::numeric_limits<Counter>::max();
   ssize_t total = 0;
   while (p != end) {
-    const T* const stop = p + std::min(end - p, kMax);
+    const T* const stop = p + std::min<ssize_t>(end - p, kMax);
     Counter count = 0;
     for (; p != stop; ++p)
       count = static_cast<Counter>(count + isOfKind(*p));
@@ -41,14 +41,20 @@ struct MemorySink : mirel::IOutputStream {
 } // namespace
 
 void Statistics::Advance(const Blocks& block, ssize_t bytes) {
+  const auto each = [](const auto*, ssize_t n) { return n; };
+  const auto codePoints = [](const auto* p, ssize_t n) { return mirel::CountCodePoints(p, n); };
   m_bytes += bytes;
-  if (IsUtf16(block.From()))
-    AdvanceOver(block.Text().data(), bytes / 2);
-  else
-    AdvanceOver(block.Bytes().data(), bytes);
+  switch (block.From()) {
+  case Form::kUtf8: AdvanceOver(block.Bytes().data(), bytes, codePoints); break;
+  case Form::kUtf16: AdvanceOver(block.Units16().data(), bytes / 2, codePoints); break;
+  case Form::kUtf32: AdvanceOver(block.Units32().data(), bytes / 4, each); break;
+  case Form::kLatin1:
+  case Form::kAscii: AdvanceOver(block.Bytes().data(), bytes, each); break;
+  }
 }
 
-template <class T> void Statistics::AdvanceOver(const T* p, ssize_t n) {
+template <class T, class CountColumns>
+void Statistics::AdvanceOver(const T* p, ssize_t n, CountColumns countColumns) {
   const ssize_t newlines = Count(p, p + n, [](T unit) { return unit == '\n'; });
   const T* lastLine = p;
   if (newlines > 0) {
@@ -56,7 +62,7 @@ template <class T> void Statistics::AdvanceOver(const T* p, ssize_t n) {
     m_column = 0;
   }
   m_newlines += newlines;
-  m_column += mirel::CountCodePoints(lastLine, p + n - lastLine);
+  m_column += countColumns(lastLine, p + n - lastLine);
 }
 
 std::string Statistics::PlaceIn(const Blocks& block, ssize_t offset) const {
@@ -81,25 +87,20 @@ void Statistics::Examine(Blocks& block) {
       ++p;
     }
   }
-  m_comesBack = block.ComesBack() && m_comesBack;
+  m_comesBack = ComesBack(block) && m_comesBack;
+}
+
+/// Converts the block back from what it was converted to, and tells whether it is what came in.
+bool Statistics::ComesBack(Blocks& block) {
+  const bool wasUtf8 = block.From() == Form::kUtf8; // the text is what that was converted to
+  if (!wasUtf8)
+    mirel::Utf16FromUtf8(m_backText, block.Utf8());
+  return Encode(wasUtf8 ? block.Text() : m_backText, block.From(), block.Order(), m_room) == block.Bytes();
 }
 
 std::string Statistics::Place() const {
   return "byte " + std::to_string(m_bytes) + " (line " + std::to_string(m_newlines + 1) + ", column " +
          std::to_string(m_column + 1) + ")";
-}
-
-void Statistics::SetReplacements(int64 count, const std::string& first) {
-  m_replacements = count;
-  m_firstReplaced = first;
-}
-
-std::string Statistics::Replaced() const {
-  if (m_replacements == 0)
-    return "";
-  if (m_replacements == 1)
-    return "1 malformed sequence replaced, at " + m_firstReplaced;
-  return std::to_string(m_replacements) + " malformed sequences replaced, the first at " + m_firstReplaced;
 }
 
 string8 Statistics::Report(const std::string& title) const {
@@ -128,7 +129,7 @@ string8 Statistics::Report(const std::string& title) const {
              : 100.0 * static_cast<double>(m_asciiCodePoints) / static_cast<double>(m_codePoints));
   os << " %";
   os.endl();
-  os << "way back              " << (m_comesBack ? "  same bytes" : " OTHER BYTES");
+  os << "round trip            " << (m_comesBack ? "  same bytes" : " OTHER BYTES");
   os.Indent(0);
   os.endl();
   return sink.text;

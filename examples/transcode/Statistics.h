@@ -20,18 +20,15 @@ public:
   /// Counts the rest of what the report tells. Comes after Advance with the same block.
   void Examine(Blocks& block);
 
-  /// The place at an offset of the block that comes next, in words: "byte 12 (line 2, column 1)".
+  /// The place at an offset in bytes of the block that comes next, in words: "byte 12 (line 2, column 1)".
   std::string PlaceIn(const Blocks& block, ssize_t offset) const;
-  /// Notes how many malformed sequences were replaced, and where the first was.
-  void SetReplacements(int64 count, const std::string& first);
-  /// Both in words: "2 malformed sequences replaced, the first at byte 3 (line 1, column 4)", or nothing.
-  std::string Replaced() const;
   /// The table of it all under the given title.
   string8 Report(const std::string& title) const;
 
 private:
   std::string Place() const;
-  template <class T> void AdvanceOver(const T* p, ssize_t n);
+  template <class T, class CountColumns> void AdvanceOver(const T* p, ssize_t n, CountColumns countColumns);
+  bool ComesBack(Blocks& block);
 
   int64 m_bytes = 0;
   int64 m_newlines = 0;
@@ -43,8 +40,8 @@ private:
   int64 m_longestLine = 0;
   int64 m_line = 0; ///< code points of the line that goes on in the next block
   bool m_comesBack = true;
-  int64 m_replacements = 0;
-  std::string m_firstReplaced;
+  string16 m_backText; ///< room for the text when it has gone there and back
+  Room m_room;
 };
 
 } // namespace transcode

@@ -7,10 +7,12 @@ _transcode() {
   [ "$previous" != = ] || previous=${COMP_WORDS[COMP_CWORD - 2]}
   local words
   case $previous in
-  -f | --from) words='utf-8 utf-16le utf-16be ascii' ;;
-  -t | --to) words='utf-8 utf-16le utf-16be' ;;
+  -f | --from | -t | --to) words='utf-8 utf-16 utf-16le utf-16be utf-32 utf-32le utf-32be latin1 ascii' ;;
+  --bom) words='keep strip add' ;;
+  --line-endings) words='lf crlf' ;;
   -o | --output) ;;
-  *) [[ $word != -* ]] || words='--from --to --output --report --replace --check --quiet --help --version' ;;
+  *) [[ $word != -* ]] || words='--from --to --list --output --report --replace --drop --check --bom --line-endings
+--quiet --help --version' ;;
   esac
   if [ -n "$words" ]; then
     mapfile -t COMPREPLY < <(compgen -W "$words" -- "$word")

@@ -1,0 +1,62 @@
+// What becomes of the text on its way to the output.
+
+#pragma once
+
+#include <optional>
+#include <string_view>
+
+#include "Blocks.h"
+
+namespace transcode {
+
+/// Whether the output begins with a byte order mark: if the input does, never, or always.
+enum class Mark { kKeep, kStrip, kAdd };
+enum class LineEnds { kKeep, kLf, kCrLf };
+
+/// A code point that the encoding lacks, and where it stands in the text of a block.
+struct Lack {
+  ssize_t index;
+  char32_t codePoint;
+};
+
+/// Gives the text of one file after another the mark, the line ends and the encoding of the output.
+///
+/// What is to stay as it is isn't copied: the bytes may be those of the block. The mark that a file begins
+/// with isn't part of its text, so behind the text of another file it is dropped.
+class Outgoing {
+public:
+  Outgoing(const Encoding& to, Mark mark, LineEnds lineEnds, Mode mode)
+      : m_to(to), m_mark(mark), m_lineEnds(lineEnds), m_mode(mode), m_order(to.order) {}
+
+  void BeginFile();
+  /// The bytes of a block, up to the first code point that the encoding lacks if that ends the program; valid
+  /// until the next call.
+  std::string_view Encode(Blocks& block);
+  /// The bytes that were kept back at the end of the last block.
+  std::string_view EndFile();
+
+  /// The first code point of the file that the encoding lacks, if it is in the block.
+  const std::optional<Lack>& FirstLack() const { return m_firstLack; }
+  /// How many of the file's code points have been replaced or dropped so far, as the encoding lacks them.
+  int64 Lacks() const { return m_lacks; }
+
+private:
+  const string16& Fit(const Blocks& block);
+  void AppendLines(const char16* p, const char16* end);
+  void Append(const char16* p, const char16* end);
+
+  const Encoding& m_to;
+  const Mark m_mark;
+  const LineEnds m_lineEnds;
+  const Mode m_mode;
+  ByteOrder m_order;
+  bool m_hasBegun = false;
+  bool m_keepsCr = false; ///< whether a carriage return is kept back until it is known what follows it
+  std::optional<Lack> m_firstLack;
+  int64 m_lacks = 0;
+  string16 m_fitting; ///< the text without what the encoding lacks
+  string16 m_text;    ///< the text with other line ends, or another beginning
+  Room m_room;
+};
+
+} // namespace transcode
