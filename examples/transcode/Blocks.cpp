@@ -89,7 +89,8 @@ void Blocks::Decode(bool isEnd) {
   m_utf8.clear();
   m_resumptions.clear();
   m_hasUtf8 = false;
-  m_isInPieces = false;
+  m_hasOwnUnits = false;
+  m_isChanged = false;
   m_size = 0;
   if (m_order == ByteOrder::kByMark) {
     if (m_filled < UnitSize(m_from.form) && !isEnd)
@@ -121,28 +122,50 @@ ByteOrder Blocks::OrderByMark() const {
 
 void Blocks::DecodeUtf8(bool isEnd) {
   m_text.clear();
-  mirel::Utf8Stream stream;
-  if (m_mode != Mode::kCheck && stream.Append(m_text, m_buffer.data(), m_filled) &&
-      !(isEnd && stream.pending() > 0)) {
-    m_size = m_filled - stream.pending();
-    return;
-  }
-  DecodePieces(m_buffer.data(), m_filled,
-               [isEnd](const char* p, ssize_t n) { return FindPiece(p, n, isEnd); });
+  m_size = DecodeWhole<mirel::Utf8Stream>(m_text, m_buffer.data(), m_filled, isEnd);
+  if (m_size < 0)
+    DecodePieces(m_buffer.data(), m_filled,
+                 [isEnd](const char* p, ssize_t n) { return FindPiece(p, n, isEnd); });
 }
 
 void Blocks::DecodeUtf16(bool isEnd) {
   ReadUnits(m_text, m_buffer.data(), m_filled, m_order);
-  mirel::Utf16Stream stream;
-  if (m_mode != Mode::kCheck && stream.Append(m_utf8, m_text) && !(isEnd && stream.pending() > 0)) {
-    m_text.resize(m_text.size() - stream.pending(), 0);
-    m_size = 2 * m_text.size();
-    m_hasUtf8 = true;
+  const ssize_t size = DecodeWhole<mirel::Utf16Stream>(m_utf8, m_text.data(), m_text.size(), isEnd);
+  m_size = 2 * size;
+  m_hasUtf8 = size >= 0;
+  if (m_hasUtf8 && !m_isChanged) {
+    m_text.resize(size, 0);
     return;
   }
   m_units16.swap(m_text);
-  DecodePieces(m_units16.data(), m_units16.size(),
-               [isEnd](const char16* p, ssize_t n) { return FindPiece(p, n, isEnd); });
+  m_hasOwnUnits = true;
+  if (m_hasUtf8)
+    mirel::Utf16FromUtf8(m_text, m_utf8);
+  else
+    DecodePieces(m_units16.data(), m_units16.size(),
+                 [isEnd](const char16* p, ssize_t n) { return FindPiece(p, n, isEnd); });
+}
+
+/// Converts all units at once, which is the fast path. @return how many make whole sequences, or -1 where one
+/// of them is malformed and the stream doesn't replace it
+template <class Stream, class CharOut, class CharIn>
+ssize_t Blocks::DecodeWhole(mirel::basic_xstring<CharOut>& dst, const CharIn* p, ssize_t n, bool isEnd) {
+  // A stream replaces by U+FFFD only, and drops nothing.
+  const bool replaces = m_mode == Mode::kReplace && m_replacement == 0xFFFD;
+  Stream stream(replaces ? mirel::OnMalformed::kReplace : mirel::OnMalformed::kStop);
+  if (m_mode == Mode::kCheck || !stream.Append(dst, p, n))
+    return -1;
+  const ssize_t pending = isEnd ? 0 : stream.pending();
+  if (isEnd && !stream.Finish(dst))
+    return -1;
+  if (stream.replacements() > 0) {
+    if (m_faults == 0)
+      m_fault = Fault{static_cast<ssize_t>(stream.malformed().offset) * ssize_t(sizeof(CharIn)),
+                      Describe(stream.malformed().reason)};
+    m_faults += stream.replacements();
+    m_isChanged = true;
+  }
+  return n - pending;
 }
 
 void Blocks::DecodeUtf32() {
@@ -165,7 +188,6 @@ template <class T, class FindPiece> void Blocks::DecodePieces(const T* p, ssize_
   const ssize_t unitSize = UnitSize(m_from.form);
   m_text.clear();
   m_utf8.clear();
-  m_isInPieces = true;
   for (ssize_t i = 0;;) {
     const Piece piece = findPiece(p + i, n - i);
     if (m_mode != Mode::kCheck)
@@ -186,6 +208,7 @@ bool Blocks::GoesOnBehind(const Fault& fault, ssize_t length) {
     return false;
   ++m_faults;
   m_hasUtf8 = false;
+  m_isChanged = true;
   if (m_mode == Mode::kReplace)
     m_text.push_back(m_replacement);
   m_resumptions.push_back({fault.offset + length, m_text.size()});
@@ -193,7 +216,7 @@ bool Blocks::GoesOnBehind(const Fault& fault, ssize_t length) {
 }
 
 std::string_view Blocks::Utf8() {
-  if (m_from.form == Form::kUtf8 && m_resumptions.empty())
+  if (m_from.form == Form::kUtf8 && !m_isChanged)
     return Bytes();
   if (!m_hasUtf8)
     mirel::Utf8FromUtf16(m_utf8, m_text);

@@ -44,7 +44,7 @@ public:
   /// The block as it stands in the input.
   std::string_view Bytes() const { return {m_buffer.data(), static_cast<std::size_t>(m_size)}; }
   /// The code units of the input, of which those of the block come first: of UTF-16, and of UTF-32.
-  const string16& Units16() const { return m_isInPieces ? m_units16 : m_text; }
+  const string16& Units16() const { return m_hasOwnUnits ? m_units16 : m_text; }
   const std::u32string& Units32() const { return m_units32; }
   Form From() const { return m_from.form; }
   /// The byte order of the units, which a mark has decided if it was to.
@@ -55,7 +55,7 @@ public:
   std::string_view Utf8();
   /// Whether the text begins with a byte order mark that the file begins with.
   bool BeginsWithMark() const { return m_isFirst && !m_text.empty() && m_text[0] == kByteOrderMark; }
-  /// The bytes of the block that stand before an index of its text.
+  /// The bytes of the block that stand before an index of its text; not where U+FFFD replaces some.
   ssize_t OffsetOf(ssize_t index) const;
 
 private:
@@ -68,6 +68,8 @@ private:
   void Decode(bool isEnd);
   void DecodeUtf8(bool isEnd);
   void DecodeUtf16(bool isEnd);
+  template <class Stream, class CharOut, class CharIn>
+  ssize_t DecodeWhole(mirel::basic_xstring<CharOut>& dst, const CharIn* p, ssize_t n, bool isEnd);
   void DecodeUtf32();
   void DecodeBytes();
   template <class T, class FindPiece> void DecodePieces(const T* p, ssize_t n, FindPiece findPiece);
@@ -83,7 +85,8 @@ private:
   string8 m_buffer;      ///< the block, and behind it the start of a sequence that goes on in the next one
   ssize_t m_filled = 0;  ///< bytes of the buffer that are of the input
   ssize_t m_size = 0;    ///< bytes of the buffer that are of the block
-  bool m_isInPieces = false; ///< whether the units stand apart from the text, since it isn't well-formed
+  bool m_hasOwnUnits = false; ///< whether the units of UTF-16 aren't the text, since that isn't well-formed
+  bool m_isChanged = false;   ///< whether anything in the block is replaced or dropped
   string16 m_text;
   string16 m_units16;
   std::u32string m_units32;
