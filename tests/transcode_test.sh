@@ -125,7 +125,7 @@ while IFS='|' read -r code options input expected message; do
 done <<'ROWS'
 0|-f utf-16|\377\376x\0|78|
 0|-f UTF_16|\376\377\0x|78|
-0|-f utf16|\0x|78|
+0|-f utf16//|\0x|78|
 0|-f utf-32|\377\376\0\0x\0\0\0|78|
 0|-f utf-32|\0\0\0x|78|
 1|-f utf-16|x||truncated sequence at byte 0 (line 1, column 1)
@@ -142,7 +142,7 @@ done <<'ROWS'
 0|--bom=strip|\357\273\277x|78|
 0|--bom=add|x+\357\273\277y+\357\273\277|efbbbf7879|
 0|--bom=add|||
-0|--bom=add --line-endings=crlf|a\r+\n|efbbbf610d0d0a|
+0|--bom=ADD --line-endings=CRLF|a\r+\n|efbbbf610d0d0a|
 0|-t us-ascii --line-endings=lf|a\r\nb\r\r\n|610a620d0a|
 1|--line-endings=lf|a\r\377|610d|invalid byte at byte 2 (line 1, column 3)
 1||x\342\202+\254|78|truncated sequence at byte 1 (line 1, column 2)
@@ -207,7 +207,7 @@ done <<'ROWS'
 --output=|OUT has no name
 --to ebcdic|unknown encoding 'ebcdic'; --list prints those that are known
 --to utf-16xe|unknown encoding 'utf-16xe'; did you mean utf-16le or utf-16be?
---from utf-7|unknown encoding 'utf-7'; did you mean utf-8?
+--from utf-7//IGNORE|unknown encoding 'utf-7//IGNORE'; did you mean utf-8?
 --from utf64|unknown encoding 'utf64'; did you mean utf-8, utf-16 or utf-32?
 --check -o kept|--check goes with --from and --quiet only
 -cR|--replace and --drop exclude each other

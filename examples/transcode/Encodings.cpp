@@ -20,6 +20,9 @@ constexpr Encoding kEncodings[] = {
     {"latin1", "iso-8859-1 iso-ir-100 l1 8859_1 cp819 ibm819", Form::kLatin1, ByteOrder::kNone},
     {"ascii", "us-ascii ansi_x3.4-1968 iso646-us us cp367 ibm367", Form::kAscii, ByteOrder::kNone}};
 
+/// What iconv lists behind each name, and takes options behind.
+constexpr std::string_view kSuffix = "//";
+
 /// A name without what doesn't count in it.
 std::string Simplify(std::string_view name) {
   std::string simple;
@@ -60,7 +63,8 @@ std::size_t EditDistance(const std::string& a, const std::string& b) {
 const Encoding& kDefaultEncoding = kEncodings[0];
 
 const Encoding* FindEncoding(std::string_view name) {
-  const std::string simple = Simplify(name);
+  const bool isAsListed = name.size() > 2 && name.substr(name.size() - 2) == kSuffix;
+  const std::string simple = Simplify(isAsListed ? name.substr(0, name.size() - 2) : name);
   for (const Encoding& encoding : kEncodings)
     for (const std::string& known : NamesOf(encoding))
       if (Simplify(known) == simple)
@@ -69,7 +73,7 @@ const Encoding* FindEncoding(std::string_view name) {
 }
 
 std::string NearestNames(std::string_view name) {
-  const std::string simple = Simplify(name);
+  const std::string simple = Simplify(name.substr(0, name.find(kSuffix)));
   std::size_t least = std::max<std::size_t>(1, simple.size() * 2 / 5); // more is no slip
   std::vector<std::string> nearest;
   for (const Encoding& encoding : kEncodings) {

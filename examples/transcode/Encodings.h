@@ -33,7 +33,7 @@ constexpr char16 kByteOrderMark = 0xFEFF;
 /// The encoding that is meant where none is given.
 extern const Encoding& kDefaultEncoding;
 
-/// The encoding of that name, whose case, dashes and underscores don't count, or null.
+/// The encoding of that name, or null. Case, dashes, underscores and "//" at its end don't count.
 const Encoding* FindEncoding(std::string_view name);
 /// The names that take the fewest edits to become the given one, in words: "utf-16le or utf-16be". Empty
 /// where even these are no likely slips.

@@ -4,6 +4,7 @@
 #include <string_view>
 
 #include <getopt.h>
+#include <strings.h>
 
 namespace transcode {
 
@@ -68,20 +69,22 @@ const Encoding* ParseEncoding(const char* name) {
       (nearest.empty() ? "--list prints those that are known" : "did you mean " + nearest + "?"));
 }
 
-Mark ParseMark(std::string_view how) {
-  if (how == "keep")
+bool Is(const char* text, const char* word) { return strcasecmp(text, word) == 0; }
+
+Mark ParseMark(const char* how) {
+  if (Is(how, "keep"))
     return Mark::kKeep;
-  if (how == "strip")
+  if (Is(how, "strip"))
     return Mark::kStrip;
-  if (how == "add")
+  if (Is(how, "add"))
     return Mark::kAdd;
   throw UsageError("--bom takes keep, strip or add, not '" + std::string(how) + "'");
 }
 
-LineEnds ParseLineEnds(std::string_view ends) {
-  if (ends == "lf")
+LineEnds ParseLineEnds(const char* ends) {
+  if (Is(ends, "lf"))
     return LineEnds::kLf;
-  if (ends == "crlf")
+  if (Is(ends, "crlf"))
     return LineEnds::kCrLf;
   throw UsageError("--line-endings takes lf or crlf, not '" + std::string(ends) + "'");
 }
