@@ -32,10 +32,6 @@ void NarrowUnits(string8& dst, const string16& text) {
   std::transform(text.begin(), text.end(), dst.data(), [](char16 unit) { return static_cast<char>(unit); });
 }
 
-std::string_view BytesOf(const string16& s) {
-  return {reinterpret_cast<const char*>(s.data()), 2 * static_cast<std::size_t>(s.size())};
-}
-
 } // namespace
 
 ssize_t UnitSize(Form form) { return form == Form::kUtf32 ? 4 : form == Form::kUtf16 ? 2 : 1; }
@@ -83,6 +79,10 @@ void ReadUnits(std::u32string& units, const char* p, ssize_t n, ByteOrder order)
 }
 
 std::string_view BytesOf(const string8& s) { return {s.data(), static_cast<std::size_t>(s.size())}; }
+
+std::string_view BytesOf(const string16& s) {
+  return {reinterpret_cast<const char*>(s.data()), 2 * static_cast<std::size_t>(s.size())};
+}
 
 std::string_view Encode(const string16& text, Form form, ByteOrder order, Room& room) {
   switch (form) {

@@ -22,18 +22,20 @@ ssize_t EncodedSize(Form form, const char16* p, ssize_t n);
 /// How many of n units stand before the first that is at the limit or above.
 ssize_t LengthBelow(char16 limit, const char16* p, ssize_t n);
 
-/// Sets units to those of two or four bytes that n bytes are, of which a part of a unit is left out. The
-/// order is little or big.
+/// Sets units to those that n bytes hold, of two bytes or of four; the part of a unit at the end is left out.
+/// The order is little or big.
 void ReadUnits(string16& units, const char* p, ssize_t n, ByteOrder order);
 void ReadUnits(std::u32string& units, const char* p, ssize_t n, ByteOrder order);
 
 std::string_view BytesOf(const string8& s);
-/// Where a text is put that can't be seen as the bytes that it has.
+std::string_view BytesOf(const string16& s);
+
+/// Where the bytes of a text are put, if its units aren't these bytes already.
 struct Room {
   string16 units;
   string8 bytes;
 };
-/// The bytes of a text that the form has. They stand in the text or in the room.
+/// The bytes of a text of which the form has every code point. They stand in the text or in the room.
 std::string_view Encode(const string16& text, Form form, ByteOrder order, Room& room);
 
 } // namespace transcode

@@ -14,12 +14,12 @@ using mirel::char16;
 /// What a code point becomes, apart from the order of bytes.
 enum class Form { kUtf8, kUtf16, kUtf32, kLatin1, kAscii };
 
-/// How the bytes of a unit follow each other; those that have a single one are of no order.
+/// How the bytes of a unit follow each other; units of one byte have no order.
 enum class ByteOrder { kNone, kLittle, kBig, kByMark };
 
 struct Encoding {
   const char* name;
-  const char* aliases; ///< parted by blanks
+  const char* aliases; ///< separated by blanks
   Form form;
   ByteOrder order;
 
