@@ -8,35 +8,37 @@
 
 namespace transcode {
 
-const char kUsage[] =
-    "Usage: transcode [--from ENC] [--to ENC] [-o OUT] [--report] [--replace | -c] [--bom HOW]\n"
-    "                 [--line-endings ENDS] [--quiet] [FILE...]\n"
-    "       transcode --check [--from ENC] [--quiet] [FILE...]\n"
-    "       transcode --list | --help | --version\n";
-const char kHelp[] =
-    "Converts text from one encoding to another, of any length in little memory.\n"
-    "\n"
-    "  -f, --from ENC           encoding of the input, utf-8 by default\n"
-    "  -t, --to ENC             encoding of the output, utf-8 by default\n"
-    "  -l, --list               print the encodings, each with its other names\n"
-    "  -o, --output OUT         write to the file OUT instead of standard output\n"
-    "  -r, --report             print what is in the text instead of the text; with -o, both\n"
-    "  -R, --replace            replace malformed text by U+FFFD, and by ? what the output's encoding\n"
-    "                           lacks; say how much of it there was\n"
-    "  -c, --drop               leave it out instead\n"
-    "  -C, --check              write nothing: only say whether the input is well-formed\n"
-    "      --bom HOW            keep, strip or add the byte order mark. By default utf-16 and utf-32\n"
-    "                           have one in the output and lose it in the input; others keep it\n"
-    "      --line-endings ENDS  end each line with lf or crlf\n"
-    "  -q, --quiet              show no progress on the terminal\n"
-    "  -h, --help               print this help\n"
-    "  -V, --version            print the version\n"
-    "\n"
-    "Without FILE, or with - for FILE or OUT, the standard streams are used. The text of several\n"
-    "files is written one behind the other. When the input is malformed, or has a character that\n"
-    "the output's encoding lacks, the first fault and its place are named and the exit code is 1;\n"
-    "2 tells of wrong usage. A file OUT then stays as it was, but what goes to standard output or\n"
-    "a device has been written up to the fault.\n";
+const char kUsage[] = "Usage: transcode [--from ENC] [--to ENC] [-o OUT] [--report] [--replace | -c]\n"
+                      "                 [--bom HOW] [--line-endings ENDS] [--quiet] [FILE...]\n"
+                      "       transcode --check [--from ENC] [--quiet] [FILE...]\n"
+                      "       transcode --list | --help | --version\n";
+const char kHelp[] = "Converts text from one encoding to another, of any length in little memory.\n"
+                     "\n"
+                     "  -f, --from ENC           encoding of the input, utf-8 by default\n"
+                     "  -t, --to ENC             encoding of the output, utf-8 by default\n"
+                     "  -l, --list               print the encodings, each with its other names\n"
+                     "  -o, --output OUT         write to the file OUT instead of standard output\n"
+                     "  -r, --report             print what is in the text instead of the text;\n"
+                     "                           with -o, both\n"
+                     "  -R, --replace            replace malformed text by U+FFFD, and by ? what the\n"
+                     "                           output's encoding lacks; say how much there was\n"
+                     "  -c, --drop               leave it out instead, and say how much there was\n"
+                     "  -C, --check              write nothing: only say whether the input is\n"
+                     "                           well-formed\n"
+                     "      --bom HOW            keep, strip or add the byte order mark; by default\n"
+                     "                           utf-16 and utf-32 have one in the output and lose\n"
+                     "                           it in the input, and others keep it\n"
+                     "      --line-endings ENDS  end each line with lf or crlf\n"
+                     "  -q, --quiet              show no progress on the terminal\n"
+                     "  -h, --help               print this help\n"
+                     "  -V, --version            print the version\n"
+                     "\n"
+                     "Without FILE, or with - for FILE or OUT, the standard streams are used. The\n"
+                     "text of several files is written one behind the other. When the input is\n"
+                     "malformed, or has a character that the output's encoding lacks, the first fault\n"
+                     "and its place are named and the exit code is 1; 2 tells of wrong usage. A file\n"
+                     "OUT then stays as it was, but what goes to standard output or a device has been\n"
+                     "written up to the fault.\n";
 
 namespace {
 
