@@ -67,12 +67,12 @@ class Row:
         return self, ok, note, time.monotonic() - start
 
 
-def suite(flags, **how):
-    """A row that builds everything in one way and runs all tests of code. Without optimisation it leaves out those of
-    every short sequence, which would take minutes, most of them in the oracle."""
+def suite(flags, exhaustive=True, **how):
+    """A row that builds everything in one way and runs all tests of code, or all but those of every short sequence,
+    which take minutes without optimisation or under emulation, most of them in the oracle."""
     def work(row):
         row.build(flags=flags, **how)
-        left_out = ("-E", "Utf.Every") if "-O0" in flags else ()
+        left_out = () if exhaustive else ("-E", "Utf.Every")
         row.run("ctest", "--test-dir", row.dir, "--output-on-failure", "--no-tests=error", "-LE", "package", *left_out,
                 ASAN_OPTIONS="allocator_may_return_null=1", UBSAN_OPTIONS="print_stacktrace=1")
     return work
@@ -112,22 +112,26 @@ def layout(row):
         row.run("clang-tidy", "--quiet", source, "--", "-std=c++17", "-I.", f"-I{row.dir}/include")
 
 
-def emulated(processor, triplet="", emulator="", link=""):
+def emulated(processor, triplet="", emulator="", link="", exhaustive=True):
     """The suite for another processor, under emulation. Where they have other names, triplet is the tools' and emulator
     QEMU's."""
     triplet = triplet or f"{processor}-linux-gnu"
-    return suite(cxx=f"{triplet}-g++", flags="-O2", options=(
+    return suite(cxx=f"{triplet}-g++", flags="-O2", exhaustive=exhaustive, options=(
         "-DCMAKE_SYSTEM_NAME=Linux", f"-DCMAKE_SYSTEM_PROCESSOR={processor}",
         f"-DCMAKE_CROSSCOMPILING_EMULATOR=qemu-{emulator or processor};-L;/usr/{triplet}",
         f"-DCMAKE_EXE_LINKER_FLAGS={link}", f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", NO_FMT))
 
 
-def older_processors(row):
-    """What x86-64 processors choose, from one with every instruction set of the kernels to one without any."""
-    row.build("mirel_tests", flags="-O2")
+def everyday(row):
+    """What most users build; then the same program on older processors, from one with every instruction set of the
+    kernels to one without any, and under valgrind, where a million texts take half an hour and do nothing new."""
+    suite(flags="-O2 -g")(row)
+    tests = row.dir / "tests" / "mirel_tests"
     for processor, kernels in ("Haswell", "AVX2"), ("Nehalem", "SSE4"), ("core2duo", "none"):
-        row.run("qemu-x86_64", "-cpu", processor, row.dir / "tests" / "mirel_tests", "--gtest_brief=1",
-                "--gtest_filter=-Utf.Every*", MIREL_EXPECTED_KERNELS=kernels)
+        row.run("qemu-x86_64", "-cpu", processor, tests, "--gtest_brief=1", "--gtest_filter=-Utf.Every*",
+                MIREL_EXPECTED_KERNELS=kernels)
+    row.run("valgrind", "-q", "--error-exitcode=9", "--leak-check=full", "--child-silent-after-fork=yes", tests,
+            "--gtest_filter=-Utf.EverySequenceOfUpToThreeBytes:*AMillion*", "--gtest_brief=1")
 
 
 def coverage(row):
@@ -141,14 +145,6 @@ def threads(row):
     """The tests of threads, many times: a race doesn't show in every run."""
     row.build("mirel_tests", cxx="clang++", flags="-O1 -g -fsanitize=thread")
     row.run(row.dir / "tests" / "mirel_tests", "--gtest_filter=Thread*", "--gtest_repeat=20")
-
-
-def valgrind(row):
-    """All but the three-byte sequences and the million texts: they take half an hour and do nothing new."""
-    row.build("mirel_tests", flags="-O1 -g")
-    row.run("valgrind", "-q", "--error-exitcode=9", "--leak-check=full", "--child-silent-after-fork=yes",
-            row.dir / "tests" / "mirel_tests", "--gtest_filter=-Utf.EverySequenceOfUpToThreeBytes:*AMillion*",
-            "--gtest_brief=1")
 
 
 def fuzz(row):
@@ -174,25 +170,23 @@ SHARED = "-DBUILD_SHARED_LIBS=ON"
 NO_FMT = "-DCMAKE_DISABLE_FIND_PACKAGE_fmt=ON"
 
 
-def libcxx(std, flags, *options):
-    return suite(cxx="clang++", std=std, flags=f"-stdlib=libc++ {flags}",
+def libcxx(std, flags, *options, exhaustive=True):
+    return suite(cxx="clang++", std=std, flags=f"-stdlib=libc++ {flags}", exhaustive=exhaustive,
                  options=(f"-DMIREL_GTEST_SOURCE={GTEST_SOURCE}", NO_FMT, *options))
 
 
 ROWS = [
     Row("AArch64 under emulation", suite(cxx="aarch64-linux-gnu-g++", flags="-O2", options=("--preset", "aarch64"))),
     Row("s390x under emulation, big-endian", emulated("s390x")),
-    Row("i686 under emulation, 32 bits", emulated(
-        "i686", emulator="i386", link="-static")),  # QEMU 7.2 hangs when a dynamic program of i686 forks
-    Row("armhf under emulation, 32 bits", emulated("arm", "arm-linux-gnueabihf")),
-    Row("older x86-64 processors under emulation", older_processors),
-    Row("valgrind", valgrind),
+    Row("i686 under emulation, 32 bits", emulated("i686", emulator="i386", exhaustive=False,
+        link="-static")),  # QEMU 7.2 hangs when a dynamic program of i686 forks
+    Row("armhf under emulation, 32 bits", emulated("arm", "arm-linux-gnueabihf", exhaustive=False)),
+    Row("g++ C++17 -O2, older x86-64 processors, valgrind", everyday),
     Row("headers alone", headers),
     Row("unity builds", unity),
     Row("clang-format, clang-tidy", layout),
-    Row("g++ C++17 -O2", suite(flags="-O2")),
     Row("g++ C++20 -O3 NDEBUG unsigned char", suite(std=20, flags="-O3 -DNDEBUG -funsigned-char")),
-    Row("g++ C++23 -O0 signed char", suite(std=23, flags="-O0 -fsigned-char")),
+    Row("g++ C++23 -O0 signed char", suite(std=23, flags="-O0 -fsigned-char", exhaustive=False)),
     Row("g++ C++17 -O2 without kernels and assertion facility", suite(
         flags="-O2 -DMIREL_NO_ASSERT_FACILITY", options=("-DMIREL_KERNELS=OFF",))),
     Row("g++ C++17 shared hardened", suite(flags=HARDENING, options=(
@@ -201,12 +195,11 @@ ROWS = [
     Row("clang++ C++17 -O2 unsigned char", suite(cxx="clang++", flags="-O2 -funsigned-char")),
     Row("clang++ C++20 -O3 shared, NDEBUG in the library only", suite(
         cxx="clang++", std=20, flags="-O3 -DNDEBUG", program="-UNDEBUG", options=(SHARED,))),
-    Row("clang++ C++23 -O0", suite(cxx="clang++", std=23, flags="-O0")),
+    Row("clang++ C++23 -O0", suite(cxx="clang++", std=23, flags="-O0", exhaustive=False)),
     Row("clang++ libc++ C++17 -O3 shared", libcxx(17, "-O3", SHARED)),
     Row("clang++ libc++ C++20 -O2 unsigned char", libcxx(20, "-O2 -funsigned-char")),
-    Row("clang++ libc++ C++23 -O0 NDEBUG", libcxx(23, "-O0 -DNDEBUG")),
-    Row("g++ address, leak, undefined", suite(
-        flags="-O2 -g -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer")),
+    Row("clang++ libc++ C++23 -O0 NDEBUG", libcxx(23, "-O0 -DNDEBUG", exhaustive=False)),
+    # g++'s are in the preset "sanitize", which ./dev test runs.
     Row("clang++ address, leak, undefined, conversions", suite(
         cxx="clang++", flags="-O2 -g -fsanitize=address,undefined,implicit-conversion,nullability,local-bounds,"
         "float-divide-by-zero -fno-sanitize-recover=all -fno-omit-frame-pointer", options=(NO_FMT,))),
