@@ -144,24 +144,17 @@ template <class CharOut, class CharIn> void Check(View<CharIn> source) {
              << "converted: " << testing::PrintToString(units);
   });
 }
-inline void CheckUtf8(View<char8> source) { Check<char16>(source); }
-inline void CheckUtf16(View<char16> source) { Check<char8>(source); }
 
 /// Checks source by itself, and between letters of the kind with which it may begin, of which some are
 /// converted at once.
-inline void CheckAmongLetters(View<char8> source) {
-  static thread_local Text<char8> text;
-  const char8* const letter = (source[0] & 0xF0) == 0xE0 ? "\u20AC" : "\u00E9";
-  text = letter;
-  text.append(source).append(letter).append(letter).append(letter);
-  CheckUtf8(source), CheckUtf8(text);
-}
-inline void CheckAmongLetters(View<char16> source) {
-  static thread_local Text<char16> text;
-  const char16 letter = source[0] >= 0x800 ? 0x20AC : 0xE9;
-  text = letter;
-  text.append(source).append(3, letter);
-  CheckUtf16(source), CheckUtf16(text);
+template <class T> void CheckAmongLetters(View<T> source) {
+  using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
+  static thread_local Text<T> text;
+  const bool isHigh = sizeof(T) == 1 ? (source[0] & 0xF0) == 0xE0 : static_cast<char16>(source[0]) >= 0x800;
+  const char32_t letter = isHigh ? 0x20AC : 0xE9;
+  text.clear(), Put(text, letter), text += source;
+  Put(text, letter), Put(text, letter), Put(text, letter);
+  Check<Other>(source), Check<Other>(View<T>(text));
 }
 
 } // namespace oracle

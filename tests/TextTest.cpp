@@ -3,7 +3,6 @@
 #include "Oracle.h"
 
 #include <random>
-#include <utility>
 #include <vector>
 
 #include <utils/Utf.h>
@@ -116,6 +115,11 @@ template <class T> void CheckCalls(View<T> source, const Expected<T>& expected) 
   basic_xstring<Other<T>> dst(3, 'x');
   ASSERT_EQ(AppendOther(dst, source.data(), n), expected.first == kNpos);
   ASSERT_EQ(Std(dst), Text<Other<T>>(3, 'x') + expected.strict);
+  if constexpr (sizeof(T) == 2) { // from the standard library's units, which are another type
+    ASSERT_EQ(mirel::Utf8FromUtf16(dst, std::u16string(source.begin(), source.end())),
+              expected.first == kNpos);
+    ASSERT_EQ(Std(dst), expected.strict);
+  }
   ASSERT_EQ(Lossy(dst, source), expected.malformed);
   ASSERT_EQ(Std(dst), expected.lossy);
   for (const Sequence& sequence : expected.sequences) {
@@ -196,8 +200,9 @@ TYPED_TEST(UtfText, OneOrTwoAmongOthers) {
 
 TYPED_TEST(UtfText, Mixtures) {
   std::mt19937 random(3);
+  ASSERT_NO_FATAL_FAILURE(CheckText(Text<TypeParam>())) << "a null pointer is an empty text";
   for (int round = 0; round < 3000; ++round)
-    ASSERT_NO_FATAL_FAILURE(CheckText(Mixture<TypeParam>(random, random() % 500)));
+    ASSERT_NO_FATAL_FAILURE(CheckText(Mixture<TypeParam>(random, random() % (round % 64 == 0 ? 4000 : 500))));
 }
 
 /// More than the lanes of a kernel can count before they are added up.
@@ -362,47 +367,13 @@ TEST(UtfText, StringsViewsAndLiterals) {
   EXPECT_EQ(Std(narrow), "\uFFFD\uFFFD");
 }
 
-TEST(UtfText, FromTheStandardLibrarysUtf16) {
-  mirel::string8 narrow = "old";
-  std::u16string text;
-  for (int i = 0; i < 1500; ++i) // more than a block, of which one ends within a pair
-    text += i == 3 ? u"a" : u"\U0001F600";
-  EXPECT_TRUE(mirel::Utf8FromUtf16(narrow, text));
-  EXPECT_EQ(narrow.size(), 4 * 1499 + 1);
-  EXPECT_EQ(mirel::CountCodePoints(narrow), 1500);
-  EXPECT_TRUE(mirel::Utf8FromUtf16(narrow, u"gr\u00FCn"));
-  EXPECT_EQ(Std(narrow), "gr\u00FCn");
-  text.insert(2001, 1, u'\xD800');
-  EXPECT_FALSE(mirel::Utf8FromUtf16(narrow, text));
-  EXPECT_EQ(narrow.size(), 4 * 1000 + 1);
-  EXPECT_TRUE(mirel::Utf8FromUtf16(narrow, std::u16string_view()));
-  EXPECT_TRUE(narrow.empty());
-}
-
-TYPED_TEST(UtfText, NullIsEmpty) {
-  const TypeParam* const null = nullptr;
-  basic_xstring<Other<TypeParam>> dst(2, 'x');
-  EXPECT_EQ(mirel::FindMalformed(null, 0), kNpos);
-  EXPECT_EQ(mirel::CountCodePoints(null, 0), 0);
-  EXPECT_TRUE(mirel::CodePoints(null, 0).empty());
-  EXPECT_TRUE(AppendOther(dst, null, 0));
-  EXPECT_EQ(dst.size(), 2);
-  EXPECT_EQ(Lossy(dst, View<TypeParam>()), 0);
-  EXPECT_TRUE(dst.empty());
-  EXPECT_TRUE(UtfToUtf(dst, null, 0));
-}
-
 TYPED_TEST(UtfText, CodePointsAreAppended) {
-  const std::pair<char32_t, char32_t> rows[] = {
-      {0, 0},           {0x7F, 0x7F},       {0x80, 0x80},         {0x7FF, 0x7FF},
-      {0x800, 0x800},   {0xFFFF, 0xFFFF},   {0xD800, 0xFFFD},     {0xDFFF, 0xFFFD},
-      {0xE000, 0xE000}, {0x10000, 0x10000}, {0x10FFFF, 0x10FFFF}, {0x110000, 0xFFFD}};
   basic_xstring<TypeParam> s;
   Text<TypeParam> expected;
-  for (const auto& [given, appended] : rows) {
-    mirel::AppendCodePoint(s, given);
-    Put(expected, appended);
-  }
+  for (const char32_t c : {0u, 0x7Fu, 0x80u, 0x7FFu, 0x800u, 0xFFFFu, 0xD7FFu, 0xE000u, 0x10000u, 0x10FFFFu})
+    mirel::AppendCodePoint(s, c), Put(expected, c);
+  for (const char32_t c : {0xD800u, 0xDFFFu, 0x110000u})
+    mirel::AppendCodePoint(s, c), Put(expected, 0xFFFD);
   EXPECT_EQ(Std(s), expected);
 }
 
