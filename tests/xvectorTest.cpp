@@ -60,7 +60,8 @@ TYPED_TEST(XVector, ZeroTerminatedArguments) {
   s.insert(0, z).replace(2, 3, z).insert(s.size(), none.c_str());
   EXPECT_EQ(Std(s), Std(Of<TypeParam>("bcbcabcbcbc")));
   EXPECT_LT(s.compare(0, 1, z), 0);
-  EXPECT_EQ(Std(Text(text, 1, 2)) + Std(text.substr(4, 2)) + Std(Text(z, z + 1)), Std(Of<TypeParam>("bcbcb")));
+  EXPECT_EQ(Std(Text(text, 1, 2)) + Std(text.substr(4, 2)) + Std(Text(z, z + 1)),
+            Std(Of<TypeParam>("bcbcb")));
   HackToForcexstringIntoUtilsDll();
 }
 
