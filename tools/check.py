@@ -68,11 +68,11 @@ class Row:
 
 
 def suite(flags, exhaustive=True, **how):
-    """A row that builds everything in one way and runs all tests of code, or all but those of every short sequence,
-    which take minutes without optimisation or under emulation, most of them in the oracle."""
+    """A row that builds everything in one way and runs all tests of code, or all but that of every short sequence,
+    which takes minutes without optimisation or under emulation, most of them in the oracle."""
     def work(row):
         row.build(flags=flags, **how)
-        left_out = () if exhaustive else ("-E", "Utf.Every")
+        left_out = () if exhaustive else ("-E", "Utf.EverySequence")
         row.run("ctest", "--test-dir", row.dir, "--output-on-failure", "--no-tests=error", "-LE", "package", *left_out,
                 ASAN_OPTIONS="allocator_may_return_null=1", UBSAN_OPTIONS="print_stacktrace=1")
     return work
@@ -177,7 +177,8 @@ def libcxx(std, flags, *options, exhaustive=True):
 
 ROWS = [
     Row("AArch64 under emulation", suite(cxx="aarch64-linux-gnu-g++", flags="-O2", options=("--preset", "aarch64"))),
-    Row("s390x under emulation, big-endian", emulated("s390x")),
+    # Of the emulated processors AArch64 alone has kernels, which see every short sequence there.
+    Row("s390x under emulation, big-endian", emulated("s390x", exhaustive=False)),
     Row("i686 under emulation, 32 bits", emulated("i686", emulator="i386", exhaustive=False,
         link="-static")),  # QEMU 7.2 hangs when a dynamic program of i686 forks
     Row("armhf under emulation, 32 bits", emulated("arm", "arm-linux-gnueabihf", exhaustive=False)),
