@@ -17,6 +17,24 @@ template <std::size_t kBytes, class F> constexpr Shuffles MakeShuffles(const F& 
   return shuffles;
 }
 
+constexpr Shuffles MakeReplacingShuffles() {
+  Shuffles shuffles{};
+  for (unsigned mask = 0; mask < 256; ++mask) {
+    std::size_t n = 0;
+    const auto add = [&](unsigned from) {
+      if (n < 16)
+        shuffles.rows[mask][n++] = static_cast<uint8_t>(from);
+    };
+    for (unsigned k = 0; k < 8; ++k) {
+      const bool isReplaced = (mask >> k & 1) != 0;
+      add(isReplaced ? 8 : k);
+      if (isReplaced)
+        add(9), add(10);
+    }
+  }
+  return shuffles;
+}
+
 /// Two bytes that may not follow each other: the ranges of the first and of the second, and the bit for them.
 struct PairFault {
   int first, firstLast, second, secondLast, bit;
@@ -63,6 +81,7 @@ constexpr Shuffles kKeepTwoBytes =
 constexpr Shuffles kKeepThreeBytes = MakeShuffles<4>([](unsigned bits, std::size_t byte) {
   return byte == 0 || (byte == 2 && (bits & 0x10) != 0) || (byte == 3 && (bits & 1) != 0);
 });
+constexpr Shuffles kReplaceUnits = MakeReplacingShuffles();
 constexpr PairFaults kPairFaults = MakePairFaults();
 constexpr Repeats kRepeats = MakeRepeats();
 

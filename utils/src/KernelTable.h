@@ -78,6 +78,9 @@ extern const Shuffles kKeepTwoBytes;
 /// For 4 positions of four bytes, the second of them unused: keeps the first byte of each, the last of those
 /// whose bit is set in the lower half of the mask, and the third of those whose bit is set in the upper half.
 extern const Shuffles kKeepThreeBytes;
+/// For 8 bytes, and the 3 bytes of U+FFFD behind them, which take the place of those whose bit is set. The
+/// rows of more than four bits are cut off.
+extern const Shuffles kReplaceUnits;
 
 /// What can be wrong with two bytes that follow each other, a bit for each fault: those that the nibbles of
 /// the first and the high nibble of the second have in common. The highest bit stands for two continuation
