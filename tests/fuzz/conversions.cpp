@@ -1,16 +1,15 @@
-// Fuzzes the conversions: the first byte is how much ASCII stands before the text, the others are the text.
-#include <vector>
-
-#include "../Oracle.h"
+// Fuzzes all that reads UTF-8 and UTF-16: the first byte is how much ASCII stands before the text, the others
+// are the text.
+#include "../TextChecks.h"
 
 namespace {
 
-/// Checks text whole and cut at every place where that can make a difference.
-template <class CharOut, class CharIn> void CheckCuts(std::size_t before, const oracle::Text<CharIn>& text) {
-  const oracle::Text<CharIn> all = oracle::Text<CharIn>(before, 'a') + text;
+/// Checks text whole, cut at every place where that can make a difference, and in two pieces.
+template <class T> void CheckCuts(std::size_t before, const oracle::Text<T>& text) {
+  const oracle::Text<T> all = oracle::Text<T>(before, 'a') + text;
   for (std::size_t size = before; size <= all.size(); ++size) {
-    const std::vector<CharIn> exact(all.begin(), all.begin() + ssize_t(size)); // whose end a sanitizer sees
-    oracle::Check<CharOut>(oracle::View<CharIn>(exact.data(), size));
+    oracle::CheckText(all.substr(0, size));
+    oracle::CheckPieces(all, {size, all.size()});
   }
 }
 
@@ -25,10 +24,10 @@ extern "C" int LLVMFuzzerTestOneInput(const unsigned char* data, std::size_t siz
   static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 1, 2, 5, 20, 31, 34, 1000};
   const std::size_t before = kBefore[data[0] % std::size(kBefore)];
   ++data, --size;
-  CheckCuts<char16>(before, oracle::Text<char8>(reinterpret_cast<const char8*>(data), size));
+  CheckCuts<char8>(before, oracle::Text<char8>(reinterpret_cast<const char8*>(data), size));
   oracle::Text<char16> units(size / 2, 0);
   for (std::size_t i = 0; i < units.size(); ++i)
     units[i] = static_cast<char16>(data[2 * i] | data[2 * i + 1] << 8);
-  CheckCuts<char8>(before, units);
+  CheckCuts<char16>(before, units);
   return 0;
 }
