@@ -36,6 +36,11 @@ template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* 
       lengths.codePoints += measured.lengths.codePoints;
       lengths.units += measured.lengths.units;
       p = measured.p;
+    } else {
+      const ssize_t ascii = SkipAscii(p, end) - p;
+      lengths.codePoints += ascii;
+      lengths.units += ascii;
+      p += ascii;
     }
     p = MeasureScalar(p, end, hasKernels, lengths);
   }

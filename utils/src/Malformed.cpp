@@ -58,6 +58,8 @@ ssize_t CutOffAtEnd(const char16*, const char16* end) { return IsHighSurrogate(e
 template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end) {
   if (kernels != nullptr && end - p >= kLeastForKernels)
     p = TextKernelsOf(*kernels, p).skip(p, end);
+  else
+    p = SkipAscii(p, end);
   while (p != end) {
     const Sequence sequence = Decode(p, end);
     if (!sequence.isWellFormed)
