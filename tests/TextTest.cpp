@@ -179,6 +179,7 @@ TEST(UtfText, StringsViewsAndLiterals) {
   EXPECT_EQ(mirel::FindMalformed("a\u20AC\xFF"), 4);
   EXPECT_FALSE(mirel::IsWellFormed(std::string_view("\xFF")));
   EXPECT_TRUE(mirel::IsWellFormed("a"));
+  EXPECT_EQ(mirel::CountCodePoints(text), 3);
   EXPECT_EQ(mirel::CountCodePoints("a\u20AC\xFF"), 3);
   EXPECT_EQ(mirel::Utf16Length("\U0001F600"), 2);
   EXPECT_STREQ(mirel::Describe(static_cast<MalformedReason>(99)), "well-formed sequence");

@@ -141,7 +141,7 @@ public:
   }
 
   void PutText(const char* p, ssize_t pn) {
-    const streamsize padding = buffer.sink != nullptr ? std::max(width(), streamsize(0)) - pn : 0;
+    const streamsize padding = buffer.sink != nullptr ? std::max<streamsize>(width(), 0) - pn : 0;
     width(0);
     for (streamsize k = 0; k < padding; ++k)
       buffer.sputc(' ');
