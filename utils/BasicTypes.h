@@ -1,30 +1,29 @@
 /// @file
-/// Scalar types of fixed width that every other header uses, and the marks of what the library exports and of
-/// what a debugger knows.
+/// The scalar types that every other header uses, and the macros for exported names and debug information.
 
 #pragma once
 
 #include <cstdint>
 
-/// Marks a class or function that a program may use from the shared library; everything else stays hidden.
+/// Exports a class or function from the shared library; everything else stays hidden.
 #define MIREL_API __attribute__((visibility("default")))
 
-/// Marks a class that a program describes in its own debug information. Clang leaves out a class whose code
-/// is in the library, and a debugger then has nothing to show where the library has no debug information.
+/// Makes a program describe a class in its own debug information. Otherwise clang leaves out a class whose
+/// code is in the library, and a debugger can't show it unless the library has debug information.
 #if __has_cpp_attribute(clang::standalone_debug)
 #define MIREL_DESCRIBED [[clang::standalone_debug]]
 #else
 #define MIREL_DESCRIBED
 #endif
 
-/// All that the library offers, but for the macros.
+/// Everything in the library except the macros.
 namespace mirel {
 
-/// Signed size, count or index. What it counts (elements, bytes, code units) is said where it is used.
+/// A signed size, count or index, in the unit that each use names: elements, bytes or code units.
 typedef intptr_t ssize_t;
 
 typedef uint8_t uint8;   ///< A byte.
 typedef uint16_t uint16; ///< The storage of a UTF-16 code unit.
-typedef int64_t int64;   ///< What streams count in.
+typedef int64_t int64;   ///< The offsets and counts of streams.
 
 } // namespace mirel

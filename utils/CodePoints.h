@@ -1,8 +1,8 @@
 /// @file
-/// Text by code points: a range that decodes UTF-8 or UTF-16 as it is walked, and the way to append one.
+/// Code points: a range that decodes UTF-8 or UTF-16 while a loop walks it, and a function that appends one.
 ///
-/// The decoder here says where a sequence ends and whether it is well-formed, for everything in the library
-/// that meets malformed text. It knows single sequences; it allocates nothing and keeps nothing.
+/// The decoder here decides for the whole library where a sequence ends and whether it is well-formed. It
+/// knows single sequences only, has no state, and allocates nothing.
 
 #pragma once
 
@@ -18,12 +18,12 @@ namespace mirel {
 
 namespace detail {
 
-/// What stands in the place of malformed text, U+FFFD.
+/// Replaces malformed text: U+FFFD.
 constexpr char32_t kReplacement = 0xFFFD;
 
-/// A code point and the number of its units, or U+FFFD and the length of a maximal subpart: the units that
-/// begin a well-formed sequence and don't finish one, or a single unit where none do (Unicode Standard 3.9,
-/// U+FFFD Substitution of Maximal Subparts).
+/// A decoded sequence. A well-formed one is a code point and the number of its units. A malformed one is
+/// U+FFFD and the length of a maximal subpart: the units that begin a well-formed sequence without completing
+/// it, or else a single unit (Unicode Standard 3.9, U+FFFD Substitution of Maximal Subparts).
 struct Sequence {
   char32_t codePoint;
   int length;
@@ -34,7 +34,7 @@ inline bool IsContinuation(char8 unit) { return (UnitValue(unit) & 0xC0) == 0x80
 inline bool IsHighSurrogate(char16 unit) { return (unit & 0xFC00) == 0xD800; }
 inline bool IsLowSurrogate(char16 unit) { return (unit & 0xFC00) == 0xDC00; }
 
-/// The sequence at p in UTF-8, as table 3-7 of the Unicode Standard has it. p isn't the end.
+/// Decodes the UTF-8 sequence at p, by table 3-7 of the Unicode Standard. p isn't the end.
 ///
 /// It is always inlined: as a call, with its result in memory, it took five to seven times as long in a loop
 /// over a text.
@@ -48,14 +48,14 @@ inline bool IsLowSurrogate(char16 unit) { return (unit & 0xFC00) == 0xDC00; }
   if (lead < 0xE0)
     return {(lead & 0x1F) << 6 | second, 2, true};
   if (lead < 0xF0) {
-    const char32_t upper = (lead & 0x0F) << 6 | second; // bits from the sixth on; the table has the limits
+    const char32_t upper = (lead & 0x0F) << 6 | second; // the code point without its low six bits
     if (upper < 0x800 >> 6 || upper >> 5 == 0xD800 >> 11)
       return {kReplacement, 1, false};
     if (end - p < 3 || !IsContinuation(p[2]))
       return {kReplacement, 2, false};
     return {upper << 6 | (UnitValue(p[2]) & 0x3F), 3, true};
   }
-  const char32_t upper = (lead & 0x07) << 6 | second; // bits from the twelfth on
+  const char32_t upper = (lead & 0x07) << 6 | second; // the code point without its low twelve bits
   if (upper < 0x10000 >> 12 || upper > 0x10FFFF >> 12)
     return {kReplacement, 1, false};
   if (end - p < 3 || !IsContinuation(p[2]))
@@ -65,7 +65,7 @@ inline bool IsLowSurrogate(char16 unit) { return (unit & 0xFC00) == 0xDC00; }
   return {upper << 12 | (UnitValue(p[2]) & 0x3Fu) << 6 | (UnitValue(p[3]) & 0x3Fu), 4, true};
 }
 
-/// The sequence at p in UTF-16, as definition D91 of the Unicode Standard has it. p isn't the end.
+/// Decodes the UTF-16 sequence at p, by definition D91 of the Unicode Standard. p isn't the end.
 [[gnu::always_inline]] inline Sequence Decode(const char16* p, const char16* end) {
   const char32_t unit = *p;
   if (unit >> 11 != 0xD800 >> 11)
@@ -75,8 +75,8 @@ inline bool IsLowSurrogate(char16 unit) { return (unit & 0xFC00) == 0xDC00; }
   return {kReplacement, 1, false};
 }
 
-/// Where the sequence that ends at p begins, of those that Decode() finds one by one from begin on. A unit
-/// that isn't a continuation byte always begins one, so no more than four units are looked at.
+/// Returns the beginning of the sequence that ends at p, one of those that repeated Decode() finds from begin
+/// on. A unit that isn't a continuation byte always begins a sequence, so at most four units are read.
 inline const char8* Previous(const char8* begin, const char8* p) {
   for (int k = 1; k <= 4 && p - begin >= k; ++k)
     if (!IsContinuation(p[-k]))
@@ -87,7 +87,7 @@ inline const char16* Previous(const char16* begin, const char16* p) {
   return p - begin >= 2 && IsHighSurrogate(p[-2]) && IsLowSurrogate(p[-1]) ? p - 2 : p - 1;
 }
 
-/// Writes the units of a scalar value. @return past the end of them
+/// Writes the units of a scalar value. @return past the end of what was written
 inline char8* Encode(char32_t c, char8* out) {
   const auto put = [&](char32_t unit) { *out++ = static_cast<char8>(unit); };
   const auto putContinuation = [&](int shift) { put(0x80 | (c >> shift & 0x3F)); };
@@ -118,7 +118,7 @@ inline char16* Encode(char32_t c, char16* out) {
   return out;
 }
 
-/// The units that Encode() writes.
+/// The number of units that Encode() writes.
 template <class T> int EncodedLength(char32_t c) {
   if constexpr (sizeof(T) == 1)
     return 1 + (c >= 0x80) + (c >= 0x800) + (c >= 0x10000);
@@ -128,7 +128,7 @@ template <class T> int EncodedLength(char32_t c) {
 
 constexpr bool IsScalarValue(char32_t c) { return c < 0xD800 || (c >= 0xE000 && c <= 0x10FFFF); }
 
-/// Lets a function take a temporary std::string, in order to refuse it.
+/// Matches a temporary std::string, for deleted overloads.
 template <class S>
 using IfTemporaryString = std::enable_if_t<std::is_same_v<std::remove_const_t<S>, std::string>, int>;
 
@@ -136,58 +136,58 @@ inline ssize_t SizeOf(std::string_view text) { return static_cast<ssize_t>(text.
 
 } // namespace detail
 
-/// Walks a text by code points, forwards and backwards. Malformed text is U+FFFD for each maximal subpart,
-/// the same ones in both directions.
+/// Walks a text by code points, forwards and backwards. Each maximal subpart of malformed text reads as
+/// U+FFFD, and both directions find the same subparts.
 ///
-/// It decodes the code point at which it stands once, when it gets there. It yields values, not references.
+/// It decodes a code point once, when it arrives there. It yields values, not references.
 /// @snippet examples/reference.cpp code point iterators
 template <class T> class CodePointIterator {
 public:
-  typedef std::bidirectional_iterator_tag iterator_concept; ///< For C++20, which lets values be yielded.
-  typedef std::input_iterator_tag iterator_category; ///< For C++17, where more would promise references.
+  typedef std::bidirectional_iterator_tag iterator_concept; ///< For C++20, where it may yield values.
+  typedef std::input_iterator_tag iterator_category; ///< For C++17, where any other promises references.
   typedef char32_t value_type;                       ///< A Unicode scalar value.
   typedef std::ptrdiff_t difference_type;            ///< Counts code points.
-  typedef void pointer;                              ///< There is nothing to point at.
+  typedef void pointer;                              ///< A code point has no address.
   typedef char32_t reference;                        ///< A value.
 
-  /// An iterator to assign to.
+  /// Makes an iterator that may only be assigned to.
   CodePointIterator() = default;
 
-  /// The code point, or U+FFFD for malformed text. Not past the end.
+  /// The code point, or U+FFFD for malformed text. The iterator may not be past the end.
   char32_t operator*() const { return m_codePoint; }
-  /// The index of the unit at which the code point begins, counted from the beginning of the range.
+  /// The index of the code point's first unit, counted from the beginning of the range.
   ssize_t position() const { return m_p - m_begin; }
-  /// Whether the iterator stands at malformed text. Not past the end.
+  /// Returns whether the iterator stands at malformed text. It may not be past the end.
   bool isMalformed() const { return !m_isWellFormed; }
 
-  /// Goes to the next code point. Not past the end.
+  /// Goes to the next code point. The iterator may not be past the end.
   [[gnu::always_inline]] CodePointIterator& operator++() {
     m_p = m_next;
     Read();
     return *this;
   }
-  /// Goes to the next code point and returns what it was.
+  /// Goes to the next code point and returns the iterator as it was.
   CodePointIterator operator++(int) {
     const CodePointIterator before = *this;
     ++*this;
     return before;
   }
-  /// Goes to the previous code point. Not at the beginning.
+  /// Goes to the previous code point. The iterator may not be at the beginning.
   CodePointIterator& operator--() {
     m_p = detail::Previous(m_begin, m_p);
     Read();
     return *this;
   }
-  /// Goes to the previous code point and returns what it was.
+  /// Goes to the previous code point and returns the iterator as it was.
   CodePointIterator operator--(int) {
     const CodePointIterator before = *this;
     --*this;
     return before;
   }
 
-  /// Whether two iterators of one range stand at the same place.
+  /// Returns whether two iterators of one range stand at the same place.
   friend bool operator==(const CodePointIterator& a, const CodePointIterator& b) { return a.m_p == b.m_p; }
-  /// Whether two iterators of one range stand at different places.
+  /// Returns whether two iterators of one range stand at different places.
   friend bool operator!=(const CodePointIterator& a, const CodePointIterator& b) { return a.m_p != b.m_p; }
 
 private:
@@ -195,8 +195,8 @@ private:
 
   CodePointIterator(const T* begin, const T* p, const T* end) : m_begin(begin), m_p(p), m_end(end) {}
 
-  /// Decodes what is at m_p, unless that is the end. Always inlined, as Decode() is: otherwise the iterator
-  /// of a loop has to be in memory.
+  /// Decodes the sequence at m_p, unless that is the end. Always inlined, as Decode() is: otherwise a loop
+  /// keeps its iterator in memory.
   [[gnu::always_inline]] void Read() {
     if (m_p == m_end)
       return;
@@ -208,35 +208,35 @@ private:
 
   const T* m_begin = nullptr;
   const T* m_p = nullptr;
-  const T* m_next = nullptr; ///< where the next code point begins, while this isn't the end
+  const T* m_next = nullptr; ///< where the next code point begins; unused at the end
   const T* m_end = nullptr;
   char32_t m_codePoint = 0;
   bool m_isWellFormed = true;
 };
 
-/// The code points of a text that it doesn't own, as CodePoints() makes it. Changing the text's storage
-/// invalidates it and its iterators.
+/// The code points of a text that the range doesn't own; CodePoints() makes one. A change of the text's
+/// storage invalidates the range and its iterators.
 /// @snippet examples/reference.cpp code points
 template <class T> class CodePointRange {
 public:
   typedef CodePointIterator<T> iterator;       ///< Walks the code points.
   typedef CodePointIterator<T> const_iterator; ///< Walks the code points.
 
-  /// The pn units at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// Makes the range of the pn units at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   CodePointRange(const T* p, ssize_t pn) : m_begin(p), m_end(p) {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     m_end += pn;
   }
 
-  /// The first code point.
+  /// An iterator at the first code point.
   [[gnu::always_inline]] iterator begin() const {
     iterator first(m_begin, m_begin, m_end);
     first.Read();
     return first;
   }
-  /// Past the last code point.
+  /// An iterator past the last code point.
   iterator end() const { return {m_begin, m_end, m_end}; }
-  /// Whether there are none.
+  /// Returns whether there are no code points.
   bool empty() const { return m_begin == m_end; }
 
 private:
@@ -245,21 +245,21 @@ private:
 };
 
 /// @name Code points
-/// A range for `for (char32_t c : CodePoints(s))`: the code points of a UTF-8 or UTF-16 text, and U+FFFD for
-/// each maximal subpart of malformed text, as the lossy conversions replace it. The range refers to the text,
-/// so a temporary string doesn't compile.
+/// Return a range for `for (char32_t c : CodePoints(s))`: the code points of a UTF-8 or UTF-16 text, with
+/// U+FFFD for each maximal subpart of malformed text, as the lossy conversions replace it. The range refers
+/// to the text, so a call with a temporary string doesn't compile.
 /// @snippet examples/reference.cpp code points
 /// @{
 
-/// The code points of the pn units at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Returns the code points of the pn UTF-8 units at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 inline CodePointRange<char8> CodePoints(const char8* p, ssize_t pn) { return {p, pn}; }
-/// The code points of the pn units at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Returns the code points of the pn UTF-16 units at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 inline CodePointRange<char16> CodePoints(const char16* p, ssize_t pn) { return {p, pn}; }
-/// The code points of a string.
+/// Returns the code points of a UTF-8 string.
 inline CodePointRange<char8> CodePoints(const xvector<char8>& text) { return {text.data(), text.size()}; }
-/// The code points of a string.
+/// Returns the code points of a UTF-16 string.
 inline CodePointRange<char16> CodePoints(const xvector<char16>& text) { return {text.data(), text.size()}; }
-/// The code points of what a view refers to, of a std::string or of a literal.
+/// Returns the code points of a view, a std::string or a literal.
 inline CodePointRange<char8> CodePoints(std::string_view text) { return {text.data(), detail::SizeOf(text)}; }
 CodePointRange<char8> CodePoints(const xvector<char8>&& text) = delete;
 CodePointRange<char16> CodePoints(const xvector<char16>&& text) = delete;
@@ -268,12 +268,12 @@ CodePointRange<char8> CodePoints(std::nullptr_t) = delete;
 
 /// @}
 /// @name Appending a code point
-/// Append the units of c, or of U+FFFD where c is no Unicode scalar value: a surrogate or above U+10FFFF. A
-/// failed allocation throws std::bad_alloc and leaves dst as it was. Amortised constant time.
+/// Append the units of c, or of U+FFFD where c is not a Unicode scalar value: a surrogate, or above U+10FFFF.
+/// A failed allocation throws std::bad_alloc and leaves dst as it was. Amortised constant time.
 /// @snippet examples/reference.cpp code points
 /// @{
 
-/// In UTF-8, one to four units.
+/// Appends c in UTF-8, one to four units.
 inline void AppendCodePoint(xvector<char8>& dst, char32_t c) {
   if (c < 0x80) {
     dst.push_back(static_cast<char8>(c));
@@ -282,7 +282,7 @@ inline void AppendCodePoint(xvector<char8>& dst, char32_t c) {
   char8 units[4];
   dst.push_back(units, detail::Encode(detail::IsScalarValue(c) ? c : detail::kReplacement, units));
 }
-/// In UTF-16, one or two units.
+/// Appends c in UTF-16, one or two units.
 inline void AppendCodePoint(xvector<char16>& dst, char32_t c) {
   char16 units[2];
   dst.push_back(units, detail::Encode(detail::IsScalarValue(c) ? c : detail::kReplacement, units));

@@ -1,8 +1,8 @@
 /// @file
 /// The primitives that fill, copy and destroy the elements of a vector.
 ///
-/// They know pointers to elements, and only here is it decided how an element type is filled and copied.
-/// They allocate nothing.
+/// They know pointers to elements, and decide how an element type is filled and copied. They allocate
+/// nothing.
 
 #pragma once
 
@@ -16,7 +16,7 @@ namespace mirel {
 
 /// @name Element ranges
 /// A range is half open and given by two pointers; an empty one may be a pair of null pointers. Overload
-/// resolution picks the way: a `const T*` source is one block copy, any other source an element loop.
+/// resolution decides how a source is copied: `const T*` as one block, anything else in a loop.
 /// @snippet examples/reference.cpp element ranges
 /// @{
 

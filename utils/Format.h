@@ -1,9 +1,9 @@
 /// @file
-/// Formatters of strings, for the fmt library where it is installed, and for `std::format` where the standard
+/// Formatters of strings: for the fmt library where it is installed, and for `std::format` where the standard
 /// library has it.
 ///
-/// Include it before the first string is formatted. A string is formatted as the `std::string_view` over it,
-/// with all its options; a string16 as UTF-8, in which U+FFFD stands for malformed text.
+/// Include this header before the first string is formatted. A string is formatted like a `std::string_view`,
+/// with the same options; a string16 is converted to UTF-8, with U+FFFD in place of malformed text.
 
 #pragma once
 
@@ -24,10 +24,10 @@
 
 namespace mirel::detail {
 
-/// Formats a string by the formatter of views that it derives from.
+/// Formats a string with the formatter of views that it derives from.
 template <class T, class ViewFormatter> struct StringFormatter : ViewFormatter {
   template <class Context> auto format(const basic_xstring<T>& text, Context& context) const {
-    ViewFormatter view = *this; // the format() of early standard libraries isn't const
+    ViewFormatter view = *this; // a copy, since format() isn't const in early standard libraries
     if constexpr (sizeof(T) == 1) {
       return view.format(View(text), context);
     } else {
@@ -41,7 +41,7 @@ template <class T, class ViewFormatter> struct StringFormatter : ViewFormatter {
 } // namespace mirel::detail
 
 /// @cond
-// Whole specialisations: a partial one would compete with fmt's own for ranges.
+// Full specialisations: a partial one would be ambiguous with fmt's own for ranges.
 #if defined(MIREL_HAS_FMT)
 namespace mirel::detail {
 template <class T> using FmtFormatter = StringFormatter<T, fmt::formatter<std::string_view>>;

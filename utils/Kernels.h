@@ -7,9 +7,9 @@
 
 namespace mirel {
 
-/// The name of the instruction set that this processor's searches and conversions use: "AVX2", "SSE4" or
-/// "NEON"; "none" where they use none of these, or where the library was built without them. Results don't
-/// depend on it.
+/// Returns the name of the instruction set that searches and conversions use on this processor: "AVX2",
+/// "SSE4" or "NEON", or "none" where the processor has none of these or the library was built without
+/// kernels. No result depends on it.
 MIREL_API const char* KernelName();
 
 } // namespace mirel

@@ -1,5 +1,5 @@
 /// @file
-/// What can be wrong with a sequence of UTF-8 or UTF-16, as a value and in words.
+/// The ways in which a UTF-8 or UTF-16 sequence can be malformed, as values and in words.
 
 #pragma once
 
@@ -11,22 +11,22 @@ namespace mirel {
 enum class MalformedReason {
   kNone,                   ///< It is well-formed.
   kTruncated,              ///< The text ends, or goes on with another unit, before the sequence is complete.
-  kUnexpectedContinuation, ///< A byte 80 to BF that continues nothing: each one after an overlong lead, too.
-  kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 begin no others.
+  kUnexpectedContinuation, ///< A byte 80 to BF that continues nothing; after an overlong lead byte, too.
+  kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 only begin such.
   kSurrogate,              ///< A surrogate, D800 to DFFF, encoded in UTF-8.
   kBeyondUnicode,          ///< A code point above U+10FFFF: F4 followed by 90 or above.
   kInvalidByte,            ///< A byte F5 to FF, which UTF-8 never has.
   kUnpairedSurrogate,      ///< A surrogate of UTF-16 without its other half.
 };
 
-/// The reason as a noun phrase for a message, "overlong sequence" for example.
+/// Returns the reason as a noun phrase for a message, "overlong sequence" for example.
 MIREL_API const char* Describe(MalformedReason reason);
 
 /// A malformed sequence in a text.
 /// @snippet examples/reference.cpp checking
 struct MalformedText {
   int64 offset;           ///< The index of its first unit.
-  ssize_t length;         ///< The units that one U+FFFD replaces.
+  ssize_t length;         ///< The number of units that one U+FFFD replaces.
   MalformedReason reason; ///< What is wrong with it.
 };
 

@@ -1,9 +1,8 @@
 /// @file
 /// The precondition assertion: a bad argument stops the process, in every build.
 ///
-/// Unlike `assert` it doesn't look at NDEBUG, neither the library's nor the program's: a check that is
-/// inlined into an optimised program must not disappear there. The report is that of the C library's own
-/// `assert`.
+/// Unlike `assert` it ignores NDEBUG, both the library's and the program's: a check that is inlined into an
+/// optimised program must not disappear there. The report is that of the C library's own `assert`.
 
 #pragma once
 
@@ -12,19 +11,19 @@
 namespace mirel {
 
 /// Reports a violated precondition through the C library's assertion facility and ends the process (SIGABRT).
-/// Where there is no facility that is known, it prints the same line to standard error itself.
+/// Where no such facility is known, it prints the same line to standard error itself.
 ///
-/// @param expression  what should have been true, as text
-/// @param file        source file of the check; a folder utils/ and what follows are reported
-/// @param line        its line there
-/// @param function    signature of the function that made the check
+/// @param expression  the violated expression, as text
+/// @param file        the source file of the check; the report has it from the last folder utils/ on
+/// @param line        the line in that file
+/// @param function    the signature of the function that made the check
 [[noreturn, gnu::cold]] MIREL_API void AssertionFailed(const char* expression, const char* file, int line,
                                                        const char* function);
 
 namespace detail {
 
-/// Whether n elements from index i on lie within size elements. True to its meaning for every pair of values:
-/// written as a sum, i + n could overflow and pass.
+/// Returns whether n elements from index i on lie within size elements. It holds for every pair of values; a
+/// sum i + n could overflow and pass.
 constexpr bool IsSubrange(ssize_t i, ssize_t n, ssize_t size) {
   return 0 <= i && 0 <= n && i <= size && n <= size - i;
 }
@@ -41,7 +40,7 @@ constexpr bool IsSubrange(ssize_t i, ssize_t n, ssize_t size) {
 /// Stops the process with the expression's own text unless the expression, evaluated once, is true.
 #define MIREL_ASSERT(expression) MIREL_ASSERT_AS(expression, #expression)
 
-/// Asserts that the n elements from index i on lie within size, for every pair of values.
+/// Asserts that n elements from index i on lie within size elements, for every pair of values.
 /// For (ri, rn, r.size()) the text is "0 <= ri && 0 <= rn && ri+rn <= r.size()".
 #define MIREL_ASSERT_SUBRANGE(i, n, size)                                                                    \
   MIREL_ASSERT_AS(::mirel::detail::IsSubrange(i, n, size),                                                   \

@@ -1,7 +1,7 @@
 /// @file
-/// The strings at home in the standard library: operators, hashes, views, conversions, and streams.
+/// What connects the strings to the standard library: operators, hashes, views, copies, and streams.
 ///
-/// All of it stands on what the strings have, and a program that doesn't include this header pays nothing.
+/// It uses only public members of the strings, but for FillFrom(), and costs nothing where it isn't included.
 /// Formatted output is in utils/Format.h.
 
 #pragma once
@@ -21,18 +21,18 @@ namespace mirel {
 
 namespace detail {
 
-/// Takes what a std::string_view sees, and nothing that is a null-terminated string already.
+/// Matches what converts to a std::string_view, except null-terminated strings and integers.
 template <class T, class V>
 using IfView = std::enable_if_t<sizeof(T) == 1 && std::is_convertible_v<const V&, std::string_view> &&
                                     !std::is_convertible_v<const V&, const T*> && !kIsInteger<V>,
                                 int>;
 
-/// The code units of whatever may stand beside a string in a comparison or a look-up.
+/// Refers to the code units of an operand: a string, a null-terminated string or a view.
 template <class T> struct TextRef {
   TextRef(const xvector<T>& s) : p(s.data()), n(s.size()) {}
   TextRef(const T* s) : p(s), n((MIREL_ASSERT(s != nullptr), GetStringLength(s))) {}
   TextRef(std::nullptr_t) = delete;
-  template <class X, IfIntegers<X> = 0> TextRef(X) = delete; // a literal 0 would be a null pointer
+  template <class X, IfIntegers<X> = 0> TextRef(X) = delete; // a literal 0 converts to a null pointer
   template <class V, IfView<T, V> = 0> TextRef(const V& v) {
     const std::string_view view = v;
     p = view.data();
@@ -43,15 +43,15 @@ template <class T> struct TextRef {
   ssize_t n;
 };
 
-/// The operand that no type is deduced from.
+/// Keeps an operand out of template argument deduction, so that T comes from the other one.
 template <class T> struct NotDeduced { typedef TextRef<T> type; };
 template <class T> using Operand = typename NotDeduced<T>::type;
 
-/// The code unit of text in any form.
+/// The type of a text's code units, whatever holds the text.
 template <class A>
 using UnitOf = std::conditional_t<std::is_convertible_v<const A&, TextRef<char16>>, char16, char8>;
 
-/// Takes text of one width.
+/// Matches texts of one width.
 template <class T, class... A>
 using IfTexts = std::enable_if_t<(std::is_convertible_v<const A&, TextRef<T>> && ...), int>;
 
@@ -62,7 +62,7 @@ template <class T> int CompareText(TextRef<T> a, TextRef<T> b) {
   return LexicographicalCompareX(a.p, a.p + a.n, b.p, b.p + b.n);
 }
 
-/// Of the bytes of the units: any object may be read as bytes.
+/// Hashes the bytes of the units.
 template <class T> std::size_t HashText(TextRef<T> text) {
   return std::hash<std::string_view>()(
       {reinterpret_cast<const char*>(text.p), static_cast<std::size_t>(text.n) * sizeof(T)});
@@ -71,97 +71,97 @@ template <class T> std::size_t HashText(TextRef<T> text) {
 } // namespace detail
 
 /// @name Comparison
-/// Of strings, vectors and sums of one width with each other, and with an Operand on either side: a
-/// null-terminated string or, in 8 bits, whatever converts to `std::string_view`. Code units compare as
-/// unsigned values; of a string and its proper prefix, the prefix is first. A literal null pointer or 0
-/// doesn't compile. Nothing is allocated; the cost is at worst linear in the shorter length.
+/// Compare strings, vectors and sums of one width with each other, or with an Operand on either side: a
+/// null-terminated string or, for 8-bit text, whatever converts to `std::string_view`. Code units compare as
+/// unsigned values; a proper prefix of a string orders before it. A literal null pointer or 0 doesn't
+/// compile. Nothing is allocated; the cost is at worst linear in the shorter length.
 /// @pre "s != nullptr" of a null-terminated string
 ///
 /// @snippet examples/reference.cpp operators
 /// @{
 
-/// Same code units, as _Eq().
+/// Returns whether a and b have equal code units, as _Eq() does.
 template <class T> bool operator==(const xvector<T>& a, const xvector<T>& b) { return a._Eq(b); }
-/// Same code units.
+/// Returns whether a and b have equal code units.
 template <class T> bool operator==(const xvector<T>& a, detail::Operand<T> b) {
   return detail::IsSameText<T>(a, b);
 }
-/// Same code units.
+/// Returns whether a and b have equal code units.
 template <class T> bool operator==(detail::Operand<T> a, const xvector<T>& b) {
   return detail::IsSameText<T>(a, b);
 }
-/// Other code units.
+/// Returns whether a and b differ.
 template <class T> bool operator!=(const xvector<T>& a, const xvector<T>& b) { return !(a == b); }
-/// Other code units.
+/// Returns whether a and b differ.
 template <class T> bool operator!=(const xvector<T>& a, detail::Operand<T> b) { return !(a == b); }
-/// Other code units.
+/// Returns whether a and b differ.
 template <class T> bool operator!=(detail::Operand<T> a, const xvector<T>& b) { return !(a == b); }
-/// Whether a orders before b, as _Lt().
+/// Returns whether a orders before b, as _Lt() does.
 template <class T> bool operator<(const xvector<T>& a, const xvector<T>& b) { return a._Lt(b); }
-/// Whether a orders before b.
+/// Returns whether a orders before b.
 template <class T> bool operator<(const xvector<T>& a, detail::Operand<T> b) {
   return detail::CompareText<T>(a, b) < 0;
 }
-/// Whether a orders before b.
+/// Returns whether a orders before b.
 template <class T> bool operator<(detail::Operand<T> a, const xvector<T>& b) {
   return detail::CompareText<T>(a, b) < 0;
 }
-/// Whether a orders after b.
+/// Returns whether a orders after b.
 template <class T> bool operator>(const xvector<T>& a, const xvector<T>& b) { return b < a; }
-/// Whether a orders after b.
+/// Returns whether a orders after b.
 template <class T> bool operator>(const xvector<T>& a, detail::Operand<T> b) { return b < a; }
-/// Whether a orders after b.
+/// Returns whether a orders after b.
 template <class T> bool operator>(detail::Operand<T> a, const xvector<T>& b) { return b < a; }
-/// Whether a orders before b, or is the same.
+/// Returns whether a orders before b or equals it.
 template <class T> bool operator<=(const xvector<T>& a, const xvector<T>& b) { return !(b < a); }
-/// Whether a orders before b, or is the same.
+/// Returns whether a orders before b or equals it.
 template <class T> bool operator<=(const xvector<T>& a, detail::Operand<T> b) { return !(b < a); }
-/// Whether a orders before b, or is the same.
+/// Returns whether a orders before b or equals it.
 template <class T> bool operator<=(detail::Operand<T> a, const xvector<T>& b) { return !(b < a); }
-/// Whether a orders after b, or is the same.
+/// Returns whether a orders after b or equals it.
 template <class T> bool operator>=(const xvector<T>& a, const xvector<T>& b) { return !(a < b); }
-/// Whether a orders after b, or is the same.
+/// Returns whether a orders after b or equals it.
 template <class T> bool operator>=(const xvector<T>& a, detail::Operand<T> b) { return !(a < b); }
-/// Whether a orders after b, or is the same.
+/// Returns whether a orders after b or equals it.
 template <class T> bool operator>=(detail::Operand<T> a, const xvector<T>& b) { return !(a < b); }
 
 /// @}
 /// @name Keys
-/// What a map is told to compare and hash by, so that it is searched with whatever the operators compare, and
-/// copies nothing: a `std::map` from C++17 on, an unordered one from C++20 on. Pointers are null-terminated
-/// strings, two of them too: never addresses.
+/// Comparators and a hash for maps that are searched without copying the key, with whatever the operators
+/// compare: a `std::map` from C++17 on, an unordered map from C++20 on. A pointer is always a null-terminated
+/// string, never an address, also where both operands are pointers.
 /// @snippet examples/reference.cpp keys
 /// @{
 
-/// The order of the operator `<`.
+/// Orders texts as the operator `<` does.
 /// @snippet examples/reference.cpp keys
 struct Less {
-  typedef void is_transparent; ///< Look-ups take other types than the key's.
-  /// Whether a orders before b.
+  typedef void is_transparent; ///< Lets look-ups take other types than the key's.
+  /// Returns whether a orders before b.
   template <class A, class B, detail::IfTexts<detail::UnitOf<A>, A, B> = 0>
   bool operator()(const A& a, const B& b) const {
     return detail::CompareText<detail::UnitOf<A>>(a, b) < 0;
   }
 };
 
-/// The equality of the operator `==`.
+/// Compares texts as the operator `==` does.
 /// @snippet examples/reference.cpp keys
 struct Equal {
-  typedef void is_transparent; ///< Look-ups take other types than the key's.
-  /// Whether a and b have the same code units.
+  typedef void is_transparent; ///< Lets look-ups take other types than the key's.
+  /// Returns whether a and b have equal code units.
   template <class A, class B, detail::IfTexts<detail::UnitOf<A>, A, B> = 0>
   bool operator()(const A& a, const B& b) const {
     return detail::IsSameText<detail::UnitOf<A>>(a, b);
   }
 };
 
-/// The hash of a text, whatever holds it; of 8-bit text that of the `std::string_view`. `std::hash` of a
-/// string is the same, for the default of unordered containers. Neither is noexcept: GNU's containers then
-/// keep the hash with each key, as they do for their own strings.
+/// Hashes a text, whatever holds it; the hash of 8-bit text is that of its `std::string_view`. `std::hash` of
+/// a string, the default of unordered containers, gives the same value. Neither is noexcept: libstdc++'s
+/// containers then store the hash with each key, as they do for std::string.
 /// @snippet examples/reference.cpp keys
 struct Hash {
-  typedef void is_transparent; ///< Look-ups take other types than the key's.
-  /// The hash of the code units.
+  typedef void is_transparent; ///< Lets look-ups take other types than the key's.
+  /// Returns the hash of the code units.
   template <class A, detail::IfTexts<detail::UnitOf<A>, A> = 0> std::size_t operator()(const A& text) const {
     return detail::HashText<detail::UnitOf<A>>(text);
   }
@@ -169,35 +169,35 @@ struct Hash {
 
 /// @}
 /// @name Views, and copies to and from standard strings
-/// A char16 is no char16_t, and neither may be read through a pointer to the other; so 16-bit text has copies
-/// only.
+/// A char16 is not a char16_t, and neither may be read through a pointer to the other. So there are no views
+/// of 16-bit text, only copies.
 /// @snippet examples/reference.cpp views
 /// @{
 
-/// The units of s. The view is valid until the next change of s, c_str() included; of a temporary it doesn't
-/// compile.
+/// Returns a view of s. It is valid until the next change of s, c_str() included. A call with a temporary
+/// doesn't compile.
 inline std::string_view View(const xvector<char8>& s) {
   return {s.data(), static_cast<std::size_t>(s.size())};
 }
 std::string_view View(const xvector<char8>&&) = delete;
-/// A copy as a standard string.
+/// Copies s into a standard string.
 inline std::string ToString(const xvector<char8>& s) { return std::string(View(s)); }
-/// A copy as a standard string.
+/// Copies s into a standard string.
 inline std::u16string ToU16String(const xvector<char16>& s) {
   std::u16string result(static_cast<std::size_t>(s.size()), u'\0');
   if (!s.empty()) // memcpy may not be given null pointers
     std::memcpy(result.data(), s.data(), result.size() * sizeof(char16));
   return result;
 }
-/// A copy of what is seen, zeros included. A literal's ends before its first zero.
+/// Copies the view's text, nulls included. A literal ends at its first null.
 inline string8 ToString8(std::string_view s) { return string8(s.data(), static_cast<ssize_t>(s.size())); }
 #if defined(__cpp_lib_char8_t)
-/// A copy of what is seen, as a `u8"..."` literal from C++20 on.
+/// Copies the view's text, of a `u8"..."` literal for example, from C++20 on.
 inline string8 ToString8(std::u8string_view s) {
   return string8(reinterpret_cast<const char8*>(s.data()), static_cast<ssize_t>(s.size()));
 }
 #endif
-/// A copy of what is seen, as a `u"..."` literal or a standard string.
+/// Copies the view's text, of a `u"..."` literal or a std::u16string for example.
 string16 ToString16(std::u16string_view s);
 
 /// @}
@@ -209,16 +209,16 @@ std::basic_ostream<char, Traits>& operator<<(std::basic_ostream<char, Traits>& o
   return os << std::basic_string_view<char, Traits>(s.data(), static_cast<std::size_t>(s.size()));
 }
 
-/// Appends what f writes: makes room for up to most units without filling them, calls f(p, most), where p
-/// points to the room, and keeps as many units as f returns.
+/// Appends what f writes. It makes room for most units without initialising them, calls f(p, most) with p at
+/// the first of them, and keeps as many units as f returns.
 ///
 ///     while (FillFrom(text, 65536, [&](char* p, ssize_t n) { return std::fread(p, 1, size_t(n), file); }) >
 ///     0)
 ///       ;
 ///
-/// A run of calls moves each unit a constant number of times on average. If f throws, the contents are as
-/// they were; f may not use dst.
-/// @pre "0 <= most", then "0 <= filled && filled <= most" of what f returns
+/// Over many calls, each unit is moved a constant number of times on average. If f throws, the contents stay
+/// as they were. f may not use dst.
+/// @pre "0 <= most"; then, for f's result, "0 <= filled && filled <= most"
 /// @return what f returned, as an ssize_t
 template <class T, class N, class F, detail::IfIntegers<N> = 0>
 ssize_t FillFrom(xvector<T>& dst, N most, F&& f) {
@@ -244,7 +244,7 @@ inline string16 ToString16(std::u16string_view s) {
 } // namespace mirel
 
 /// @cond
-// The reference would have no page for them. The hash of a string8 is that of the std::string_view.
+// Hidden from the reference, which has no page for std::hash.
 template <class T> struct std::hash<mirel::basic_xstring<T>> {
   std::size_t operator()(const mirel::basic_xstring<T>& s) const { return mirel::detail::HashText<T>(s); }
 };

@@ -8,14 +8,14 @@
 namespace mirel {
 
 /// Where the bytes of an xostream go: implement it for a file, a socket or a string.
-/// What an implementation throws leaves the stream member that called it, which counts the bytes of that call
-/// as not written.
+/// An exception that an implementation throws passes through the stream's member. The stream counts the bytes
+/// of that call as not written.
 /// @snippet examples/reference.cpp sinks
 struct MIREL_API IOutputStream {
   virtual ~IOutputStream();
   /// Takes the count bytes at address, all of them; count is above 0.
   virtual void WriteStream(const void* address, ssize_t count) = 0;
-  /// Passes on whatever the sink may have kept back.
+  /// Passes on what the sink has buffered.
   virtual void FlushStream() = 0;
 };
 

@@ -1,7 +1,7 @@
 /// @file
-/// The search for a needle in a range that only random-access iterators need: linear for every input.
+/// The search for a needle in a range of random-access iterators, in linear time for every input.
 ///
-/// It knows integers and iterators, neither text nor containers. It allocates nothing and can't fail.
+/// It knows iterators over integers, but neither text nor containers. It allocates nothing and can't fail.
 
 #pragma once
 
@@ -14,24 +14,24 @@ namespace mirel {
 
 namespace detail {
 
-/// What a search by comparing at each place may spend in vain: it is worth while as long as it fails at one
-/// of the first units, and must not go on where it doesn't.
+/// Decides how long a search may compare the needle at each place. That is fast as long as most comparisons
+/// fail within the first units, and takes quadratic time where they don't.
 class Credit {
 public:
   explicit Credit(ssize_t needleLength) : m_credit(needleLength / 2 + 64) {}
 
-  /// Whether the search may go on after a comparison that fails behind so many equal units. So many places
-  /// have been passed in all.
+  /// Returns whether the search may go on, after a comparison that failed behind equalUnits equal units. The
+  /// search has passed so many places in all.
   bool Allows(ssize_t equalUnits, ssize_t passed) {
     m_credit -= equalUnits / 4 + 8;
     return m_credit + 4 * int64(passed) >= 0;
   }
 
 private:
-  int64 m_credit; // four times a size
+  int64 m_credit; // 64 bits, since places count fourfold
 };
 
-/// The number of equal elements before the first difference of the n at x and at y, n if there is none.
+/// Counts the equal elements before the first difference of the n at x and the n at y; n if all are equal.
 template <class It1, class It2> ssize_t EqualElements(It1 x, It2 y, ssize_t n) {
   ssize_t i = 0;
   while (i < n && UnitValue(x[i]) == UnitValue(y[i]))
@@ -39,12 +39,12 @@ template <class It1, class It2> ssize_t EqualElements(It1 x, It2 y, ssize_t n) {
   return i;
 }
 
-/// Crochemore and Perrin, Two-way string-matching (1991). The needle is cut in two. Its right part is
+/// Two-way string matching, by Crochemore and Perrin (1991). The needle is cut in two. Its right part is
 /// compared forwards; a mismatch there moves the needle past it. Then the left part is compared backwards; a
 /// mismatch there moves the needle by its period, or, where that is long, by more than the longer part.
 template <class It> class TwoWay {
 public:
-  /// A needle of at least one element.
+  /// Prepares a needle of at least one element.
   TwoWay(It y1, It y2) : m_needle(y1), m_length(y2 - y1) {
     const Suffix less = MaximalSuffix([](const auto& a, const auto& b) { return a < b; });
     const Suffix greater = MaximalSuffix([](const auto& a, const auto& b) { return b < a; });
@@ -55,9 +55,9 @@ public:
     m_shift = m_isPeriodic ? suffix.period : (m_cut > right ? m_cut : right) + 1;
   }
 
-  /// The start of the first occurrence in [x1, x2), or x2.
+  /// Returns the start of the first occurrence in [x1, x2), or x2.
   template <class It1> It1 Find(It1 x1, It1 x2) const {
-    ssize_t known = 0; // so many elements at the needle's begin are known to be equal
+    ssize_t known = 0; // the number of elements at the needle's beginning that are known to be equal
     while (x2 - x1 >= m_length) {
       const ssize_t from = m_cut > known ? m_cut : known;
       const ssize_t i = from + EqualElements(x1 + from, m_needle + from, m_length - from);
@@ -83,12 +83,12 @@ private:
     ssize_t period;
   };
 
-  /// The needle's greatest suffix in the given order, and that suffix's period.
+  /// Finds the needle's greatest suffix in the given order, and that suffix's period.
   template <class Less> Suffix MaximalSuffix(const Less& less) const {
     Suffix best = {0, 1};
     for (ssize_t other = 1, k = 0; other + k < m_length;) {
       const auto a = UnitValue(m_needle[other + k]), b = UnitValue(m_needle[best.begin + k]);
-      if (less(a, b)) { // the other suffix is smaller, and so is every one that begins up to here
+      if (less(a, b)) { // the other suffix is smaller, and so are all that begin up to here
         other += k + 1;
         k = 0;
         best.period = other - best.begin;
@@ -107,12 +107,12 @@ private:
   It m_needle;
   ssize_t m_length;
   ssize_t m_cut;     ///< the length of the left part
-  ssize_t m_shift;   ///< by how many places a mismatch in the left part moves the needle
+  ssize_t m_shift;   ///< how far a mismatch in the left part moves the needle
   bool m_isPeriodic; ///< whether m_shift is the needle's period
 };
 
-/// The start of the first occurrence of [y1, y2) in [x1, x2), or x2: the needle is compared at each place,
-/// but looked for by Two-Way once that turns out to be slow.
+/// Returns the start of the first occurrence of [y1, y2) in [x1, x2), or x2. It compares the needle at each
+/// place, and changes to TwoWay once that turns out to be slow.
 template <class It1, class It2> It1 FindNeedle(It1 x1, It1 x2, It2 y1, It2 y2) {
   const ssize_t length = y2 - y1;
   if (length == 0)
@@ -130,7 +130,7 @@ template <class It1, class It2> It1 FindNeedle(It1 x1, It1 x2, It2 y1, It2 y2) {
   return x2;
 }
 
-/// The start of the last occurrence of [y1, y2) in [x1, x2), or x2.
+/// Returns the start of the last occurrence of [y1, y2) in [x1, x2), or x2.
 template <class It1, class It2> It1 FindLastNeedle(It1 x1, It1 x2, It2 y1, It2 y2) {
   using Reverse1 = std::reverse_iterator<It1>;
   using Reverse2 = std::reverse_iterator<It2>;

@@ -2,14 +2,14 @@
 /// UTF-8 and UTF-16 text: where it is malformed, how long it is in the other encoding, and conversions that
 /// append, that replace malformed text, and that take the standard library's views.
 ///
-/// It adds to the conversions of utils/xstring.h what a program that handles text needs around them, and
-/// includes the ranges of code points (utils/CodePoints.h) and the conversions of text in pieces
-/// (utils/UtfStream.h). It has no state, and allocates nothing but what a destination needs.
+/// It completes the conversions of utils/xstring.h, and includes the ranges of code points
+/// (utils/CodePoints.h) and the conversions of text in pieces (utils/UtfStream.h). It has no state, and
+/// allocates nothing but what a destination needs.
 ///
 /// What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for UTF-16.
-/// Each function takes a pointer and a count of units, or a string; in 8 bits also a std::string_view, and so
-/// a std::string and a literal. A null pointer with a count of 0 is an empty text. Every function takes
-/// linear time, and looks at no unit outside the text.
+/// Each function takes a pointer and a count of units, or a string; for 8-bit text also a std::string_view,
+/// and so a std::string or a literal. A null pointer with a count of 0 is an empty text. Every function takes
+/// linear time, and reads no unit outside the text.
 
 #pragma once
 
@@ -27,49 +27,54 @@ namespace mirel {
 /// @snippet examples/reference.cpp checking
 /// @{
 
-/// Where the first sequence begins that isn't well-formed, in units, or npos (-1) where there is none.
+/// Finds the first malformed sequence of a UTF-8 text.
+/// @return the index of its first unit, or npos (-1) if the text is well-formed
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t FindMalformed(const char8* p, ssize_t pn);
-/// Finds malformed UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Finds the first unpaired surrogate of a UTF-16 text: its index, or npos (-1).
+/// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t FindMalformed(const char16* p, ssize_t pn);
-/// Finds malformed text in a string.
+/// Finds the first malformed sequence of a string: the index of its first unit, or npos (-1).
 inline ssize_t FindMalformed(const xvector<char8>& text) { return FindMalformed(text.data(), text.size()); }
-/// Finds malformed text in a string.
+/// Finds the first unpaired surrogate of a string: its index, or npos (-1).
 inline ssize_t FindMalformed(const xvector<char16>& text) { return FindMalformed(text.data(), text.size()); }
-/// Finds malformed text in a view.
+/// Finds the first malformed sequence of a view's text: the index of its first unit, or npos (-1).
 inline ssize_t FindMalformed(std::string_view text) {
   return FindMalformed(text.data(), detail::SizeOf(text));
 }
 ssize_t FindMalformed(std::nullptr_t) = delete;
 
-/// Whether the text is well-formed UTF-8. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Returns whether the text is well-formed UTF-8. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 inline bool IsWellFormed(const char8* p, ssize_t pn) { return FindMalformed(p, pn) < 0; }
-/// Whether the text is well-formed UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Returns whether the text is well-formed UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 inline bool IsWellFormed(const char16* p, ssize_t pn) { return FindMalformed(p, pn) < 0; }
-/// Whether a string is well-formed.
+/// Returns whether a string is well-formed UTF-8.
 inline bool IsWellFormed(const xvector<char8>& text) { return FindMalformed(text) < 0; }
-/// Whether a string is well-formed.
+/// Returns whether a string is well-formed UTF-16.
 inline bool IsWellFormed(const xvector<char16>& text) { return FindMalformed(text) < 0; }
-/// Whether the text of a view is well-formed.
+/// Returns whether a view's text is well-formed UTF-8.
 inline bool IsWellFormed(std::string_view text) { return FindMalformed(text) < 0; }
 bool IsWellFormed(std::nullptr_t) = delete;
 
-/// What is wrong with the sequence that begins at an offset: for a result of FindMalformed(), or any other
-/// boundary of sequences. For a well-formed one the reason is kNone, and the length its own. Constant time.
+/// Explains what is wrong with the sequence that begins at an offset: a result of FindMalformed(), or another
+/// boundary of sequences. A well-formed sequence has its own length and the reason kNone. Constant time.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)", then "0 <= offset && offset < pn"
 MIREL_API MalformedText ExplainMalformed(const char8* p, ssize_t pn, ssize_t offset);
-/// Explains a sequence of UTF-16.
+/// Explains what is wrong with the UTF-16 sequence that begins at an offset. Constant time.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)", then "0 <= offset && offset < pn"
 MIREL_API MalformedText ExplainMalformed(const char16* p, ssize_t pn, ssize_t offset);
-/// Explains a sequence of a string. @pre "0 <= offset && offset < pn", where pn is its size
+/// Explains what is wrong with the sequence of a string that begins at an offset. Constant time.
+/// @pre "0 <= offset && offset < pn", where pn is its size
 inline MalformedText ExplainMalformed(const xvector<char8>& text, ssize_t offset) {
   return ExplainMalformed(text.data(), text.size(), offset);
 }
-/// Explains a sequence of a string. @pre "0 <= offset && offset < pn", where pn is its size
+/// Explains what is wrong with the sequence of a string that begins at an offset. Constant time.
+/// @pre "0 <= offset && offset < pn", where pn is its size
 inline MalformedText ExplainMalformed(const xvector<char16>& text, ssize_t offset) {
   return ExplainMalformed(text.data(), text.size(), offset);
 }
-/// Explains a sequence of a view's text. @pre "0 <= offset && offset < pn", where pn is its size
+/// Explains what is wrong with the sequence of a view's text that begins at an offset. Constant time.
+/// @pre "0 <= offset && offset < pn", where pn is its size
 inline MalformedText ExplainMalformed(std::string_view text, ssize_t offset) {
   return ExplainMalformed(text.data(), detail::SizeOf(text), offset);
 }
@@ -77,40 +82,40 @@ MalformedText ExplainMalformed(std::nullptr_t, ssize_t) = delete;
 
 /// @}
 /// @name Counting
-/// Lengths are those of what the lossy conversions give, which on well-formed text is what the strict ones
-/// do.
+/// Malformed text counts as the U+FFFD that the lossy conversions put in its place.
 /// @snippet examples/reference.cpp counting
 /// @{
 
-/// The units of a UTF-8 text in UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Counts the UTF-16 units of a UTF-8 text. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf16Length(const char8* p, ssize_t pn);
-/// The units of a string in UTF-16.
+/// Counts the UTF-16 units of a UTF-8 string.
 inline ssize_t Utf16Length(const xvector<char8>& text) { return Utf16Length(text.data(), text.size()); }
-/// The units of a view's text in UTF-16.
+/// Counts the UTF-16 units of a view's UTF-8 text.
 inline ssize_t Utf16Length(std::string_view text) { return Utf16Length(text.data(), detail::SizeOf(text)); }
 ssize_t Utf16Length(std::nullptr_t) = delete;
 
-/// The units of a UTF-16 text in UTF-8, but PTRDIFF_MAX where a program of 32 bits can't count them.
+/// Counts the UTF-8 units of a UTF-16 text. In a 32-bit program they can be more than an ssize_t holds; the
+/// result is then PTRDIFF_MAX.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf8Length(const char16* p, ssize_t pn);
-/// The units of a string in UTF-8.
+/// Counts the UTF-8 units of a UTF-16 string, PTRDIFF_MAX if an ssize_t can't hold the number.
 inline ssize_t Utf8Length(const xvector<char16>& text) { return Utf8Length(text.data(), text.size()); }
 
-/// The code points of a UTF-8 text, and one for each maximal subpart of malformed text.
+/// Counts the code points of a UTF-8 text, and one for each maximal subpart of malformed text.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t CountCodePoints(const char8* p, ssize_t pn);
-/// The code points of a UTF-16 text, and one for each unpaired surrogate.
+/// Counts the code points of a UTF-16 text, and one for each unpaired surrogate.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t CountCodePoints(const char16* p, ssize_t pn);
-/// The code points of a string.
+/// Counts the code points of a string, and one for each maximal subpart of malformed text.
 inline ssize_t CountCodePoints(const xvector<char8>& text) {
   return CountCodePoints(text.data(), text.size());
 }
-/// The code points of a string.
+/// Counts the code points of a string, and one for each unpaired surrogate.
 inline ssize_t CountCodePoints(const xvector<char16>& text) {
   return CountCodePoints(text.data(), text.size());
 }
-/// The code points of a view's text.
+/// Counts the code points of a view's text, and one for each maximal subpart of malformed text.
 inline ssize_t CountCodePoints(std::string_view text) {
   return CountCodePoints(text.data(), detail::SizeOf(text));
 }
@@ -118,81 +123,81 @@ ssize_t CountCodePoints(std::nullptr_t) = delete;
 
 /// @}
 /// @name Strict conversions
-/// Replace the contents of the destination, as the conversions of utils/xstring.h do: false where the source
-/// is malformed, and the destination then holds what precedes the malformed sequence. A failed allocation
-/// throws std::bad_alloc and leaves the beginning of the result in the destination. The source may not lie in
-/// the destination.
+/// Replace the contents of the destination, as the conversions of utils/xstring.h do. They return false where
+/// the source is malformed; the destination then holds what precedes the malformed sequence. A failed
+/// allocation throws std::bad_alloc and leaves the beginning of the result in the destination. The source may
+/// not lie in the destination.
 /// @snippet examples/reference.cpp strict conversions
 /// @{
 
-/// UTF-8 to UTF-16.
+/// Converts a string from UTF-8 to UTF-16.
 inline bool Utf16FromUtf8(string16& dst, const xvector<char8>& text) {
   return Utf16FromUtf8(dst, text.data(), text.size());
 }
-/// UTF-8 to UTF-16, from a view.
+/// Converts a view's text from UTF-8 to UTF-16.
 inline bool Utf16FromUtf8(string16& dst, std::string_view text) {
   return Utf16FromUtf8(dst, text.data(), detail::SizeOf(text));
 }
-/// UTF-16 to UTF-8.
+/// Converts a string from UTF-16 to UTF-8.
 inline bool Utf8FromUtf16(string8& dst, const xvector<char16>& text) {
   return Utf8FromUtf16(dst, text.data(), text.size());
 }
-/// UTF-16 to UTF-8, from a view or a literal of the standard library's UTF-16. It is copied by blocks on the
-/// stack, since a char16_t is another type than a char16.
+/// Converts a view's text, or a literal, from UTF-16 to UTF-8. The text is copied to the stack a block at a
+/// time, since char16_t is another type than char16.
 MIREL_API bool Utf8FromUtf16(string8& dst, std::u16string_view text);
 
 /// @}
 /// @name Appending conversions
-/// Append the result to what the destination holds: false where the source is malformed, and what precedes
-/// the malformed sequence has then been appended. A failed allocation throws std::bad_alloc and leaves what
+/// Append the result to what the destination holds. They return false where the source is malformed, after
+/// appending what precedes the malformed sequence. A failed allocation throws std::bad_alloc and leaves what
 /// the destination held and the beginning of the result. Where storage grows, it at least doubles, so that
-/// many small texts take amortised linear time. The source may not lie in the destination. A UtfStream that
-/// replaces malformed text appends too.
+/// many small texts take amortised linear time. The source may not lie in the destination. To append and
+/// replace malformed text, use a UtfStream.
 /// @snippet examples/reference.cpp appending conversions
 /// @{
 
-/// Appends UTF-8 as UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Appends a UTF-8 text as UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API bool AppendUtf16(string16& dst, const char8* p, ssize_t pn);
-/// Appends a string as UTF-16.
+/// Appends a UTF-8 string as UTF-16.
 inline bool AppendUtf16(string16& dst, const xvector<char8>& text) {
   return AppendUtf16(dst, text.data(), text.size());
 }
-/// Appends a view's text as UTF-16.
+/// Appends a view's UTF-8 text as UTF-16.
 inline bool AppendUtf16(string16& dst, std::string_view text) {
   return AppendUtf16(dst, text.data(), detail::SizeOf(text));
 }
 bool AppendUtf16(string16&, std::nullptr_t) = delete;
-/// Appends UTF-16 as UTF-8. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Appends a UTF-16 text as UTF-8. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API bool AppendUtf8(string8& dst, const char16* p, ssize_t pn);
-/// Appends a string as UTF-8.
+/// Appends a UTF-16 string as UTF-8.
 inline bool AppendUtf8(string8& dst, const xvector<char16>& text) {
   return AppendUtf8(dst, text.data(), text.size());
 }
 
 /// @}
 /// @name Lossy conversions
-/// Replace the contents of the destination with the text, in which each maximal subpart of malformed text has
-/// become U+FFFD, as in browsers and in Python (Unicode Standard 3.9, U+FFFD Substitution of Maximal
-/// Subparts). They return how many there are. A failed allocation throws std::bad_alloc and leaves the
-/// beginning of the result in the destination. The source may not lie in the destination. AppendCodePoint()
-/// of each of CodePoints() does it within one encoding.
+/// Replace the contents of the destination. Each maximal subpart of malformed text becomes U+FFFD, as in
+/// browsers and in Python (Unicode Standard 3.9, U+FFFD Substitution of Maximal Subparts); the conversions
+/// return how many there are. A failed allocation throws std::bad_alloc and leaves the beginning of the
+/// result in the destination. The source may not lie in the destination. To replace malformed text without
+/// changing the encoding, pass each of CodePoints() to AppendCodePoint().
 /// @snippet examples/reference.cpp lossy conversions
 /// @{
 
-/// UTF-8 to UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Converts UTF-8 to UTF-16 and replaces malformed text. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf16FromUtf8Lossy(string16& dst, const char8* p, ssize_t pn);
-/// UTF-8 to UTF-16, from a string.
+/// Converts a string from UTF-8 to UTF-16 and replaces malformed text.
 inline ssize_t Utf16FromUtf8Lossy(string16& dst, const xvector<char8>& text) {
   return Utf16FromUtf8Lossy(dst, text.data(), text.size());
 }
-/// UTF-8 to UTF-16, from a view.
+/// Converts a view's text from UTF-8 to UTF-16 and replaces malformed text.
 inline ssize_t Utf16FromUtf8Lossy(string16& dst, std::string_view text) {
   return Utf16FromUtf8Lossy(dst, text.data(), detail::SizeOf(text));
 }
 ssize_t Utf16FromUtf8Lossy(string16&, std::nullptr_t) = delete;
-/// UTF-16 to UTF-8. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Converts UTF-16 to UTF-8 and replaces unpaired surrogates. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf8FromUtf16Lossy(string8& dst, const char16* p, ssize_t pn);
-/// UTF-16 to UTF-8, from a string.
+/// Converts a string from UTF-16 to UTF-8 and replaces unpaired surrogates.
 inline ssize_t Utf8FromUtf16Lossy(string8& dst, const xvector<char16>& text) {
   return Utf8FromUtf16Lossy(dst, text.data(), text.size());
 }

@@ -1,5 +1,5 @@
 /// @file
-/// Conversions of text that comes in pieces, which may end within a sequence.
+/// Conversions of text that arrives in pieces. A piece may end within a sequence.
 
 #pragma once
 
@@ -13,33 +13,33 @@ namespace mirel {
 
 /// What a conversion in pieces does with malformed text.
 enum class OnMalformed {
-  kStop,   ///< It converts nothing from the first malformed sequence on.
-  kReplace ///< It replaces each maximal subpart by U+FFFD.
+  kStop,   ///< Stops at the first malformed sequence and converts nothing from there on.
+  kReplace ///< Replaces each maximal subpart by U+FFFD.
 };
 
-/// A conversion of text in pieces: Utf8Stream and Utf16Stream. Any way of cutting a text into pieces gives
-/// the result of the whole text.
+/// Converts text that arrives in pieces; use it as Utf8Stream or Utf16Stream. However the text is cut, the
+/// result is that of the whole text.
 /// @snippet examples/reference.cpp streams
 template <class CharOut, class CharIn> class MIREL_API UtfStream {
 public:
-  /// A stream at the beginning of a text.
+  /// Makes a stream at the beginning of a text.
   explicit UtfStream(OnMalformed onMalformed = OnMalformed::kStop) : m_onMalformed(onMalformed) {}
 
-  /// Converts the pn units at p, and those that were kept of the last piece, behind what dst holds. What may
-  /// be the beginning of a sequence that goes on in the next piece is kept: up to three bytes of UTF-8, one
-  /// unit of UTF-16.
+  /// Converts the units kept from the last piece and the pn units at p, and appends the result to dst. Units
+  /// at the end that may begin a sequence are kept until the next piece completes it: up to three bytes of
+  /// UTF-8, one unit of UTF-16.
   ///
   /// A failed allocation throws std::bad_alloc; dst then holds the beginning of the result, and the stream
   /// can't go on: assign a new one to it. The source may not lie in dst.
-  /// @return false where the text has a malformed sequence and the stream stops at it, and from then on; dst
-  /// holds what precedes it
+  /// @return false once the stream has stopped at a malformed sequence; dst then holds what precedes it
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   bool Append(basic_xstring<CharOut>& dst, const CharIn* p, ssize_t pn);
-  /// Appends a piece of text.
+  /// Converts the next piece, the text of a string, and appends the result to dst.
   bool Append(basic_xstring<CharOut>& dst, const xvector<CharIn>& text) {
     return Append(dst, text.data(), text.size());
   }
-  /// Appends a piece of UTF-8 that a std::string_view sees, a std::string or a literal too.
+  /// Converts the next piece, the UTF-8 text of a view, a std::string or a literal, and appends the result to
+  /// dst.
   template <class V,
             std::enable_if_t<sizeof(CharIn) == 1 && std::is_convertible_v<const V&, std::string_view> &&
                                  !std::is_null_pointer_v<V>,
@@ -48,20 +48,20 @@ public:
     const std::string_view view = text;
     return Append(dst, view.data(), static_cast<ssize_t>(view.size()));
   }
-  /// Ends the text. What was kept is malformed, since nothing completes it, and becomes U+FFFD or stops the
-  /// stream. The next call begins another text; until then the members below tell of this one.
-  /// @return whether the text was well-formed, or has been replaced where it wasn't
+  /// Ends the text. Units that were kept are malformed, since nothing completes them: they become U+FFFD or
+  /// stop the stream. The next call begins another text; until then the members below describe this one.
+  /// @return whether the text was well-formed, or its malformed parts have been replaced
   bool Finish(basic_xstring<CharOut>& dst);
 
-  /// The units of the text so far, those that were kept included; once the stream has stopped, the offset of
+  /// The number of units taken so far, with those that are kept; once the stream has stopped, the offset of
   /// the malformed sequence.
   int64 position() const { return m_converted + m_pending; }
-  /// How many of them are kept for the next piece.
+  /// The number of units kept for the next piece.
   ssize_t pending() const { return m_pending; }
-  /// How many U+FFFD stand for malformed text so far.
+  /// The number of U+FFFD that have replaced malformed text so far.
   int64 replacements() const { return m_replacements; }
-  /// The first malformed sequence; the offset is from the beginning of the text. Its reason is kNone and its
-  /// offset npos while there is none.
+  /// The first malformed sequence, its offset counted from the beginning of the text. While there is none,
+  /// the reason is kNone and the offset npos.
   const MalformedText& malformed() const { return m_malformed; }
 
 private:
@@ -78,8 +78,8 @@ private:
   MalformedText m_malformed = {-1, 0, MalformedReason::kNone};
 };
 
-typedef UtfStream<char16, char8> Utf8Stream;  ///< Takes UTF-8 and gives UTF-16.
-typedef UtfStream<char8, char16> Utf16Stream; ///< Takes UTF-16 and gives UTF-8.
+typedef UtfStream<char16, char8> Utf8Stream;  ///< Converts UTF-8 to UTF-16.
+typedef UtfStream<char8, char16> Utf16Stream; ///< Converts UTF-16 to UTF-8.
 
 extern template class UtfStream<char16, char8>;
 extern template class UtfStream<char8, char16>;

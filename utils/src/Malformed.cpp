@@ -1,4 +1,4 @@
-// What is malformed in a text, where, and why.
+// Finds malformed text and says why it is malformed.
 
 #include <utils/Utf.h>
 
@@ -34,7 +34,7 @@ MalformedReason ReasonOf(const char8* p, const char8* end, const Sequence& seque
     return MalformedReason::kInvalidByte;
   if (sequence.length > 1 || end - p < 2 || !IsContinuation(p[1]))
     return MalformedReason::kTruncated;
-  // The two bytes don't go together.
+  // What is left is a second byte that the lead byte doesn't allow.
   if (lead == 0xED)
     return MalformedReason::kSurrogate;
   return lead == 0xF4 ? MalformedReason::kBeyondUnicode : MalformedReason::kOverlong;

@@ -13,8 +13,8 @@ namespace mirel {
 
 namespace {
 
-/// The file's name from the folder of includes on: for inline code, compilers have the path by which the
-/// program found the header.
+/// Cuts off what precedes the last folder utils/. For inline code, __FILE__ is the path by which the program
+/// found the header.
 const char* IncludeName(const char* file) {
   while (const char* const folder = std::strstr(file, "/utils/"))
     file = folder + 1;
@@ -29,7 +29,7 @@ void AssertionFailed(const char* expression, const char* file, int line, const c
 #elif defined(__GLIBC__) && !defined(MIREL_NO_ASSERT_FACILITY)
   __assert_fail(expression, IncludeName(file), static_cast<unsigned>(line), function);
 #else
-  // What glibc prints. Other C libraries have facilities of other names and forms, if any.
+  // The text is glibc's. Other C libraries have other facilities, or none.
 #ifdef __linux__
   std::fprintf(stderr, "%s: ", program_invocation_short_name);
 #endif

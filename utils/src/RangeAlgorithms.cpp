@@ -8,7 +8,7 @@ namespace mirel::detail {
 
 namespace {
 
-/// A set of code units as a bit for each unit that there is.
+/// A set of code units, one bit for each possible unit.
 template <class T> class UnitBits {
 public:
   UnitBits(const T* y1, const T* y2) {
@@ -21,8 +21,8 @@ private:
   uint64_t m_words[sizeof(T) == 1 ? 256 / 64 : 65536 / 64] = {};
 };
 
-/// The first of [p, end) that is in a set or, if !isMember, isn't; end if there is none. The bits are made
-/// only after so many units in vain that they may be worth it.
+/// Returns the first of [p, end) that is in a set or, if !isMember, isn't; end if there is none. The bits are
+/// made only after enough units to be worth it.
 template <class It, class T> It FindInSet(It p, It end, const T* y1, const T* y2, bool isMember) {
   const ssize_t near = 8 + ssize_t(sizeof(UnitBits<T>) / 8 / (std::size_t(y2 - y1) + 1));
   for (const It stop = end - p < near ? end : p + near; p != stop; ++p)

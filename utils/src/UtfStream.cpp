@@ -13,8 +13,8 @@ template <class CharOut, class CharIn> bool UtfStream<CharOut, CharIn>::HasStopp
   return m_onMalformed == OnMalformed::kStop && m_malformed.reason != MalformedReason::kNone;
 }
 
-/// Converts units that begin where a sequence does, and sees which of them is the first that is malformed.
-/// The reason may be a unit behind them, up to end.
+/// Converts pn units, which begin at the beginning of a sequence, and notes the first malformed sequence. Its
+/// reason may depend on units behind them, up to end.
 template <class CharOut, class CharIn>
 void UtfStream<CharOut, CharIn>::Convert(basic_xstring<CharOut>& dst, const CharIn* p, ssize_t pn,
                                          const CharIn* end) {
@@ -28,9 +28,9 @@ void UtfStream<CharOut, CharIn>::Convert(basic_xstring<CharOut>& dst, const Char
   m_converted = HasStopped() ? m_malformed.offset : m_converted + pn;
 }
 
-/// Adds to the units that were kept until they are a sequence or can't become one, and converts them. They
-/// can begin one, so a unit that doesn't go on with it isn't part of a malformed one either.
-/// @return how many of the units were taken
+/// Adds units to those that were kept, until they are a sequence or can't become one, and converts them. A
+/// unit that doesn't continue the sequence isn't part of the malformed one either.
+/// @return how many of the pn units were taken
 template <class CharOut, class CharIn>
 ssize_t UtfStream<CharOut, CharIn>::CompletePending(basic_xstring<CharOut>& dst, const CharIn* p,
                                                     ssize_t pn) {

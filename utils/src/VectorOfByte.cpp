@@ -12,8 +12,7 @@ namespace {
 
 constexpr ssize_t kMaxBytes = std::numeric_limits<ssize_t>::max();
 
-// The C library's functions may not be given null pointers, which empty ranges may consist of, even for no
-// bytes.
+// An empty range may consist of null pointers, which the C library's functions don't take even for no bytes.
 
 void CopyBytes(uint8* dst, const uint8* src, ssize_t n) {
   if (n != 0)
@@ -35,8 +34,8 @@ void FillBytes(uint8* dst, ssize_t n, uint8 x) {
 void detail::AllocationFailed() { throw std::bad_alloc(); }
 
 /// This is where growth is decided, for all edits: the new size plus the old capacity. The capacity at least
-/// doubles, so a run of edits moves each byte a constant number of times on average; a first request is
-/// granted exactly.
+/// doubles, so a series of edits moves each byte a constant number of times on average. The first request
+/// gets exactly what it asks for.
 ssize_t VectorOfByte::GrownCapacity(ssize_t capacity, std::size_t n) {
   if (n > std::size_t(kMaxBytes))
     throw std::bad_alloc();
@@ -64,7 +63,7 @@ VectorOfByte& VectorOfByte::operator=(const VectorOfByte& r) {
   return *this;
 }
 
-/// Makes a buffer n bytes large and returns where it is now; it is untouched when that throws.
+/// Changes a buffer's size to n bytes and returns its new address. If it throws, the buffer is untouched.
 uint8* VectorOfByte::Reallocate(value_type* buffer, ssize_t n) {
   void* const moved = std::realloc(buffer, static_cast<std::size_t>(n));
   if (moved == nullptr)

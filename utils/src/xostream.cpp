@@ -13,15 +13,15 @@
 
 namespace mirel {
 
-namespace detail { // and not a namespace without a name, whose types g++ takes in unity builds for a header's
+namespace detail { // not an unnamed namespace: g++ warns of a member of such a type in unity builds
 
-/// Gathers text in a block, with the indent between a newline and the next byte, so that the sink is called
-/// seldom. A long line goes to the sink from where it stands.
+/// Buffers text in a block, so that the sink is called seldom, and adds the indent between a newline and the
+/// next byte. A line as long as the block goes to the sink without being copied.
 class IndentingBuffer : public std::streambuf {
 public:
   explicit IndentingBuffer(IOutputStream& os) : sink(&os) {}
 
-  /// Hands what has been gathered to the sink: the end of every member that writes.
+  /// Writes the block to the sink. Every member that writes ends with it.
   void Deliver() { HandOver(block, filled); }
 
   IOutputStream* sink; ///< null once closed
@@ -94,8 +94,8 @@ private:
 
   static ssize_t After(const char* p, ssize_t n) { return p[n - 1] == '\n' ? 0 : kInLine; }
 
-  /// Bytes that the sink throws at count as not written: the next ones get the part of the indent that is
-  /// still missing. The bytes themselves are dropped, because the caller learns of them from the exception.
+  /// If the sink throws, its bytes count as not written: the next ones get the part of the indent that is
+  /// still missing. The bytes themselves are dropped, because the exception tells the caller of them.
   void HandOver(const char* p, ssize_t n) {
     const ssize_t after = std::exchange(gathered, written);
     filled = 0;
@@ -106,15 +106,15 @@ private:
 
   char block[kBlockSize];
   ssize_t filled = 0;
-  ssize_t written = kInLine;  ///< spaces of the line's indent that the sink has; kInLine behind the indent
-  ssize_t gathered = kInLine; ///< the same number after the bytes in the block
+  ssize_t written = kInLine;  ///< how much of the line's indent the sink has; kInLine after the indent
+  ssize_t gathered = kInLine; ///< how much of it there is once the block is written
 };
 
 } // namespace detail
 
 namespace {
 
-/// The standard streams count in 32 bits where pointers have so many: the nearest count that they can hold.
+/// Clamps x to what the standard library's std::streamsize holds, which on 32-bit processors has 32 bits.
 std::streamsize ForStandard(streamsize x) {
   using Limits = std::numeric_limits<std::streamsize>;
   return static_cast<std::streamsize>(std::clamp<streamsize>(x, Limits::min(), Limits::max()));
@@ -153,7 +153,8 @@ public:
     buffer.Deliver();
   }
 
-  /// Numbers and addresses. A long one may have failed in the middle last time, which the stream remembers.
+  /// Writes a number or an address. It clears the state first: a sink that threw in the middle of the last
+  /// one has left badbit.
   template <class X> void Put(X x) {
     clear();
     *this << x;
