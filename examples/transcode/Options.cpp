@@ -12,33 +12,32 @@ const char kUsage[] = "Usage: transcode [--from ENC] [--to ENC] [-o OUT] [--repo
                       "                 [--bom HOW] [--line-endings ENDS] [--quiet] [FILE...]\n"
                       "       transcode --check [--from ENC] [--quiet] [FILE...]\n"
                       "       transcode --list | --help | --version\n";
-const char kHelp[] = "Converts text from one encoding to another, of any length in little memory.\n"
+const char kHelp[] = "Converts text of any length from one encoding to another, in little memory.\n"
                      "\n"
                      "  -f, --from ENC           encoding of the input, utf-8 by default\n"
                      "  -t, --to ENC             encoding of the output, utf-8 by default\n"
                      "  -l, --list               print the encodings, each with its other names\n"
                      "  -o, --output OUT         write to the file OUT instead of standard output\n"
-                     "  -r, --report             print what is in the text instead of the text;\n"
+                     "  -r, --report             print a report on the text instead of the text;\n"
                      "                           with -o, both\n"
-                     "  -R, --replace            replace malformed text by U+FFFD, and by ? what the\n"
-                     "                           output's encoding lacks; say how much there was\n"
-                     "  -c, --drop               leave it out instead, and say how much there was\n"
-                     "  -C, --check              write nothing: only say whether the input is\n"
+                     "  -R, --replace            replace malformed text by U+FFFD, and characters that\n"
+                     "                           the output's encoding lacks by ?; say how many\n"
+                     "  -c, --drop               leave them out instead, and say how many\n"
+                     "  -C, --check              write nothing, only check whether the input is\n"
                      "                           well-formed\n"
                      "      --bom HOW            keep, strip or add the byte order mark; by default\n"
                      "                           utf-16 and utf-32 have one in the output and lose\n"
-                     "                           it in the input, and others keep it\n"
+                     "                           it in the input, and other encodings keep it\n"
                      "      --line-endings ENDS  end each line with lf or crlf\n"
                      "  -q, --quiet              show no progress on the terminal\n"
                      "  -h, --help               print this help\n"
                      "  -V, --version            print the version\n"
                      "\n"
                      "Without FILE, or with - for FILE or OUT, the standard streams are used. The\n"
-                     "text of several files is written one behind the other. When the input is\n"
-                     "malformed, or has a character that the output's encoding lacks, the first fault\n"
-                     "and its place are named and the exit code is 1; 2 tells of wrong usage. A file\n"
-                     "OUT then stays as it was, but what goes to standard output or a device has been\n"
-                     "written up to the fault.\n";
+                     "text of several files is joined. If the input is malformed, or has a character\n"
+                     "that the output's encoding lacks, the program names the first fault and its\n"
+                     "place and exits with 1; wrong usage exits with 2. A file OUT then stays as it\n"
+                     "was, but standard output or a device has got the text up to the fault.\n";
 
 namespace {
 
@@ -53,7 +52,7 @@ constexpr option kOptions[] = {
     {"quiet", no_argument, nullptr, 'q'},      {"help", no_argument, nullptr, 'h'},
     {"version", no_argument, nullptr, 'V'},    {nullptr, 0, nullptr, 0}};
 
-/// What is known of the options before it is seen whether they go together.
+/// The options as they are read, before it is checked whether they go together.
 struct Parsed {
   Options options;
   bool replace = false;
@@ -117,7 +116,7 @@ void ParseOption(Parsed& parsed, int option) {
   }
 }
 
-/// A mark is what utf-16 and utf-32 tell the byte order by, and no text; elsewhere it is.
+/// The default of --bom. The mark tells the byte order in utf-16 and utf-32; in other encodings it is text.
 Mark UsualMark(const Encoding& from, const Encoding& to) {
   if (to.IsByMark())
     return Mark::kAdd;

@@ -23,7 +23,7 @@ constexpr int kExitUsage = 2;
 
 void Print(std::string_view text) { Output("-").Write(text); }
 
-/// Does what is asked for. @return whether all is well
+/// Does what the options ask for. @return whether all is well
 bool Run(const Options& options) {
   if (options.help) {
     Print(std::string(kUsage) + kHelp);
@@ -43,7 +43,7 @@ bool Run(const Options& options) {
 } // namespace
 
 int Main(int argc, char** argv) {
-  static char name[] = "transcode"; // which the parser's messages begin with, instead of a path
+  static char name[] = "transcode"; // the parser's messages begin with it instead of a path
   if (argc > 0)
     argv[0] = name;
   HoldClosedStreams();
