@@ -15,6 +15,7 @@ PRELUDE = """
 #include <iostream>
 #include <iterator>
 #include <string>
+#include <utils/xostream.h>
 #include <utils/xstring.h>
 using namespace mirel;
 enum class E { e };
@@ -29,8 +30,8 @@ std::basic_ostream<C, Traits>& operator<<(std::basic_ostream<C, Traits>&, const 
 inline bool Use(const string8& s) { return s + "x" == s && s < s && s == "x" && std::cout << s << s + s; }
 }
 """
-CALL = """void F(string8& s, string8& t, const string8& cs, string16& w, xvector<char8>& v, VectorOfByte& b, int n) {
-  [[maybe_unused]] double doubles[9]; (void)s, (void)t, (void)cs, (void)w, (void)v, (void)b, (void)n;
+CALL = """void F(string8& s, string8& t, const string8& cs, string16& w, xvector<char8>& v, VectorOfByte& b, xostream& os, int n) {
+  [[maybe_unused]] double doubles[9]; (void)s, (void)t, (void)cs, (void)w, (void)v, (void)b, (void)os, (void)n;
   (void)(%s);
 }
 """

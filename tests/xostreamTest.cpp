@@ -50,7 +50,8 @@ TEST(XOStream, FormatsValues) {
   EXPECT_EQ(put(uint8_t('e')) + put(uint16_t(1)) + put(2u) + put(3ul) + put(-4ll), "e123-4");
   EXPECT_EQ(os.precision(3) + os.precision(), 9);
   EXPECT_EQ(put(3.14159) + put(2.5f) + put(1e30L), "3.142.51e+30");
-  EXPECT_EQ(put("text") + put("text", 2) + put(reinterpret_cast<const void*>(0x1A)), "textte0x1a");
+  EXPECT_EQ(put(u8'x') + put(u8"text") + put("text", 2) + put(reinterpret_cast<const void*>(0x1A)),
+            "xtextte0x1a");
   EXPECT_EQ(put(L'\u00E9') + put(u'\u20AC') + put(U'\U0001F600'), "\u00E9\u20AC\U0001F600");
   EXPECT_EQ(put(L'\uFFFF') + put(u'\uFFFF') + put(U'\uFFFF'), "\uFFFF\uFFFF\uFFFF");
   for (const char32_t c : {0xD800u, 0x110000u, 0x4010000u, 0xFFFFFFFFu})

@@ -7,6 +7,7 @@
 #pragma once
 
 #include <cstddef>
+#include <type_traits>
 
 #include "StreamInterfaces.h"
 #include "xchar.h"
@@ -17,6 +18,17 @@ namespace mirel {
 typedef int64 streamsize;
 
 class IndentingOutputStreamToOStream;
+
+namespace detail {
+
+/// What put() of a pointer to other characters returns, as the compiler names it.
+struct ConvertToCharsOrVoidPointer {};
+
+/// The characters that aren't printed by a pointer to them, and those of string16.
+template <class C, class... Others>
+using IfOneOf = std::enable_if_t<(std::is_same_v<std::remove_cv_t<C>, Others> || ...), int>;
+
+} // namespace detail
 
 /// Writes text to an IOutputStream, which must outlive it. Bad arguments stop the process with the text given
 /// after "@pre", before anything is written. One thread at a time may use a stream.
@@ -84,9 +96,13 @@ public:
   void put(float x);              ///< A number of precision() significant digits.
   void put(double x);             ///< A number of precision() significant digits.
   void put(long double x);        ///< A number of precision() significant digits.
-  void put(const void* x);        ///< An address, in hexadecimal.
+  void put(const void* x);        ///< An address, in hexadecimal; that of characters doesn't compile.
   /// Writes a null-terminated string. @pre "x"
   void put(ConstString8Z x);
+#ifdef __cpp_char8_t
+  void put(char8_t x) { put(static_cast<char>(x)); }                     ///< One byte.
+  void put(const char8_t* x) { put(reinterpret_cast<const char8*>(x)); } ///< As of the same chars.
+#endif
   /// A counted run. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void put(const char8* p, ssize_t pn);
   /// A counted run, padded to the given width in place of width().
@@ -95,6 +111,10 @@ public:
   /// Calls the manipulator with this stream, which it returns.
   xostream& operator<<(Manipulator manipulator) { return manipulator(*this); }
   xostream& operator<<(std::nullptr_t) = delete; // a literal 0 is no manipulator
+  /// @cond
+  template <class C, detail::IfOneOf<C, signed char, unsigned char, wchar_t, char16_t, char32_t, char16> = 0>
+  detail::ConvertToCharsOrVoidPointer put(C*) = delete;
+  /// @endcond
 
   /// @}
   /// @name Line ends, flushing
