@@ -215,6 +215,7 @@ TYPED_TEST(Precondition, OfRanges) {
   isNull(+null, q), isNull(+nullInt, ints.data()), isNull(const_cast<T*>(null), s.end());
   isNull(std::reverse_iterator<const T*>(q), std::reverse_iterator<const T*>(null));
   isNull(typename S::const_reverse_iterator(q), typename S::const_reverse_iterator(null));
+  isNull(std::make_move_iterator(std::string::const_iterator()), std::make_move_iterator(text.end()));
   ExpectRangeStops(s, ints.begin(), ints.end(), "Fits<T>(*r1)", nullptr);
   const std::list<short> negative(1, -1);
   if (sizeof(T) == 1)

@@ -163,6 +163,16 @@ TYPED_TEST(Range, InTheStringItselfIsTakenAsItWas) {
   EXPECT_EQ(Std(s), Std(Of<T>("dcbdcbadd")));
 }
 
+TEST(RangeTest, UnitsWrittenAsAnotherTypeAreSeen) { // compilers take them for other memory
+  const auto s = Of<char16>("abc");
+  char16_t units[2];
+  for (const int i : {0, 1}) {
+    units[0] = static_cast<char16_t>('a' + i), units[1] = static_cast<char16_t>('b' + i);
+    EXPECT_TRUE(s.contains(units, units + 2, i));
+    EXPECT_EQ(s.rfind(units, units + 2), i);
+  }
+}
+
 TYPED_TEST(Range, ElementsThatDontFitAreNowhere) {
   const auto s = Of<TypeParam>("a\xFF");
   const int high = sizeof(TypeParam) == 1 ? 0x161 : 0x10061;

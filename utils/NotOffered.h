@@ -51,6 +51,7 @@ struct ConvertToUtf8First {};
 struct IncludeStdOrWrite_Eq {};
 struct IncludeStdOrWrite_Lt {};
 struct IncludeStdOrWriteCStr {};
+struct ReverseIteratorsOnlyStep {};
 struct WriteAssignOfOneUnit {};
 struct WriteEraseElement {};
 struct WriteNullptr {};

@@ -3,17 +3,17 @@
 /// elements count as.
 ///
 /// @par Units of other types
-/// A range may be of any iterators over integers or enumerators. Each counts by its unsigned value, on every
-/// processor: the byte E9 is the unit 00E9 of a string16, whether plain char has a sign or not. What is
-/// stored must fit the vector's units, or nothing is changed. What is searched for may be any value, and one
-/// that doesn't fit is equal to nothing.
+/// A range may be of any iterators over integers or enumerators, and of nothing that converts to them. Each
+/// counts by its unsigned value, on every processor: the byte E9 is the unit 00E9 of a string16, whether
+/// plain char has a sign or not. What is stored must fit the vector's units, or nothing is changed. What is
+/// searched for may be any value, and one that doesn't fit is equal to nothing.
 /// @pre "Fits<T>(*r1)" of each element that is stored
 ///
 /// @par Cost
 /// Pointers to elements of the vector's width, and the iterators of standard strings, string views and
 /// vectors of them, are as fast as `const T*`; from C++20 on so is every contiguous iterator. An edit by
-/// other iterators copies their elements first, with one allocation if they are at least forward iterators. A
-/// search allocates nothing.
+/// other iterators copies their elements first, with one allocation if they are at least forward iterators;
+/// those that aren't random-access ones are walked twice for it. A search allocates nothing.
 ///
 /// This header knows iterators and the byte buffer, no containers.
 
@@ -70,21 +70,24 @@ constexpr bool kIsContiguous = std::is_pointer_v<It> || kIsIteratorOf<It, std::v
     ;
 #endif
 
+/// Whether elements of type V are numbers, which have unsigned values.
+template <class V> constexpr bool kIsNumber = std::is_integral_v<V> || std::is_enum_v<V>;
 /// Whether elements of type V are units of the width of T, and so can be copied as bytes.
 template <class T, class V>
-constexpr bool kIsUnit = (std::is_integral_v<V> || std::is_enum_v<V>)&&!std::is_same_v<V, bool> &&
-                         sizeof(V) == sizeof(T);
+constexpr bool kIsUnit = kIsNumber<V> && !std::is_same_v<V, bool> && sizeof(V) == sizeof(T);
+
+/// Whether what * gives must be read one by one.
+template <class It>
+constexpr bool kIsVolatile =
+    std::is_volatile_v<std::remove_reference_t<typename std::iterator_traits<It>::reference>>;
 
 /// Whether iterators stand for pointers to units of the width of T. Asks for the containers of such only.
 template <class T, class It> constexpr bool StandsForPointer() { // the compiler decides
-  if constexpr (!kIsUnit<T, ValueType<It>> || std::is_volatile_v<std::remove_pointer_t<It>>)
+  if constexpr (!kIsUnit<T, ValueType<It>> || kIsVolatile<It>)
     return false;
   else
     return kIsContiguous<It>;
 }
-
-/// The return type of what reverse iterators don't offer, as the compiler names it.
-struct ReverseIteratorsOnlyStep {};
 
 /// What reverse iterators are made from. They convert to the pointers that they hold, for which there is
 /// arithmetic with the opposite meaning: it is refused here.
@@ -119,53 +122,68 @@ template <class It> constexpr bool IsRange(const It& r1, const It& r2) {
     return true;
 }
 
-/// False for pointers of which only the first in memory is null.
+/// Whether an iterator is a null pointer, or stands for one, as it does when nothing has been assigned to it.
+template <class It> constexpr bool IsNull([[maybe_unused]] const It& it) {
+  if constexpr (std::is_pointer_v<It>) {
+    return it == nullptr;
+  } else if constexpr (kIsNumber<ValueType<It>>) { // the compiler decides
+#if __cpp_lib_to_address >= 201711L
+    if constexpr (kIsContiguous<It>) // the compiler decides
+      return std::to_address(it) == nullptr;
+#elif !defined _GLIBCXX_DEBUG
+    // With it, iterators don't compare with those of no container; it finds these by itself.
+    if constexpr (kIsContiguous<It>) // the compiler decides
+      return it == It();
+#endif
+  }
+  return false;
+}
+
+template <class It>
+constexpr bool IsInMemory(const std::reverse_iterator<It>&, const std::reverse_iterator<It>&);
+template <class It> constexpr bool IsInMemory(const std::move_iterator<It>&, const std::move_iterator<It>&);
+
+/// False for pointers, and what stands for them, of which only the first in memory is null.
 template <class It> constexpr bool IsInMemory(const It& r1, const It& r2) {
   if constexpr (std::is_base_of_v<ReversePointer, It>)
     return IsInMemory(Held(r2), Held(r1));
-  else if constexpr (std::is_pointer_v<It>)
-    return r1 == r2 || r1 != nullptr;
   else
-    return true;
+    return !IsNull(r1) || r1 == r2;
 }
 template <class It>
 constexpr bool IsInMemory(const std::reverse_iterator<It>& r1, const std::reverse_iterator<It>& r2) {
   return IsInMemory(r2.base(), r1.base());
 }
+template <class It>
+constexpr bool IsInMemory(const std::move_iterator<It>& r1, const std::move_iterator<It>& r2) {
+  return IsInMemory(r1.base(), r2.base());
+}
 
-/// The unsigned value of an element of a range for a vector of T. What is no integer is one once it is a T.
-template <class T, class V, class X> constexpr auto SourceValue(const X& x) {
-  static_assert(!std::is_floating_point_v<V>, "code units are integers: convert the numbers first");
-  if constexpr (std::is_integral_v<V> || std::is_enum_v<V>) // the compiler decides
+/// The unsigned value of an element of a range.
+template <class V, class X> constexpr auto SourceValue(const X& x) {
+  static_assert(kIsNumber<V>, "code units are integers or enumerators: convert the elements first");
+  if constexpr (kIsNumber<V>) // the compiler decides
     return UnsignedValue(static_cast<V>(x));
   else
-    return UnsignedValue(static_cast<T>(x));
+    return 0u;
 }
 
 template <class T, class N> constexpr bool Fits(N value) {
   return value <= std::numeric_limits<std::make_unsigned_t<T>>::max();
 }
 
-/// Units that stand one behind the other somewhere. They may be of another type, which the library's code
-/// never sees but compilers do where it is inlined: for these all that the program has written is in memory
-/// when the constructor is done, and stays there up to the destructor.
-template <class T, class V> class UnitSpan {
+/// Units that stand one behind the other somewhere. The program may have written them as another type, which
+/// compilers take for other memory: so they are read by functions of the C library and of this one, or by
+/// CopyOf(), and never by a mere `*`.
+template <class T> class UnitSpan {
 public:
-  UnitSpan(const V* p, ssize_t n) : m_p(reinterpret_cast<const T*>(p)), m_size(n) { Settle(); }
-  UnitSpan(const UnitSpan&) = delete;
-  UnitSpan& operator=(const UnitSpan&) = delete;
-  ~UnitSpan() { Settle(); }
+  template <class V> UnitSpan(const V* p, ssize_t n) : m_p(reinterpret_cast<const T*>(p)), m_size(n) {}
 
   const T* begin() const { return m_p; }
   const T* end() const { return m_p + m_size; }
   ssize_t size() const { return m_size; }
 
 private:
-  void Settle() {
-    if constexpr (sizeof(T) > 1 && !std::is_same_v<T, V>) // the compiler decides
-      __asm__ volatile("" : "+r"(m_p) : : "memory");
-  }
-
   const T* m_p;
   ssize_t m_size;
 };
@@ -177,7 +195,7 @@ public:
     if constexpr (kIsForward<It>)
       Reserve(Length(r1, r2));
     for (; r1 != r2; ++r1) {
-      const auto value = SourceValue<T, ValueType<It>>(*r1);
+      const auto value = SourceValue<ValueType<It>>(*r1);
       MIREL_ASSERT_AS(Fits<T>(value), "Fits<T>(*r1)");
       m_units.push_back(static_cast<T>(value));
     }
@@ -207,19 +225,19 @@ private:
 };
 
 /// An iterator over the unsigned values of a range, of the same category up to random access.
-template <class T, class It> class ValueIterator {
+template <class It> class ValueIterator {
 public:
   typedef std::conditional_t<
       kIsRandomAccess<It>, std::random_access_iterator_tag,
       std::conditional_t<kIsForward<It>, std::forward_iterator_tag, std::input_iterator_tag>>
       iterator_category;
-  typedef decltype(SourceValue<T, ValueType<It>>(*std::declval<It&>())) value_type;
+  typedef decltype(SourceValue<ValueType<It>>(*std::declval<It&>())) value_type;
   typedef ssize_t difference_type;
   typedef const value_type* pointer;
   typedef value_type reference;
 
   explicit ValueIterator(It it) : m_it(it) {}
-  value_type operator*() const { return SourceValue<T, ValueType<It>>(*m_it); }
+  value_type operator*() const { return SourceValue<ValueType<It>>(*m_it); }
   value_type operator[](ssize_t i) const { return *(*this + i); }
   ValueIterator& operator++() {
     ++m_it;
@@ -241,18 +259,18 @@ private:
   It m_it;
 };
 
-template <class T, class It> class ValueRange {
+template <class It> class ValueRange {
 public:
   ValueRange(It r1, It r2) : m_begin(r1), m_end(r2) {}
-  ValueIterator<T, It> begin() const { return m_begin; }
-  ValueIterator<T, It> end() const { return m_end; }
+  ValueIterator<It> begin() const { return m_begin; }
+  ValueIterator<It> end() const { return m_end; }
 
 private:
-  ValueIterator<T, It> m_begin, m_end;
+  ValueIterator<It> m_begin, m_end;
 };
 
 /// The units of [r1, r2), which stand for pointers. The end of a range may not be dereferenced.
-template <class T, class It> UnitSpan<T, ValueType<It>> Span(It r1, It r2) {
+template <class T, class It> UnitSpan<T> Span(It r1, It r2) {
   if constexpr (std::is_pointer_v<It>)
     return {r1, r2 - r1};
   else
@@ -278,7 +296,7 @@ template <class T, class It> auto Needle(It r1, It r2) {
   if constexpr (StandsForPointer<T, It>())
     return Span<T>(r1, r2);
   else
-    return ValueRange<T, It>(r1, r2);
+    return ValueRange<It>(r1, r2);
 }
 
 } // namespace detail

@@ -212,6 +212,13 @@ template <class T> const T* FindLastByFour(const T* i1, const T* i2, T v) {
   return i2;
 }
 
+/// The unit at p, which the program may have written as another type (utils/Ranges.h).
+template <class T> T CopyOf(const T* p) {
+  T unit;
+  std::memcpy(&unit, p, sizeof(T));
+  return unit;
+}
+
 template <class T>
 using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T, char16>, int>;
 
@@ -221,6 +228,10 @@ using IfCodeUnit = std::enable_if_t<std::is_same_v<T, char8> || std::is_same_v<T
 // above, so the reference leaves them out.
 /// @cond
 
+template <class T, detail::IfCodeUnit<T> = 0>
+bool IsPrefix(const T* x1, const T* x2, const T* y1, const T* y2) {
+  return y1 == y2 || (y2 - y1 <= x2 - x1 && *x1 == detail::CopyOf(y1) && IsEqual(y1, y2, x1));
+}
 template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T* i2, const T& v) {
   if constexpr (sizeof(T) == 1) {
     // The C library is as fast. Even for no bytes memchr may not be given null pointers.
@@ -241,11 +252,11 @@ const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2
   if (!detail::IsShort(x1, x2)) {
     const ssize_t length = y2 - y1;
     if (sizeof(T) == 1 && x2 - x1 >= length) // where the first byte is rare, memchr is all that it takes
-      x1 = Find(x1, x2 - (length - 1), *y1);
+      x1 = Find(x1, x2 - (length - 1), detail::CopyOf(y1));
     return x2 - x1 < length ? x2 : detail::BestSearches(x1).findFirstSubSequence(x1, x2, y1, y2);
   }
   for (const T* p = x1; x2 - p >= y2 - y1; ++p)
-    if (*p == *y1 && IsEqual(y1, y2, p))
+    if (*p == detail::CopyOf(y1) && IsEqual(y1, y2, p))
       return p;
   return x2;
 }
@@ -256,7 +267,7 @@ const T* FindLastSubSequence(const T* x1, const T* x2, const T* y1, const T* y2)
   if (!detail::IsShort(x1, x2))
     return detail::BestSearches(x1).findLastSubSequence(x1, x2, y1, y2);
   for (ssize_t i = (x2 - x1) - (y2 - y1); i >= 0; --i)
-    if (x1[i] == *y1 && IsEqual(y1, y2, x1 + i))
+    if (x1[i] == detail::CopyOf(y1) && IsEqual(y1, y2, x1 + i))
       return x1 + i;
   return x2;
 }
@@ -428,7 +439,9 @@ public:
   template <class T> void push_back(const T& x) {
     static_assert(std::is_arithmetic_v<T> || std::is_enum_v<T>,
                   "push_back appends one number: write += for a buffer, and push_back(r1, r2) for bytes");
-    const T value = x; // x may lie in the storage that reserve() is about to give up
+    static_assert(!std::is_same_v<std::remove_cv_t<T>, long double>,
+                  "a long double has bytes of no particular value: append it as a double");
+    const std::remove_volatile_t<T> value = x; // x may lie in the storage that reserve() is about to give up
     const std::size_t n = std::size_t(size_) + sizeof(T); // unsigned, where it can't overflow
     if (std::size_t(m_capacity) < n) {
       const ssize_t capacity = GrownCapacity(m_capacity, n);
