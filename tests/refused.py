@@ -32,8 +32,8 @@ inline bool Use(const string8& s) { return s + "x" == s && s < s && s == "x" && 
 }
 """
 CALL = """void F(string8& s, string8& t, const string8& cs, string16& w, xvector<char8>& v, VectorOfByte& b, xostream& os, int n) {
-  [[maybe_unused]] double doubles[9]; [[maybe_unused]] Wrapped wrapped[1]; volatile char bit = 1; (void)bit;
-  (void)s, (void)t, (void)cs, (void)w, (void)v, (void)b, (void)os, (void)n;
+  [[maybe_unused]] double doubles[9]; Wrapped wrapped[1]; volatile char bit = 1;
+  (void)s, (void)t, (void)cs, (void)w, (void)v, (void)b, (void)os, (void)n, (void)wrapped, (void)bit;
   (void)(%s);
 }
 """
@@ -43,23 +43,17 @@ def main():
     source, work, *compiler = sys.argv[1:]
     work = pathlib.Path(work)
     work.mkdir(exist_ok=True)
-    compiler += ["-std=c++17", "-I", source, "-x"]
+    compiler += ["-std=c++17", "-O1", "-I", source, "-x"]
     prelude = work / "prelude.h"
     prelude.write_text(PRELUDE)
-
-    def compile(include, call, level):
-        return subprocess.run([*compiler, "c++", level, "-include", work / level / "prelude.h", "-S", "-o", "/dev/null", "-"],
-                              input=include + CALL % call, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True)
+    subprocess.run([*compiler, "c++-header", prelude, "-o", work / "prelude.h.gch"], check=True)
 
     def check(expected, include, call):
-        result = compile(include, call, "-O0" if expected.endswith("-O0") else "-O1")
-        good = result.returncode == 0 if expected.startswith("compiles") else expected in result.stdout
+        result = subprocess.run([*compiler, "c++", "-include", prelude, "-S", "-o", "/dev/null", "-"],
+                                input=include + CALL % call, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True)
+        good = result.returncode == 0 if expected == "compiles" else expected in result.stdout
         return "" if good else f"{call}: not '{expected}':\n{result.stdout}\n"
 
-    for level in ("-O0", "-O1"):
-        (work / level).mkdir(exist_ok=True)
-        (work / level / "prelude.h").write_text(PRELUDE)
-        subprocess.run([*compiler, "c++-header", level, work / level / "prelude.h", "-o", work / level / "prelude.h.gch"], check=True)
     calls, expected, include = [], None, ""
     for line in (pathlib.Path(source) / "tests" / "refused.txt").read_text().splitlines():
         if line.startswith("["):

@@ -49,16 +49,26 @@ template <class T, class N> constexpr bool HasBitsFor(N x) {
   }
 }
 
-/// Isn't defined: a call that is left in a program doesn't compile.
-void ConstantDoesNotFit()
-    __attribute__((error("this constant has more bits than the code unit or count that it is passed as")));
+#define MIREL_CUT                                                                                            \
+  "this constant has more bits than the code unit that it is passed as: cast it if that is meant"
 
-/// Refuses a constant that has too many bits, as soon as the compiler optimises and so knows it. Nothing is
-/// checked at run time.
-template <class T, class N> [[gnu::always_inline]] inline void RefuseConstant([[maybe_unused]] N x) {
+#ifdef __clang__
+// MIREL_FITS does this, and better: clang knows what is a constant in the source.
+template <class T, bool kStored, class N> constexpr void CheckConstant(N) {}
+#else
+/// Isn't defined: a call that is left in a program doesn't compile.
+void ConstantDoesNotFit() __attribute__((error(MIREL_CUT)));
+/// Stays in the program where it is called, so that the compiler warns of it.
+__attribute__((noipa, warning(MIREL_CUT))) inline void ConstantIsCut() {}
+
+/// Refuses a constant that has too many bits where it is stored, and warns of it where it is searched for, as
+/// soon as the compiler optimises and so knows it. Nothing is checked at run time. The compiler also takes a
+/// variable for a constant where it knows the value, as in `if (n == 256)`: a search for that is no mistake.
+template <class T, bool kStored, class N>
+[[gnu::always_inline]] inline void CheckConstant([[maybe_unused]] N x) {
 #ifdef __OPTIMIZE__
-  if (__builtin_constant_p(x) && !HasBitsFor<T>(x)) // the compiler decides
-    ConstantDoesNotFit();                           // the compiler decides
+  if (__builtin_constant_p(x) && !HasBitsFor<T>(x))   // the compiler decides
+    kStored ? ConstantDoesNotFit() : ConstantIsCut(); // the compiler decides
 #endif
 }
 
@@ -66,6 +76,7 @@ template <class T, class N> [[gnu::always_inline]] inline void RefuseConstant([[
 template <class N> constexpr ssize_t Saturated(N n) {
   if constexpr (sizeof(N) > sizeof(ssize_t)) { // the compiler decides
     using Limits = std::numeric_limits<ssize_t>;
+#endif
     return n < Limits::min() ? Limits::min() : n > Limits::max() ? Limits::max() : static_cast<ssize_t>(n);
   } else {
     return static_cast<ssize_t>(n);
@@ -73,8 +84,7 @@ template <class N> constexpr ssize_t Saturated(N n) {
 }
 
 /// An argument as a count or an index. One of more bits must not become one that is allowed.
-template <class N> [[gnu::always_inline]] inline ssize_t Count(N n) {
-  RefuseConstant<ssize_t>(n);
+template <class N> constexpr ssize_t Count(N n) {
   if constexpr (sizeof(N) == sizeof(int64))
     return Saturated(static_cast<int64>(n));
   else
@@ -83,7 +93,7 @@ template <class N> [[gnu::always_inline]] inline ssize_t Count(N n) {
 
 /// An argument as a code unit, by its unsigned value: the char E9 is the char16 00E9 on every processor.
 template <class T, class X> [[gnu::always_inline]] inline T Unit(X x) {
-  RefuseConstant<T>(x);
+  CheckConstant<T, true>(x);
   return static_cast<T>(UnsignedValue(x));
 }
 
@@ -92,9 +102,21 @@ template <class T, class X> [[gnu::always_inline]] inline T Unit(X x) {
 template <class T, int kMore, class X> [[gnu::always_inline]] inline T UnitToFind(X x) {
   static_assert(kMore <= 1,
                 "an empty needle is (nullptr, offset, 0): a literal 0 is a unit, never a pointer");
-  return Unit<T>(x);
+  CheckConstant<T, false>(x);
+  return static_cast<T>(UnsignedValue(x));
 }
 
 } // namespace detail
 
 } // namespace mirel
+
+/// Behind the parameters of an overload that takes a code unit x: refuses a constant that has too many bits.
+/// Clang's own way, which looks at the source, at any level of optimisation.
+#ifdef __clang__
+#define MIREL_FITS(T, x)                                                                                     \
+  _Pragma("clang diagnostic push") _Pragma("clang diagnostic ignored \"-Wgcc-compat\"")                      \
+      __attribute__((diagnose_if(!::mirel::detail::HasBitsFor<T>(x), MIREL_CUT, "error")))                   \
+      _Pragma("clang diagnostic pop")
+#else
+#define MIREL_FITS(T, x)
+#endif

@@ -537,20 +537,23 @@ public:
   /// @cond
 
   template <class N, class X, detail::IfIntegers<N, X> = 0>
-  explicit VectorOfByte(N count, X x) : VectorOfByte(detail::Count(count), detail::Unit<value_type>(x)) {}
+  explicit VectorOfByte(N count, X x) MIREL_FITS(value_type, x)
+      : VectorOfByte(detail::Count(count), detail::Unit<value_type>(x)) {}
   template <class N, detail::IfIntegers<N> = 0> void insert(N i, const value_type* r1, const value_type* r2) {
     insert(detail::Count(i), r1, r2);
   }
-  template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
+  template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0>
+  void insert(N i, M count, X x) MIREL_FITS(value_type, x) {
     insert(detail::Count(i), detail::Count(count), detail::Unit<value_type>(x));
   }
-  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(iterator i, N count, X x) {
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  void insert(iterator i, N count, X x) MIREL_FITS(value_type, x) {
     insert(i, detail::Count(count), detail::Unit<value_type>(x));
   }
-  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) {
+  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) MIREL_FITS(value_type, x) {
     insert(detail::Count(i), detail::Unit<value_type>(x));
   }
-  template <class X, detail::IfIntegers<X> = 0> iterator insert(iterator i, X x) {
+  template <class X, detail::IfIntegers<X> = 0> iterator insert(iterator i, X x) MIREL_FITS(value_type, x) {
     return insert(i, detail::Unit<value_type>(x));
   }
   template <class N, class M, detail::IfIntegers<N, M> = 0> void erase(N i, M n) {

@@ -219,7 +219,7 @@ public:
   template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
   basic_xstring(P r, N rn) : Base(static_cast<const T*>(r), detail::Count(rn)) {}
   template <class N, class X, detail::IfIntegers<N, X> = 0>
-  explicit basic_xstring(N count, X x) : Base(detail::Count(count), detail::Unit<T>(x)) {}
+  explicit basic_xstring(N count, X x) MIREL_FITS(T, x) : Base(detail::Count(count), detail::Unit<T>(x)) {}
   /// Takes `s = {}`, which would otherwise be a null pointer.
   basic_xstring<T>& operator=(std::initializer_list<detail::NoUnit>) {
     this->clear();

@@ -27,8 +27,9 @@ namespace mirel {
 /// looked for; `offset` where a search starts; `count` a repeat, fill or substring length. All are in
 /// elements, and signed. An integer of any type may stand for each: a literal 0 is an index, a count or an
 /// element, never a pointer. What a range may be of, and what its elements count as, utils/Ranges.h says; a
-/// single element counts by its unsigned value too, and a constant that doesn't fit is refused by the
-/// compiler where it optimises.
+/// single element counts by its unsigned value too. A constant that doesn't fit is refused by clang, and by
+/// g++ where it optimises, which also knows some variables to be such constants; g++ only warns where it is
+/// searched for.
 ///
 /// @par Bad arguments
 /// stop the process with the text given after "@pre", before anything has changed. They are never clamped. A
@@ -705,34 +706,41 @@ public:
   template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
   xvector(P p, N pn) : xvector(static_cast<const T*>(p), detail::Count(pn)) {}
   template <class N, class X, detail::IfIntegers<N, X> = 0>
-  explicit xvector(N count, X x) : xvector(detail::Count(count), detail::Unit<T>(x)) {}
-  template <class X, detail::IfIntegers<X> = 0> void resize(ssize_t newSize, X x) {
+  explicit xvector(N count, X x) MIREL_FITS(T, x) : xvector(detail::Count(count), detail::Unit<T>(x)) {}
+  template <class X, detail::IfIntegers<X> = 0> void resize(ssize_t newSize, X x) MIREL_FITS(T, x) {
     resize(newSize, detail::Unit<T>(x));
   }
-  template <class N, class X, detail::IfIntegers<N, X> = 0> void assign(N count, X x) {
+  template <class N, class X, detail::IfIntegers<N, X> = 0> void assign(N count, X x) MIREL_FITS(T, x) {
     assign(detail::Count(count), detail::Unit<T>(x));
   }
-  template <class X, detail::IfIntegers<X> = 0> void push_back(X x) { push_back(detail::Unit<T>(x)); }
-  template <class X, detail::IfIntegers<X> = 0> void push_front(X x) { push_front(detail::Unit<T>(x)); }
-  template <class X, detail::IfIntegers<X> = 0> xvector<T>& operator+=(X x) {
+  template <class X, detail::IfIntegers<X> = 0> void push_back(X x) MIREL_FITS(T, x) {
+    push_back(detail::Unit<T>(x));
+  }
+  template <class X, detail::IfIntegers<X> = 0> void push_front(X x) MIREL_FITS(T, x) {
+    push_front(detail::Unit<T>(x));
+  }
+  template <class X, detail::IfIntegers<X> = 0> xvector<T>& operator+=(X x) MIREL_FITS(T, x) {
     return *this += detail::Unit<T>(x);
   }
-  template <class X, detail::IfIntegers<X> = 0> const xvector<T> operator+(X x) const {
+  template <class X, detail::IfIntegers<X> = 0> const xvector<T> operator+(X x) const MIREL_FITS(T, x) {
     return *this + detail::Unit<T>(x);
   }
-  template <class N, class X, detail::IfIntegers<N, X> = 0> xvector<T>& append(N count, X x) {
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  xvector<T>& append(N count, X x) MIREL_FITS(T, x) {
     return append(detail::Count(count), detail::Unit<T>(x));
   }
-  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) {
+  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(N i, X x) MIREL_FITS(T, x) {
     insert(detail::Count(i), detail::Unit<T>(x));
   }
-  template <class X, detail::IfIntegers<X> = 0> iterator insert(iterator i, X x) {
+  template <class X, detail::IfIntegers<X> = 0> iterator insert(iterator i, X x) MIREL_FITS(T, x) {
     return insert(i, detail::Unit<T>(x));
   }
-  template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0> void insert(N i, M count, X x) {
+  template <class N, class M, class X, detail::IfIntegers<N, M, X> = 0>
+  void insert(N i, M count, X x) MIREL_FITS(T, x) {
     insert(detail::Count(i), detail::Count(count), detail::Unit<T>(x));
   }
-  template <class N, class X, detail::IfIntegers<N, X> = 0> void insert(iterator i, N count, X x) {
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  void insert(iterator i, N count, X x) MIREL_FITS(T, x) {
     insert(i, detail::Count(count), detail::Unit<T>(x));
   }
   template <class N, class M, detail::IfIntegers<N, M> = 0> void replace(N i, M n, const xvector<T>& r) {
@@ -742,42 +750,44 @@ public:
     replace(detail::Count(i), detail::Count(n), p, pn);
   }
   template <class N, class M, class K, class X, detail::IfIntegers<N, M, K, X> = 0>
-  void replace(N i, M n, K count, X x) {
+  void replace(N i, M n, K count, X x) MIREL_FITS(T, x) {
     replace(detail::Count(i), detail::Count(n), detail::Count(count), detail::Unit<T>(x));
   }
   template <class N, class X, detail::IfIntegers<N, X> = 0>
-  void replace(iterator i1, iterator i2, N count, X x) {
+  void replace(iterator i1, iterator i2, N count, X x) MIREL_FITS(T, x) {
     replace(i1, i2, detail::Count(count), detail::Unit<T>(x));
   }
   template <class N, class M, detail::IfIntegers<N, M> = 0> void erase(N i, M n) {
     erase(detail::Count(i), detail::Count(n));
   }
-  template <class X, detail::IfIntegers<X> = 0> ssize_t FindAndErase(X x) {
-    return FindAndErase(detail::Unit<T>(x));
+  template <class X, detail::IfIntegers<X> = 0> ssize_t FindAndErase(X x) MIREL_FITS(T, x) {
+    return FindAndErase(detail::UnitToFind<T, 0>(x));
   }
-  template <class X, detail::IfIntegers<X> = 0> ssize_t FindAndEraseFirst(X x) {
-    return FindAndEraseFirst(detail::Unit<T>(x));
+  template <class X, detail::IfIntegers<X> = 0> ssize_t FindAndEraseFirst(X x) MIREL_FITS(T, x) {
+    return FindAndEraseFirst(detail::UnitToFind<T, 0>(x));
   }
-  template <class X, class... N, detail::IfIntegers<X, N...> = 0> ssize_t find(X c, N... offset) const {
+  template <class X, class... N, detail::IfIntegers<X, N...> = 0>
+  ssize_t find(X c, N... offset) const MIREL_FITS(T, c) {
     return find(detail::UnitToFind<T, sizeof...(N)>(c), detail::Count(offset)...);
   }
-  template <class X, class... N, detail::IfIntegers<X, N...> = 0> ssize_t rfind(X c, N... offset) const {
+  template <class X, class... N, detail::IfIntegers<X, N...> = 0>
+  ssize_t rfind(X c, N... offset) const MIREL_FITS(T, c) {
     return rfind(detail::UnitToFind<T, sizeof...(N)>(c), detail::Count(offset)...);
   }
   template <class X, class... N, detail::IfIntegers<X, N...> = 0>
-  ssize_t find_first_of(X c, N... offset) const {
+  ssize_t find_first_of(X c, N... offset) const MIREL_FITS(T, c) {
     return find_first_of(detail::UnitToFind<T, sizeof...(N)>(c), detail::Count(offset)...);
   }
   template <class X, class... N, detail::IfIntegers<X, N...> = 0>
-  ssize_t find_first_not_of(X c, N... offset) const {
+  ssize_t find_first_not_of(X c, N... offset) const MIREL_FITS(T, c) {
     return find_first_not_of(detail::UnitToFind<T, sizeof...(N)>(c), detail::Count(offset)...);
   }
   template <class X, class... N, detail::IfIntegers<X, N...> = 0>
-  ssize_t find_last_of(X c, N... offset) const {
+  ssize_t find_last_of(X c, N... offset) const MIREL_FITS(T, c) {
     return find_last_of(detail::UnitToFind<T, sizeof...(N)>(c), detail::Count(offset)...);
   }
   template <class X, class... N, detail::IfIntegers<X, N...> = 0>
-  ssize_t find_last_not_of(X c, N... offset) const {
+  ssize_t find_last_not_of(X c, N... offset) const MIREL_FITS(T, c) {
     return find_last_not_of(detail::UnitToFind<T, sizeof...(N)>(c), detail::Count(offset)...);
   }
 
