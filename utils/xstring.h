@@ -129,7 +129,7 @@ public:
   using Base::append;
   /// Appends a null-terminated string.
   basic_xstring<T>& append(const T* s) {
-    append(s, MIREL_LENGTH(s));
+    Base::Append(s, MIREL_LENGTH(s));
     return *this;
   }
   using Base::insert;

@@ -814,6 +814,17 @@ protected:
       detail::AllocationFailed();
     return a + b;
   }
+  /// Appends the pn elements at p, which have been checked: the most frequent edit, inline where there is
+  /// room. Then they may also lie in this vector, even in its unused capacity: the storage stays, and memmove
+  /// takes ranges that overlap.
+  void Append(const T* p, ssize_t pn) {
+    const ssize_t oldSize = size();
+    if (pn > capacity() - oldSize)
+      return ReplaceRange(oldSize, 0, p, pn);
+    m_buffer.growbytes(pn * S);
+    if (pn > 0) // memmove may not be given null pointers, even for no bytes
+      std::memmove(begin() + oldSize, p, static_cast<std::size_t>(pn * S));
+  }
 
 private:
   /// The element size in bytes.
@@ -833,17 +844,6 @@ private:
   void ReplaceRange(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRange(ssize_t i, ssize_t n, ssize_t count, T x);
   void AppendRepeated(ssize_t count, const T* p, ssize_t pn);
-
-  /// Appends the pn elements at p: the most frequent edit, inline where there is room. Then they may also lie
-  /// in this vector, even in its unused capacity: the storage stays, and memmove takes ranges that overlap.
-  void Append(const T* p, ssize_t pn) {
-    const ssize_t oldSize = size();
-    if (pn > capacity() - oldSize)
-      return ReplaceRange(oldSize, 0, p, pn);
-    m_buffer.growbytes(pn * S);
-    if (pn > 0) // memmove may not be given null pointers, even for no bytes
-      std::memmove(begin() + oldSize, p, static_cast<std::size_t>(pn * S));
-  }
 
   /// The end of the part that a reverse search from offset goes through.
   const T* After(ssize_t offset) const { return offset == npos ? end() : begin() + offset + 1; }
