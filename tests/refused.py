@@ -21,6 +21,7 @@ using namespace mirel;
 enum class E { e };
 enum Unscoped {};
 struct Wrapped { operator int() const; };
+struct Converts : std::string { operator string8() const; };
 namespace Program { // has operators of its own, of every kind of match
 string8 operator+(const string8&, const char*);
 template <class T> bool operator==(const basic_xstring<T>&, const basic_xstring<T>&);
@@ -32,8 +33,8 @@ inline bool Use(const string8& s) { return s + "x" == s && s < s && s == "x" && 
 }
 """
 CALL = """void F(string8& s, string8& t, const string8& cs, string16& w, xvector<char8>& v, VectorOfByte& b, xostream& os, int n) {
-  [[maybe_unused]] double doubles[9]; Wrapped wrapped[1]; volatile char bit = 1;
-  (void)s, (void)t, (void)cs, (void)w, (void)v, (void)b, (void)os, (void)n, (void)wrapped, (void)bit;
+  [[maybe_unused]] double doubles[9]; Wrapped wrapped[1]; Converts converts; volatile char bit = 1;
+  (void)s, (void)t, (void)cs, (void)w, (void)v, (void)b, (void)os, (void)n, (void)wrapped, (void)converts, (void)bit;
   (void)(%s);
 }
 """

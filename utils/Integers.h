@@ -26,6 +26,11 @@ template <class P, class Ptr, class N>
 using IfPointerAndCount = std::enable_if_t<
     (std::is_pointer_v<P> || std::is_null_pointer_v<P>)&&std::is_convertible_v<P, Ptr> && kIsInteger<N>, int>;
 
+/// Lets a template take part only for a pointer and an integer, in whatever order.
+template <class P, class Q>
+using IfPointerAndInteger =
+    std::enable_if_t<(std::is_pointer_v<P> && kIsInteger<Q>) || (kIsInteger<P> && std::is_pointer_v<Q>), int>;
+
 /// The unsigned value of an integer, an enumerator or a code unit: what a source unit of any type counts by.
 template <class N> constexpr auto UnsignedValue(N x) {
   if constexpr (std::is_enum_v<N>)
@@ -71,12 +76,12 @@ template <class T, bool kStored, class N>
     kStored ? ConstantDoesNotFit() : ConstantIsCut(); // the compiler decides
 #endif
 }
+#endif
 
 /// A difference or count of any type as an ssize_t, the nearest one where that has fewer bits.
 template <class N> constexpr ssize_t Saturated(N n) {
   if constexpr (sizeof(N) > sizeof(ssize_t)) { // the compiler decides
     using Limits = std::numeric_limits<ssize_t>;
-#endif
     return n < Limits::min() ? Limits::min() : n > Limits::max() ? Limits::max() : static_cast<ssize_t>(n);
   } else {
     return static_cast<ssize_t>(n);

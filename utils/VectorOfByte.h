@@ -562,9 +562,21 @@ public:
 
   iterator erase(std::nullptr_t) = delete;
   template <class N, detail::IfIntegers<N> = 0> detail::WriteEraseElement erase(N) = delete;
-  template <class N, class M, detail::IfIntegers<N, M> = 0> detail::WriteNullptr assign(N, M) = delete;
-  template <class N, class M, detail::IfIntegers<N, M> = 0> detail::WriteNullptr push_back(N, M) = delete;
-  template <class... N, detail::IfIntegers<N...> = 0> detail::WriteNullptr compare(N...) const = delete;
+  // Where two pointers are taken, an integer is neither a null pointer nor a count.
+  template <class P, class Q, class Hint = detail::WriteTwoPointers, detail::IfPointerAndInteger<P, Q> = 0>
+  VectorOfByte(P, Q) = delete;
+  template <class P, class Q, detail::IfPointerAndInteger<P, Q> = 0>
+  detail::WriteTwoPointers assign(P, Q) = delete;
+  template <class P, class Q, detail::IfPointerAndInteger<P, Q> = 0>
+  detail::WriteTwoPointers push_back(P, Q) = delete;
+  template <class I, class P, class Q, detail::IfPointerAndInteger<P, Q> = 0>
+  detail::WriteTwoPointers insert(I, P, Q) = delete;
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  detail::WriteNullptrOrInsertCopies assign(N, X) = delete;
+  template <class N, class X, detail::IfIntegers<N, X> = 0>
+  detail::WriteNullptrOrInsertCopies push_back(N, X) = delete;
+  template <class... N, detail::IfIntegers<N...> = 0>
+  detail::WriteNullptrOrPointerAndCount compare(N...) const = delete;
   /// @endcond
 
 private:

@@ -226,6 +226,11 @@ public:
     return *this;
   }
 
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  explicit basic_xstring(const X&, N...) = delete;
+  template <class X, class Hint = detail::Instead<T, X>> void operator=(const X&) = delete;
+  template <class N, class Hint = detail::WritePointerAndCount, detail::IfIntegers<N> = 0>
+  basic_xstring(N, const T*) = delete;
   basic_xstring(std::nullptr_t) = delete;
   basic_xstring<T>& operator=(std::nullptr_t) = delete;
   template <class X, detail::IfIntegers<X> = 0> detail::WriteAssignOfOneUnit operator=(X) = delete;

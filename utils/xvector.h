@@ -793,16 +793,47 @@ public:
 
   iterator erase(std::nullptr_t) = delete;
   template <class N, detail::IfIntegers<N> = 0> detail::WriteEraseElement erase(N) = delete;
+  template <class N, class Hint = detail::WritePointerAndCount, detail::IfIntegers<N> = 0>
+  xvector(N, const T*) = delete;
+  template <class X, detail::IfIntegers<X> = 0> detail::WriteAssignOfOneUnit assign(X) = delete;
+  template <class X, detail::IfIntegers<X> = 0> detail::WritePushBack append(X) = delete;
+  template <class... N, detail::IfIntegers<N...> = 0>
+  detail::WriteNullptrOrPointerAndCount compare(N...) const = delete;
+  detail::WriteRangeOfTheSet find_first_of(const xvector<T>&, ssize_t = 0) const = delete;
+  detail::WriteRangeOfTheSet find_first_not_of(const xvector<T>&, ssize_t = 0) const = delete;
   // The pointer that a reverse iterator converts to isn't at the element that it designates.
   template <class... A> detail::ReverseIteratorsOnlyStep erase(const detail::ReversePointer&, A...) = delete;
   template <class... A> detail::ReverseIteratorsOnlyStep insert(const detail::ReversePointer&, A...) = delete;
   template <class... A>
   detail::ReverseIteratorsOnlyStep replace(const detail::ReversePointer&, A...) = delete;
-  template <class N, detail::IfIntegers<N> = 0>
-  detail::ReverseIteratorsOnlyStep assign(const detail::ReversePointer&, N) = delete;
-  template <class N, detail::IfIntegers<N> = 0>
-  detail::ReverseIteratorsOnlyStep append(const detail::ReversePointer&, N) = delete;
-  template <class... N, detail::IfIntegers<N...> = 0> detail::WriteNullptr compare(N...) const = delete;
+  detail::ReverseIteratorsOnlyStep operator+=(const detail::ReversePointer&) = delete;
+  // Text of other units, and other strings. What to write is the argument for Hint.
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void assign(const X&, N...) = delete;
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void append(const X&, N...) = delete;
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void find(const X&, N...) const = delete;
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void rfind(const X&, N...) const = delete;
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void find_first_of(const X&, N...) const = delete;
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void find_first_not_of(const X&, N...) const = delete;
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void find_last_of(const X&, N...) const = delete;
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void find_last_not_of(const X&, N...) const = delete;
+  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void compare(const X&, N...) const = delete;
+  template <class X, class Hint = detail::Instead<T, X>> void _Eq(const X&) const = delete;
+  template <class X, class Hint = detail::Instead<T, X>> void _Lt(const X&) const = delete;
+  template <class I, class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  void insert(I, const X&, N...) = delete;
+  template <class I, class J, class X, class Hint = detail::Instead<T, X>, class... N>
+  void replace(I, J, const X&, N...) = delete;
+  template <class I, class J, class X, class Hint = detail::Instead<T, X>, class... N>
+  void compare(I, J, const X&, N...) const = delete;
   /// @endcond
 
 protected:
