@@ -1,4 +1,4 @@
-// A case is one benchmark: what we and others do on the same data in the same run.
+// A case is one benchmark: the same work of this library and of others, on the same data in the same run.
 
 #pragma once
 
@@ -19,26 +19,27 @@ using mirel::char16;
 using mirel::char8;
 using mirel::ssize_t;
 
-/// What one party does in a case: once, for its result, and in the loop that is timed.
+/// The work of one party in a case: once, for its result, and in the timed loop.
 struct Party {
   std::function<long long()> once;
   std::function<void(benchmark::State&)> loop;
 };
 
-/// The work returns what can be compared between the parties: an index, a size, a checksum.
+/// Makes a party of its work, which returns what can be compared with the other parties: an index, a size or
+/// a checksum.
 template <class Work> Party Of(Work work) {
   return {[work] { return static_cast<long long>(work()); },
           [work](benchmark::State& state) {
             for (auto _ : state) {
-              // Some functions, memchr and strcspn among them, are pure to the compiler: it would call them
-              // once.
+              // The compiler takes some functions, memchr and strcspn among them, for pure: it would call
+              // them once.
               benchmark::ClobberMemory();
               benchmark::DoNotOptimize(work());
             }
           }};
 }
 
-/// Does the same with each of the texts, which live as long as the program.
+/// Makes a party that does its work with each of the texts, which live as long as the program.
 template <class Text, class Work> Party Over(const std::vector<Text>& texts, Work work) {
   return Of([&texts, work] {
     long long sum = 0;
@@ -48,7 +49,7 @@ template <class Text, class Work> Party Over(const std::vector<Text>& texts, Wor
   });
 }
 
-/// The parties' results must agree: only equal work can be set against each other.
+/// One benchmark and its parties. Their results must agree, since only equal work can be compared.
 class Case {
 public:
   Case(const std::string& area, const std::string& work, const std::string& data, std::size_t size,
@@ -72,7 +73,7 @@ public:
     };
     auto* const registered = benchmark::RegisterBenchmark(name.c_str(), run);
     if (m_isLong)
-      registered->Repetitions(9); // of milliseconds each
+      registered->Repetitions(9); // each takes milliseconds
     return *this;
   }
   template <class Work> Case& Against(const std::string& who, Work work) { return Against(who, Of(work)); }
@@ -84,7 +85,7 @@ private:
   std::shared_ptr<std::optional<long long>> m_expected = std::make_shared<std::optional<long long>>();
 };
 
-/// The standard library's character for a code unit, and the names of the types.
+/// The standard library's character type for a code unit, and the names of both.
 template <class T> struct Width;
 template <> struct Width<char8> {
   using Std = char;

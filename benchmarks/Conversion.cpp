@@ -1,5 +1,5 @@
-// Conversions between UTF-8 and UTF-16. Each party converts into what its users hold the result in; whoever
-// can use storage again does, but for the cases with a fresh string.
+// Conversions between UTF-8 and UTF-16. Each party converts into the type in which its users hold text, and
+// reuses storage if it can, except in the cases with a fresh string.
 #include "Library.h"
 #include "Simdutf.h"
 #include "Texts.h"
@@ -20,7 +20,7 @@ namespace {
 
 constexpr std::size_t kMaxUnits = std::size_t(4) << 20;
 
-/// Large enough for every conversion, for those who write into a raw buffer.
+/// A buffer that is large enough for every conversion, for the parties that write into raw buffers.
 char* Buffer8() {
   static auto& buffer = *new std::vector<char>(3 * kMaxUnits + 64);
   return buffer.data();
@@ -34,7 +34,7 @@ char16_t* Buffer16() {
 class Iconv {
 public:
   Iconv(const char* to, const char* from) : m_handle(iconv_open(to, from)) {}
-  /// Adds to out what was converted. @return whether the text is well-formed
+  /// Moves out past the end of the result. @return whether the text is well-formed
   template <class In> bool operator()(const In* text, std::size_t size, char*& out) const {
     char* in = reinterpret_cast<char*>(const_cast<In*>(text));
     std::size_t inLeft = size * sizeof(In), outLeft = 3 * kMaxUnits;
@@ -132,7 +132,7 @@ void RegisterToUtf8(const Language& language, std::size_t size) {
 #endif
 }
 
-/// The result is a new string each time, null-terminated at the end.
+/// Registers conversions whose result is a new, null-terminated string each time.
 void RegisterFresh(const Language& language, std::size_t size) {
   const auto& utf8 = *new std::vector<std::string>(TextsIn<char>(language, size));
   const auto& utf16 = *new std::vector<std::u16string>(TextsIn<char16_t>(language, size));
@@ -162,8 +162,8 @@ void RegisterFresh(const Language& language, std::size_t size) {
                }));
 }
 
-/// With a byte that never occurs in UTF-8 about every so many bytes. Each party is called again behind every
-/// one, so that all of them are reported.
+/// Registers conversions of text in which a byte that never occurs in UTF-8 follows about every so many
+/// bytes. Each party is called again behind every such byte, so that it reports all of them.
 void RegisterMalformed(const Language& language, const char* data, std::size_t every) {
   auto& malformed = *new Malformed{TextsIn<char>(language, std::size_t(1) << 16)[0], {0}};
   std::string& text = malformed.text;
@@ -212,7 +212,7 @@ void RegisterMalformed(const Language& language, const char* data, std::size_t e
                     }
                   }));
 #ifdef HAVE_QT
-  if (malformed.starts.size() == 1) // it goes on to the end, wherever it is called
+  if (malformed.starts.size() == 1) // it always goes on to the end of the text
     reports.Against("Qt", Reporting(malformed, [](const char* from, std::size_t n) {
                       QStringDecoder decode(QStringDecoder::Utf8);
                       const QString result = decode(QByteArrayView(from, qsizetype(n)));

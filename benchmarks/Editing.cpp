@@ -11,7 +11,7 @@
 
 namespace {
 
-/// Building count times something, from an empty container of each kind.
+/// Registers count appends to an empty container of each kind.
 template <class T> void RegisterBuilding(ssize_t count) {
   using Std = typename Width<T>::Std;
   const auto pushBack = [count](auto make, auto unit) {
@@ -108,7 +108,7 @@ template <class T> void RegisterChanging(ssize_t size) {
         theirTarget.erase(0, 1);
         return theirTarget.size();
       });
-  // Both restore the contents first, which is the same copy.
+  // Both restore the contents first, by the same copy.
   auto& ourErased = *new mirel::basic_xstring<T>(ours);
   auto& theirErased = *new StdString<T>(theirs);
   pair(
@@ -125,7 +125,7 @@ template <class T> void RegisterChanging(ssize_t size) {
       });
 }
 
-/// Strings of 10 units, which the standard ones hold without an allocation if they are of bytes.
+/// Registers work with strings of 10 units; standard strings hold 10 bytes without an allocation.
 template <class T> void RegisterShortStrings() {
   static const auto theirs = StdOf<T>("ten units.");
   static const auto ours = OurOf<T>(theirs);
@@ -160,7 +160,7 @@ template <class T> void RegisterShortStrings() {
     return made.size();
   });
 
-  // 1,000 strings that differ in their middle, in no order.
+  // 1,000 strings that differ in the middle, unsorted.
   constexpr std::size_t kCount = 1000;
   static std::vector<StdString<T>> theirWords;
   static std::vector<mirel::basic_xstring<T>> ourWords;

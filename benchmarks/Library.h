@@ -1,14 +1,14 @@
-// What the library does in the cases that an earlier version of it may take part in as well.
+// The work of this library in the cases in which an earlier version may take part too.
 
 #pragma once
 
 #include "Cases.h"
 
-/// A search through a haystack for a needle, for its first unit, or for the members of a set. Splitting looks
-/// for every occurrence of a member in turn.
+/// A search in a haystack for a needle, for a single unit, or for the members of a set. Splitting finds one
+/// member of the set after the other.
 enum class Op { kFindUnit, kRfindUnit, kFind, kRfind, kFirstOf, kLastOf, kFirstNotOf, kLastNotOf, kSplit };
 
-/// Works for our strings and the standard ones, which live as long as the program.
+/// Searches in our strings or in standard ones, which live as long as the program.
 template <class String> Party Searching(Op op, const String& s, const String& what) {
   using Size = decltype(s.size());
   constexpr Size kLast = static_cast<Size>(-1);
@@ -31,13 +31,13 @@ template <class String> Party Searching(Op op, const String& s, const String& wh
   });
 }
 
-/// The parts of a malformed text that begin with the indices given and reach to its end.
+/// The parts of a malformed text that begin at the given indices and reach to its end.
 struct Malformed {
   std::string text;
   std::vector<std::size_t> starts;
 };
 
-/// How many parts the conversion reports as malformed, given a pointer and a size.
+/// Counts the parts that a conversion, given a pointer and a size, reports as malformed.
 template <class IsMalformed> Party Reporting(const Malformed& malformed, IsMalformed isMalformed) {
   return Of([&malformed, isMalformed] {
     const std::string& text = malformed.text;
@@ -48,8 +48,8 @@ template <class IsMalformed> Party Reporting(const Malformed& malformed, IsMalfo
   });
 }
 
-/// One version of the library. What its functions are given lives as long as the program. A conversion goes
-/// into a string that is used again, or into a new one, of which c_str() is then asked.
+/// One version of the library. The arguments of its functions live as long as the program. A conversion
+/// reuses its destination, or converts into a fresh string and calls c_str().
 struct Library {
   Party (*search8)(Op op, const std::string& text, const std::string& what);
   Party (*search16)(Op op, const std::u16string& text, const std::u16string& what);
@@ -63,7 +63,7 @@ extern const Library kOurs;
 extern const Library kBefore;
 #endif
 
-/// Adds this library to a case, and where isBesideBefore the earlier version.
+/// Adds this library to a case, and if isBesideBefore the earlier version.
 template <class Make> Case& AddLibrary(Case& to, bool isBesideBefore, Make make) {
   to.Against("ours", make(kOurs));
 #ifdef HAVE_BEFORE

@@ -1,4 +1,4 @@
-// Searches and comparisons, in English-like text of lower-case words and its like in other scripts.
+// Searches and comparisons, in lower-case text that resembles English, and in similar text of other scripts.
 #include "Library.h"
 #include "Simdutf.h"
 
@@ -14,7 +14,8 @@
 
 namespace {
 
-/// Words of the letters of English at about their frequencies; q occurs about once in 1,000 units.
+/// Returns words in which the letters have about their frequency in English; q occurs about once in 1,000
+/// units.
 std::string Words(std::size_t size) {
   static const std::string kLetters =
       "eeeeeeeeeeeetttttttttaaaaaaaaooooooooiiiiiiinnnnnnnsssssshhhhhhrrrrrrddddllllcccuuu"
@@ -26,16 +27,16 @@ std::string Words(std::size_t size) {
   return text;
 }
 
-/// Cases live as long as the program, and so does what they work on.
+/// Keeps a text as long as the program runs, as the cases do.
 template <class T> const StdString<T>& Kept(const StdString<T>& text) { return *new StdString<T>(text); }
 template <class T> const StdString<T>& KeptOf(const std::string& text) { return Kept<T>(StdOf<T>(text)); }
 
-/// A pointer as an index, null as for nothing.
+/// Turns a pointer into an index, and null into -1.
 template <class Unit> long long IndexOf(const std::basic_string<Unit>& text, const void* at) {
   return at ? static_cast<const Unit*>(at) - text.data() : -1;
 }
 
-/// A size as an index, the whole size as for nothing.
+/// Turns a size into an index, and the whole size into -1.
 long long IndexOf(const std::string& text, std::size_t size) {
   return size == text.size() ? -1 : static_cast<long long>(size);
 }
@@ -48,7 +49,8 @@ Party OurSearch(const Library& library, Op op, const StdString<T>& text, const S
     return library.search16(op, text, what);
 }
 
-/// One search by us, by the standard string, and if it is short or isBesideBefore by the earlier version.
+/// Registers a search with ours and the standard string as parties, and with the earlier version if the text
+/// is short or isBesideBefore.
 template <class T>
 Case Search(Op op, const std::string& work, const std::string& data, const StdString<T>& text,
             const StdString<T>& what, bool isBesideBefore = false) {
@@ -58,7 +60,7 @@ Case Search(Op op, const std::string& work, const std::string& data, const StdSt
   return search.Against(Width<T>::kPeer, Searching(op, text, what));
 }
 
-/// The unit, which isn't there.
+/// Registers searches for a unit that isn't in the text.
 template <class T> void RegisterUnit(const StdString<T>& text) {
   const auto& unit = KeptOf<T>("Z");
   Case find = Search<T>(Op::kFindUnit, "find(c)", "absent", text, unit);
@@ -112,7 +114,7 @@ void RegisterNeedle(const StdString<T>& text, const std::string& needle, const c
   Search<T>(Op::kFind, "find(needle)", data + ", at the end", Kept<T>(end), what);
 }
 
-/// Members that don't occur; in both directions where the set is of ASCII.
+/// Registers searches for a set whose members aren't in the text; in both directions if the set is ASCII.
 template <class T>
 void RegisterSet(const StdString<T>& text, const StdString<T>& set, const std::string& members) {
   const std::string data = "set of " + std::to_string(set.size()) + members + ", absent";
@@ -183,7 +185,7 @@ template <class T> void RegisterSearchesIn(std::size_t size) {
   RegisterSet<T>(text, StdOf<T>(Set40()), "");
 
   std::string members = Words(size);
-  for (char& c : members) // only those of the set of 18
+  for (char& c : members) // leaves only members of the set of 18
     if (std::strchr("fgypbvkq", c))
       c = 'e';
   RegisterComplement<T>(KeptOf<T>(members), KeptOf<T>("zxetaoinshrdlcumw "));
@@ -194,14 +196,14 @@ template <class T> void RegisterSearchesIn(std::size_t size) {
   RegisterComparisons<T>(text);
 }
 
-/// Sets of one script and of several, in a text of the same scripts.
+/// Registers sets of one script and of several, in texts of the same scripts.
 void RegisterScripts(std::size_t size) {
   std::u16string cyrillic, mixed;
   int word = 0;
   for (const char c : Words(size)) {
     const auto letter = static_cast<char16_t>(c - 'a');
     cyrillic += c == ' ' ? u' ' : char16_t(u'\u0430' + letter);
-    const char16_t scripts[] = {u'a', u'\u03B1', u'\u0430', u'\u4E00'}; // by words
+    const char16_t scripts[] = {u'a', u'\u03B1', u'\u0430', u'\u4E00'}; // each word in the next one
     mixed += c == ' ' ? u' ' : char16_t(scripts[word % 4] + letter);
     word += c == ' ';
   }
@@ -219,7 +221,8 @@ void RegisterScripts(std::size_t size) {
   }
 }
 
-/// Every fifth unit is one of the set: what is prepared for a search must be worth it at once.
+/// Registers searches in which every fifth unit is a member of the set: whatever a search prepares must be
+/// worth it within five units.
 template <class T> void RegisterSplitting(std::size_t size) {
   for (const std::string set : {" ,.;", " ,.;:!?()-\n\t"}) {
     std::string words;
@@ -239,7 +242,7 @@ template <class T> void RegisterSplitting(std::size_t size) {
   }
 }
 
-/// What takes the product of two sizes unless something is done about it.
+/// Registers searches that take the product of two sizes if each place is compared anew.
 void RegisterWorstCases() {
   const auto& text = Kept<char8>(std::string(1 << 20, 'a'));
   const std::string many((1 << 18) - 2, 'a');
@@ -255,7 +258,7 @@ void RegisterWorstCases() {
       .Against("ours", kOurs.search8(Op::kRfind, text, backward))
       .Against("our find", kOurs.search8(Op::kFind, text, forward));
 
-  // Even units are members, odd ones are searched.
+  // The members are even units, the haystack has odd ones.
   std::mt19937 random(13);
   std::u16string set, odd;
   for (int i = 0; i < 10000; ++i)

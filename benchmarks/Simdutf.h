@@ -12,7 +12,7 @@
 
 using SimdutfParty = std::pair<std::string, const simdutf::implementation*>;
 
-/// simdutf's kernels for the instructions that ours use, where there are such, and its best ones on this
+/// Returns simdutf's kernels for the instructions that ours use, if it has such, and its best ones for this
 /// processor.
 inline const std::vector<SimdutfParty>& Simdutf() {
   static const auto kParties = [] {

@@ -14,7 +14,7 @@ namespace {
 
 template <class T> using StdView = std::basic_string_view<typename Width<T>::Std>;
 
-/// Hashing and comparing texts that differ in their last unit, if at all.
+/// Registers hashes and comparisons of texts that are equal or differ in their last unit.
 template <class T> void RegisterComparing(ssize_t size) {
   const auto usize = static_cast<std::size_t>(size);
   // The cases live as long as the program, and so do their texts.
@@ -23,7 +23,7 @@ template <class T> void RegisterComparing(ssize_t size) {
   auto* const ours = new std::vector<mirel::basic_xstring<T>>;
   for (const auto& text : *texts)
     ours->push_back(OurOf<T>(text));
-  // Bytes are compared in the same place, since a few ns depend on where that is.
+  // Both sides compare bytes at the same addresses, which matter by a few ns.
   auto* const theirs = new std::vector<StdView<T>>(texts->begin(), texts->end());
   if constexpr (sizeof(T) == 1)
     std::transform(ours->begin(), ours->end(), theirs->begin(), [](auto& s) { return mirel::View(s); });
@@ -40,7 +40,8 @@ template <class T> void RegisterComparing(ssize_t size) {
   pair("<", "another last unit", [](const auto& s) { return s[0] < s[2]; });
 }
 
-/// Strings of 16 units, too long for the standard ones to hold within, in the standard's containers.
+/// Registers work with standard containers of strings of 16 units, which are too long for a standard string
+/// to hold without an allocation.
 template <class T> void RegisterContainers() {
   constexpr std::size_t kCount = 1000;
   using Std = StdString<T>;
@@ -63,7 +64,7 @@ template <class T> void RegisterContainers() {
       return grown.size();
     };
   };
-  // The rest changes vectors in place, so that text is copied only by strings that can't move.
+  // The rest changes vectors in place, so only strings that can't move copy text.
   const auto relocate = [](auto& words) {
     return [own = std::make_shared<std::decay_t<decltype(words)>>(words)] {
       auto& changed = *own;

@@ -1,5 +1,5 @@
-// Checking, counting, walking and lossy converting. Each party must see malformed text; who only counts is
-// asked whether it is well-formed first.
+// Checks, counts, walks and lossy conversions. Each party must detect malformed text; a party that only
+// counts checks the text first.
 #include "Cases.h"
 #include "Simdutf.h"
 #include "Texts.h"
@@ -24,7 +24,7 @@ const char16* Units(const std::u16string& text) { return reinterpret_cast<const 
 ssize_t Size(const std::string& text) { return static_cast<ssize_t>(text.size()); }
 ssize_t Size(const std::u16string& text) { return static_cast<ssize_t>(text.size()); }
 
-/// Code points by ICU's macro, of which it makes -1 where text is malformed.
+/// Walks the code points with ICU's macro, which gives -1 for malformed text.
 template <class F> bool EachByIcu(const std::string& text, const F& f) {
   const auto* const s = reinterpret_cast<const uint8_t*>(text.data());
   const auto size = static_cast<int32_t>(text.size());
@@ -123,7 +123,7 @@ void RegisterChecks16(const Language& language, std::size_t size) {
 #endif
 }
 
-/// Sums the code points, one after the other.
+/// Registers walks that sum the code points.
 void RegisterWalks(const Language& language, std::size_t size) {
   const auto& utf8 = *new std::vector<std::string>(TextsIn<char>(language, size));
   const auto& utf16 = *new std::vector<std::u16string>(TextsIn<char16_t>(language, size));
@@ -166,7 +166,7 @@ void RegisterWalks(const Language& language, std::size_t size) {
 #pragma GCC diagnostic pop
 }
 
-/// What the strict conversion of the text comes to, called again behind each FF, with one unit for that.
+/// Calls the strict conversion again behind each FF. @return how many units it gives, with one for each FF
 ssize_t StrictAgain(mirel::string16& dst, const char* p, const char* end) {
   ssize_t units = 0;
   while (!mirel::Utf16FromUtf8(dst, p, end - p)) {
@@ -176,7 +176,7 @@ ssize_t StrictAgain(mirel::string16& dst, const char* p, const char* end) {
   return units + dst.size();
 }
 
-/// Puts a malformed unit at about every tenth. @return how many
+/// Inserts a malformed unit after about every ten units. @return how many
 template <class Unit> ssize_t Spoil(std::basic_string<Unit>& text, Unit malformed) {
   ssize_t count = 0;
   for (std::size_t at = 10; at < text.size(); at += 11, ++count)
@@ -184,8 +184,9 @@ template <class Unit> ssize_t Spoil(std::basic_string<Unit>& text, Unit malforme
   return count;
 }
 
-/// Well-formed text, or the same with an FF at about every tenth byte; then our strict conversion stands for
-/// itself on the well-formed text, and again called behind each fault.
+/// Registers lossy conversions of well-formed text, or of the same text with an FF at about every tenth byte.
+/// Beside the latter, our strict conversion takes part on the well-formed text, and on the malformed one,
+/// called again behind each fault.
 void RegisterLossy(const Language& language, std::size_t size, bool isMalformed) {
   const auto& wellFormed = *new std::vector<std::string>(TextsIn<char>(language, size));
   auto& texts = *new std::vector<std::string>(wellFormed);
@@ -222,7 +223,8 @@ void RegisterLossy(const Language& language, std::size_t size, bool isMalformed)
 #endif
 }
 
-/// UTF-16 to UTF-8; malformed, with a low surrogate at about every tenth unit.
+/// Registers lossy conversions from UTF-16 to UTF-8; malformed text has a low surrogate at about every tenth
+/// unit.
 void RegisterLossyBack(const Language& language, std::size_t size, bool isMalformed) {
   const auto& wellFormed = *new std::vector<std::u16string>(TextsIn<char16_t>(language, size));
   auto& texts = *new std::vector<std::u16string>(wellFormed);

@@ -1,4 +1,4 @@
-// Sentences in fifteen kinds of text, from which the benchmarks make longer ones.
+// Sentences in fifteen kinds of text, of which the benchmarks make longer texts.
 
 #pragma once
 
@@ -91,7 +91,7 @@ inline const std::vector<Language>& Languages() {
   return kLanguages;
 }
 
-/// Sentences of the language in random order, at least size bytes of them.
+/// Returns sentences of the language in random order, at least size bytes.
 inline std::string TextIn(const Language& language, std::size_t size) {
   std::mt19937 random(11);
   std::string text;
@@ -103,7 +103,7 @@ inline std::string TextIn(const Language& language, std::size_t size) {
 inline bool IsInsideCodePoint(char unit) { return (unit & 0xC0) == 0x80; }
 inline bool IsInsideCodePoint(char16_t unit) { return unit >= 0xDC00 && unit <= 0xDFFF; }
 
-/// The boundary of code points that is nearest to an index of the text.
+/// Returns the boundary of code points that is nearest to an index of the text.
 template <class Unit> std::size_t BoundaryNear(const std::basic_string<Unit>& text, std::size_t index) {
   for (std::size_t distance = 0;; ++distance)
     for (const std::size_t at : {index - distance, index + distance})
@@ -111,8 +111,8 @@ template <class Unit> std::size_t BoundaryNear(const std::basic_string<Unit>& te
         return at;
 }
 
-/// Texts of about size units: one, or where it would be short eight from different places, since few units
-/// may have little of what makes the language.
+/// Returns texts of about size units: one, or eight from different places if they are short, since a few
+/// units may not be typical of the language.
 template <class Unit>
 std::vector<std::basic_string<Unit>> TextsIn(const Language& language, std::size_t size) {
   constexpr std::size_t kStep = 97;

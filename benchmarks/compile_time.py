@@ -1,11 +1,11 @@
 #!/usr/bin/python3
-"""Prints what including a header of ours costs in compile time, beside <string>: a section of docs/benchmarks.md.
+"""Compares the compile time of our headers with that of <string>, and prints a section of docs/benchmarks.md.
 
 usage: compile_time.py INCLUDE-DIRECTORY [REPETITIONS]
 
-A ratio is the time of a translation unit that has nothing but the header, divided by that of one that has nothing but
-<string>: above 1 ours costs more. The headers are compiled in turn; the ratio is taken of the medians of user time, and
-in brackets of the minima.
+A ratio is the time of a translation unit that includes only the header, divided by that of one that includes only
+<string>: above 1 ours costs more. The headers are compiled in turn. The ratio is that of the medians of user time, and
+in brackets that of the minima.
 """
 
 import os
@@ -33,7 +33,7 @@ def measure(compiler, include, repetitions, directory):
             source = directory / f"{i}.cpp"
             source.write_text(f"#include <{header}>\n")
             seconds = user_time([compiler, "-std=c++17", "-O2", f"-I{include}", "-c", source, "-o", directory / "o"])
-            if repetition > 0:  # the first one brings the files into memory
+            if repetition > 0:  # the first one only fills the file cache
                 times[header].append(seconds)
     return times
 
@@ -44,9 +44,9 @@ def main():
     with tempfile.TemporaryDirectory() as name:
         columns = [measure(compiler, include, repetitions, pathlib.Path(name)) for compiler in COMPILERS]
     print("\n## Compile time\n")
-    print("What one more translation unit costs that includes a header: its time divided by that of one that includes\n"
-          f"`<string>`, so that above 1 ours costs more. It is user time with -std=c++17 -O2, of medians of {repetitions} "
-          "in turn; in\nbrackets of minima.\n")
+    print("The compile time of a translation unit that includes the header, divided by that of one that includes\n"
+          f"`<string>`: above 1 ours costs more. It is user time with -std=c++17 -O2, the medians of {repetitions} "
+          "compilations in\nturn; in brackets the minima.\n")
     print("| header | " + " | ".join(COMPILERS) + " |")
     print("|---|" + "--:|" * len(COMPILERS))
     for header in HEADERS[1:]:

@@ -3,8 +3,8 @@
 
 usage: report.py OUTPUT-DIRECTORY NAME=RESULTS.json...
 
-A ratio is the peer's time divided by ours, so that above 1 we are ahead. Parties run in turn, again and again; the
-ratio is taken of the medians. What belongs to several texts is their geometric mean.
+A ratio is the peer's time divided by ours: above 1 we are ahead. The parties run in turn, many times; the ratio is that
+of the medians. A ratio for several texts is their geometric mean.
 """
 
 import collections
@@ -24,13 +24,13 @@ import matplotlib.pyplot as plt
 
 GOALS = pathlib.Path(__file__).with_name("goals.csv")
 NOTES = pathlib.Path(__file__).with_name("notes.md")
-# The columns of sizes, the smallest size in each, and its colour; "200 edits" are in none.
+# The columns of sizes, the smallest size in each, and its colour. Size 200 is in none.
 SIZES = {"12–16": (1, "#c6a300"), "64": (64, "#6fa93d"), "1,000": (1000, "#1f9e89"), "64 Ki": (65536, "#31688e"),
          "4 Mi": (1 << 19, "#440154")}
 EARLIER = "earlier version"
-WORST_OF_GOAL = 0.7  # no text may be below this part of a goal
+WORST_OF_GOAL = 0.7  # no text may be below this fraction of a goal
 CONVERSIONS = ("UTF-8 to UTF-16", "UTF-16 to UTF-8")
-# The first table: a label, benchmarks, their data, unit and column of sizes. Ten rows; those where others are ahead too.
+# The first table: a label, benchmarks, their data, unit and column of sizes. Ten rows, with those where others are ahead.
 GLANCE = [
     ("converting UTF-8 to UTF-16", "UTF-8 to UTF-16", "*", "*", "64 Ki"),
     ("converting UTF-16 to UTF-8", "UTF-16 to UTF-8", "*", "*", "64 Ki"),
@@ -48,7 +48,7 @@ Case = collections.namedtuple("Case", "area work data size unit")
 
 
 class Run:
-    """The results of one program: times[case][party] is a list with the time of each repetition."""
+    """The results of one program: times[case][party] lists the time of each repetition."""
 
     def __init__(self, path):
         results = json.loads(pathlib.Path(path).read_text())
@@ -75,12 +75,12 @@ class Run:
         return statistics.geometric_mean(self.ratio(case, peer) for case in cases)
 
     def upper_quartile(self, cases, peer):
-        """Of the means that single repetitions give."""
+        """The upper quartile of the means of single repetitions."""
         means = [statistics.geometric_mean(r) for r in zip(*(self.single_ratios(case, peer) for case in cases))]
         return statistics.quantiles(means, n=4)[2] if len(means) > 1 else means[0]
 
     def peers(self, cases):
-        """Those who take part in all the cases and aren't ourselves, in another way or another version."""
+        """The parties of all the cases, except the library itself in another way or another version."""
         common = set.intersection(*(set(self.times[case]) for case in cases)) if cases else set()
         return sorted(p for p in common if p not in ("ours", EARLIER) and not p.startswith("our "))
 
@@ -88,7 +88,7 @@ class Run:
         return min(self.peers(cases), key=lambda peer: self.mean(cases, peer), default=None)
 
     def select(self, works, data="", unit="", column=None):
-        """The cases that fit the patterns, of which an empty one fits all, and the column of sizes."""
+        """The cases that match the patterns, of which an empty one matches all, and the column of sizes."""
         return [c for c in self.times if any(fnmatch.fnmatchcase(c.work, w.replace("[]", "[[]]"))
                                              for w in works.split("|"))
                 and fnmatch.fnmatchcase(c.data, data or "*") and fnmatch.fnmatchcase(c.unit, unit or "*")
@@ -125,7 +125,7 @@ def glance(run):
 
 
 def measure_goal(run, cases, peers, goal):
-    """(what the table says, whether it is reached, whether it is within the spread), or None."""
+    """(the cell of the table, whether the goal is reached, whether it is within the spread), or None."""
     groups = {}
     for case in cases:
         for peer in peers:
@@ -138,7 +138,7 @@ def measure_goal(run, cases, peers, goal):
     worst, worst_case, worst_group = min((run.ratio(case, group[2]), case, group)
                                          for group, members in groups.items() for case in members)
 
-    def name(group):  # what tells it from the other groups
+    def name(group):  # its fields that differ from other groups'
         fields = (0, 2) if len({(g[0], g[2]) for g in groups}) == len(groups) else (0, 1, 2)
         return ", ".join(group[i] for i in fields if len({g[i] for g in groups}) > 1)
 
@@ -153,7 +153,7 @@ def measure_goal(run, cases, peers, goal):
 
 
 def goals_table(runs):
-    """A row for each goal and size; the rows of the goals' file say which cases and peers one is for."""
+    """A row for each goal and size; the rows of goals.csv name the cases and peers of each."""
     rows, reached = [], 0
     with GOALS.open(newline="") as file:
         goals = [(row, column) for row in csv.DictReader(file) for column in SIZES if row[column]]
@@ -259,7 +259,7 @@ def plot(name, run, path):
 
 
 def read_notes():
-    """{heading: text}; a heading that is an area's stands above that area's table."""
+    """{heading: text}; a text whose heading is an area stands above that area's table."""
     parts = re.split("^## (.*)\n", NOTES.read_text(), flags=re.MULTILINE)
     return dict(zip(parts[1::2], (text.strip() for text in parts[2::2])))
 
@@ -283,7 +283,7 @@ def main():
              f"First what matters most, with {names[0]}: the best peer is whoever comes closest to us or is ahead.", "",
              *table(["what we do", "of what", "best peer", "its time / ours"], ["---", "---", "---", "--:"],
                     glance(first)),
-             "What belongs to several texts is their geometric mean. Units are code units, bytes of UTF-8 or 16-bit units",
+             "A ratio for several texts is their geometric mean. Units are code units: bytes of UTF-8, or 16-bit units",
              "of UTF-16.", "", "![ratios](benchmarks.png)", "", "## How it was measured", "",
              f"- machine: {cpu}, {context['num_cpus']} cores at about {context['mhz_per_cpu']} MHz",
              f"- our kernels: {context.get('kernels', '?')}", peer_line("simdutf, same level"),
@@ -292,13 +292,13 @@ def main():
              "  by the same compiler",
              f"- command: `./dev bench`, with `--simdutf` and `--before` for those peers; {repetitions} repetitions of "
              "each party, 9 for the", "  longest, interleaved at random",
-             "- conversions of up to 64 units go through eight texts in turn; sizes of 12 to 16 units are where the "
-             "code point ends", "- absolute times on a shared machine mean little, so the tables have none", "",
+             "- conversions of up to 64 units go through eight texts in turn; texts of 12 to 16 units end at a code point",
+             "- absolute times on a shared machine mean little, so the tables have none", "",
              "## Goals", "",
-             "A goal holds for the geometric mean over the texts, beside the peer that comes out lowest; in brackets is",
-             f"the worst text, which may not be below {WORST_OF_GOAL} of the goal. A row that is below in any column says",
-             f"why. Of {len(goals)} goals {reached} are reached in all columns. The goal of as much as the earlier version",
-             "keeps short inputs from getting slower.", "",
+             "A goal is for the geometric mean over the texts, beside the peer with the lowest ratio. In brackets is the",
+             f"worst text, which may not be below {WORST_OF_GOAL} of the goal. A row that is below its goal in any column",
+             f"gives the reason. Of {len(goals)} goals {reached} are reached in all columns. The goals beside the earlier",
+             "version keep short inputs from getting slower.", "",
              *table(["benchmark", "peer", "size", "unit", "goal", *names, "reason"],
                     ["---", "---", "--:", "---", "--:", *["--:"] * len(names), "---"], goals)]
     areas = {case.area: None for case in first.times}
@@ -306,8 +306,8 @@ def main():
         if heading not in areas:
             lines += [f"## {heading}", "", text, ""]
     lines += ["## All benchmarks", "",
-              f"A cell has the ratios of {' / '.join(names)}; – stands for what wasn't measured. The spread is",
-              "half the width of the middle half of the ratios of single repetitions: the median of the row.", ""]
+              f"A cell has the ratios of {' / '.join(names)}; – was not measured. The spread is half the",
+              "interquartile range of the ratios of single repetitions, relative to their median: the median of the row.", ""]
     for area in sorted(areas):
         lines += [f"### {area}", "", *([notes[area], ""] if area in notes else []), *long_table(runs, area)]
     (output / "benchmarks.md").write_text("\n".join(lines).rstrip() + "\n")

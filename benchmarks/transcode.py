@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Prints how the example program does beside the C library's iconv command, as a table of ratios.
+"""Compares the example program with the C library's iconv command, and prints a table of ratios.
 
 usage: transcode.py TRANSCODE [MEGABYTES [REPETITIONS]]
 

@@ -1,4 +1,4 @@
-# Two components: what programs need to run (of a shared library), and what it takes to build them.
+# Two components: what programs need to run (with a shared library), and what it takes to build them.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 
@@ -15,8 +15,8 @@ write_basic_package_version_file(mirel-config-version.cmake COMPATIBILITY SameMi
 install(FILES cmake/mirel-config.cmake ${PROJECT_BINARY_DIR}/mirel-config-version.cmake
   DESTINATION ${package_dir} COMPONENT development)
 
-# The prefix is told from where the file lies, so that the installed tree can be moved, unless the file lies at a
-# place of its own. Appending an absolute path to the prefix gives that path.
+# The prefix is relative to the file, so that the installed tree can be moved, unless the file's directory is absolute.
+# Appending an absolute path to the prefix gives that path.
 set(pc_dir ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 if(IS_ABSOLUTE ${pc_dir})
   set(pc_prefix ${CMAKE_INSTALL_PREFIX})
@@ -26,7 +26,7 @@ else()
 endif()
 cmake_path(APPEND pc_libdir "\${prefix}" ${CMAKE_INSTALL_LIBDIR})
 cmake_path(APPEND pc_includedir "\${prefix}" ${CMAKE_INSTALL_INCLUDEDIR} mirel)
-# A program that isn't linked by the C++ compiler needs its runtime by name, under a static library.
+# With a static library, a program that isn't linked by the C++ compiler must name the C++ runtime.
 set(pc_runtime ${CMAKE_CXX_IMPLICIT_LINK_LIBRARIES})
 list(FILTER pc_runtime INCLUDE REGEX "^(stdc\\+\\+|c\\+\\+|c\\+\\+abi|m)$")
 list(REMOVE_DUPLICATES pc_runtime)
@@ -35,6 +35,6 @@ list(JOIN pc_runtime " " pc_runtime)
 configure_file(cmake/mirel.pc.in mirel.pc @ONLY)
 install(FILES ${PROJECT_BINARY_DIR}/mirel.pc DESTINATION ${pc_dir} COMPONENT development)
 
-# GDB runs what lies here in its own data directory; docs/debugging.md tells users what comes of it.
+# GDB runs scripts in this folder of its data directory; docs/debugging.md describes it for users.
 install(FILES tools/mirel_printers.py DESTINATION ${CMAKE_INSTALL_DATADIR}/gdb/python/gdb/printer
   COMPONENT development)

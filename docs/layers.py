@@ -3,8 +3,8 @@
 
 usage: layers.py DIRECTORY > layers.dot
 
-A box is a header with the source of the same name. A line is an include of the header, and left out where a path of
-others leads there too; a dashed one is an include of the source alone.
+A box is a header with the source of the same name. A line is an include of the header, left out where other lines lead
+there too; a dashed line is an include of the source alone.
 """
 
 import pathlib
@@ -14,7 +14,7 @@ import textwrap
 
 
 def includes(path):
-    """What a file includes of this project and of libraries, by name; the standard's headers have no directory."""
+    """The names of a file's includes, of this project and of libraries; standard headers have no directory."""
     text = path.read_text()
     found = re.findall(r"^#include <(\w+)/([\w/]+)\.\w+>", text, re.MULTILINE)
     own = set(re.findall(r'^#include "(\w+)\.h"', text, re.MULTILINE))
@@ -22,14 +22,14 @@ def includes(path):
 
 
 def summary(path):
-    """The first sentence of a file's first comment, which says what the file is."""
+    """The first sentence of a file's first comment, which describes the file."""
     comment = re.search(r"^//[^\n]*(\n//[^\n]*)*", path.read_text(), re.MULTILINE)
     text = " ".join(re.sub(r"^//+( @file)?", "", line).strip() for line in comment[0].splitlines()).strip()
     return re.match(r".*?[.](?= |$)", text)[0]
 
 
 def below(edges, start):
-    """Whatever is reached from a node, in one step or more."""
+    """The nodes that are reached from a node, in one step or more."""
     reached, steps = set(), list(edges.get(start, ()))
     while steps:
         step = steps.pop()

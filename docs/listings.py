@@ -1,12 +1,12 @@
 #!/usr/bin/python3
-"""Keeps the programs that the pages show the same as the files that the tests run.
+"""Checks that the programs on the pages are those that the tests run.
 
 usage: listings.py [--write] PAGE...
        listings.py --calls PAGE
 
-A listing follows a line that ends with a link to its file and a colon. Those that differ from their files are named, or
-with --write brought up to date. --calls prints a program with every call in the second column of the page's tables, after
-the page's first block of code, which declares what the calls are about.
+A listing follows a line that ends with a link to its file and a colon. The script names the listings that differ from
+their files, or with --write updates them. --calls prints a program with every call in the second column of the page's
+tables, after the page's first block of code, which has the declarations.
 """
 
 import pathlib
@@ -50,7 +50,7 @@ def main():
     write = arguments[0] == "--write"
     for page in map(pathlib.Path, arguments[write:]):
         if names := differing(page, write):
-            sys.exit(f"{page} shows {', '.join(names)} otherwise: run docs/listings.py --write {page}")
+            sys.exit(f"{page} differs from {', '.join(names)}: run docs/listings.py --write {page}")
 
 
 if __name__ == "__main__":

@@ -1,5 +1,5 @@
-# What doxygen reads of a header: quoted texts of preconditions as code, and signatures without what only the compiler
-# needs, such as the conditions under which a template takes part, and the overloads that are refused.
+# Filters a header for doxygen: shows quoted texts of preconditions as code, removes from signatures what only the
+# compiler needs, such as the conditions of a template, and removes deleted overloads.
 /^ *\/\/\//s/"([^"]+)"/`\1`/g
 /^[^/]*=\s*delete;/s/.*//
 /friend struct detail::/s/.*//

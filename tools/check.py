@@ -1,10 +1,10 @@
 #!/usr/bin/python3
-"""Builds and tests the library in every way that is promised to work, and prints one table of the results.
+"""Builds and tests the library in every way that is promised to work, and prints a table of the results.
 
 usage: check.py [--long] [--list] [WORD...]
 
-With words, only the rows whose names have one of them. --long adds the rows that take many minutes or most of the
-machine's memory. The output of each row is kept in build/check.
+With words, only the rows whose names have one of them are run. --long adds the rows that take many minutes or most of
+the machine's memory. The output of each row is kept in build/check.
 """
 
 import argparse
@@ -26,7 +26,7 @@ FUZZ_SECONDS = 20
 
 
 class Failed(Exception):
-    """A row's command didn't end as it should."""
+    """A row's command failed."""
 
 
 class Row:
@@ -39,7 +39,7 @@ class Row:
         self.log = OUT / f"{self.slug}.log"
 
     def run(self, *command, errors=subprocess.STDOUT, **env):
-        """Runs a command; what it prints goes to the log, but for its errors where another place is named."""
+        """Runs a command; its output goes to the log, and its standard error too unless errors says otherwise."""
         with self.log.open("a") as log:
             log.write(f"$ {shlex.join(map(str, command))}\n")
             log.flush()
@@ -49,7 +49,7 @@ class Row:
             raise Failed(f"exit code {code}: {shlex.join(map(str, command))[:200]}")
 
     def build(self, *targets, cxx="g++", std=17, flags="", program="", options=()):
-        """Configures and builds a tree of its own, with warnings as errors; program is what only the tests get."""
+        """Configures and builds a tree of its own, with warnings as errors; program has flags for the tests alone."""
         self.run("cmake", "-S", ROOT, "-B", self.dir, "-G", "Ninja", "-DCMAKE_BUILD_TYPE=None",
                  f"-DCMAKE_CXX_COMPILER={cxx}", f"-DCMAKE_CXX_STANDARD={std}", "-DCMAKE_CXX_EXTENSIONS=OFF",
                  f"-DCMAKE_CXX_FLAGS={flags}", f"-DMIREL_TEST_FLAGS={program}", "-DMIREL_BUILD_TESTS=ON",
@@ -68,8 +68,9 @@ class Row:
 
 
 def suite(flags, exhaustive=True, **how):
-    """A row that builds everything in one way and runs all tests of code, or all but those of every short sequence and
-    every place in a block, which take minutes without optimisation or under emulation, most of them in the oracle."""
+    """A row that builds everything in one way and runs all tests of code. Unless it is exhaustive, it leaves out those
+    of every short sequence and every place in a block: without optimisation or under emulation they take minutes, mostly
+    in the oracle."""
     def work(row):
         row.build(flags=flags, **how)
         left_out = () if exhaustive else ("-E", "Utf.EverySequence|OneOrTwoAmongOthers")
@@ -79,7 +80,7 @@ def suite(flags, exhaustive=True, **how):
 
 
 def headers(row):
-    """Every public header alone, and all of them in a program without exceptions and RTTI."""
+    """Compiles every public header alone, and all of them without exceptions and RTTI."""
     for cxx in ("g++", "clang++", "clang++ -stdlib=libc++"):
         for std in ("17", "20", "2b"):
             for header in sorted((ROOT / "utils").glob("*.h")):
@@ -93,7 +94,7 @@ def headers(row):
 
 
 def unity(row):
-    """The library as one source, which a project that does so with all asks for."""
+    """Builds the library as one source, as a project with unity builds does."""
     for cxx in ("g++", "clang++"):
         tree = row.dir / cxx
         row.run("cmake", "-S", ROOT, "-B", tree, "-G", "Ninja", f"-DCMAKE_CXX_COMPILER={cxx}", "-DCMAKE_UNITY_BUILD=ON",
@@ -102,7 +103,7 @@ def unity(row):
 
 
 def layout(row):
-    """The layout of the sources, what clang-tidy finds in them, and whether the mutants still fit them."""
+    """Checks the layout of the sources, runs clang-tidy, and checks that the mutants still fit the sources."""
     row.run("tools/mutants.py", "--check")
     sources = [path for folder in ("utils", "examples", "tests", "benchmarks")
                for path in sorted((ROOT / folder).rglob("*")) if path.suffix in (".h", ".cpp")]
@@ -113,8 +114,8 @@ def layout(row):
 
 
 def emulated(processor, triplet="", emulator="", link="", exhaustive=True):
-    """The suite for another processor, under emulation. Where they have other names, triplet is the tools' and emulator
-    QEMU's."""
+    """The suite for another processor, under emulation. If the tools or QEMU have another name for the processor, it is
+    the triplet or the emulator."""
     triplet = triplet or f"{processor}-linux-gnu"
     return suite(cxx=f"{triplet}-g++", flags="-O2", exhaustive=exhaustive, options=(
         "-DCMAKE_SYSTEM_NAME=Linux", f"-DCMAKE_SYSTEM_PROCESSOR={processor}",
@@ -123,9 +124,9 @@ def emulated(processor, triplet="", emulator="", link="", exhaustive=True):
 
 
 def everyday(row):
-    """What most users build; then the same program on older processors, from one with every instruction set of the
-    kernels to one without any, and under valgrind, without what takes it many minutes and shows it nothing new: texts
-    by the million, and tests whose work is done in children, about which it is silent."""
+    """Tests what most users build; then the same program on older processors, from one with every instruction set of
+    the kernels to one without any, and under valgrind. The latter leaves out slow tests that would find nothing new:
+    millions of texts, and tests whose child processes do the work, on which valgrind doesn't report."""
     suite(flags="-O2 -g")(row)
     tests = row.dir / "tests" / "mirel_tests"
     for processor, kernels in ("Haswell", "AVX2"), ("Nehalem", "SSE4"), ("core2duo", "none"):
@@ -136,25 +137,25 @@ def everyday(row):
 
 
 def coverage(row):
-    """Every piece of code in utils/ run, every branch taken both ways."""
+    """Checks that the tests run every code region of utils/ and take every branch both ways."""
     row.build("mirel_tests", cxx="clang++", flags="-O1 -g -fprofile-instr-generate -fcoverage-mapping "
               "-mllvm -runtime-counter-relocation")
     row.run("tools/coverage.py", row.dir)
 
 
 def threads(row):
-    """The tests of threads, many times: a race doesn't show in every run."""
+    """Runs the tests of threads many times: a race doesn't show in every run."""
     row.build("mirel_tests", cxx="clang++", flags="-O1 -g -fsanitize=thread")
     row.run(row.dir / "tests" / "mirel_tests", "--gtest_filter=Thread*", "--gtest_repeat=20")
 
 
 def fuzz(row):
-    """Each fuzzer for a short time, from the seeds."""
+    """Runs each fuzzer for a short time, from the seeds."""
     row.run("tools/fuzz.sh", FUZZ_SECONDS)
 
 
 def long_tests(row):
-    """Everything that can be tried, and more than 4 GiB. The rows before it are done: it takes all the memory."""
+    """Runs the exhaustive tests, and those of more than 4 GiB; last, because they take all the memory."""
     row.build("mirel_long_tests", flags="-O2")
     row.run(row.dir / "tests" / "mirel_long_tests", "--gtest_brief=1", errors=None)  # it shows its progress there
 
@@ -167,7 +168,7 @@ def mutants(row):
 HARDENING = ("-O2 -D_FORTIFY_SOURCE=2 -D_GLIBCXX_ASSERTIONS -fstack-protector-strong -fstack-clash-protection "
              "-fcf-protection -Wformat -Werror=format-security -fPIE")
 SHARED = "-DBUILD_SHARED_LIBS=ON"
-# Debian's fmt is for its own standard library and processor, and its headers convert implicitly.
+# Debian's fmt is built for libstdc++ and the native processor, and its headers convert implicitly.
 NO_FMT = "-DCMAKE_DISABLE_FIND_PACKAGE_fmt=ON"
 
 
@@ -178,7 +179,7 @@ def libcxx(std, flags, *options, exhaustive=True):
 
 ROWS = [
     Row("AArch64 under emulation", suite(cxx="aarch64-linux-gnu-g++", flags="-O2", options=("--preset", "aarch64"))),
-    # Of the emulated processors AArch64 alone has kernels, for which such tests are written.
+    # Of the emulated processors only AArch64 has kernels, for which the exhaustive tests are written.
     Row("s390x under emulation, big-endian", emulated("s390x", exhaustive=False)),
     Row("i686 under emulation, 32 bits", emulated("i686", emulator="i386", exhaustive=False,
         link="-static")),  # QEMU 7.2 hangs when a dynamic program of i686 forks
@@ -221,7 +222,7 @@ def print_row(name, result, seconds, note=""):
 
 
 def run_rows(rows, workers):
-    """Runs the rows, prints each as it ends, and gives the results in the order of the rows."""
+    """Runs the rows, prints each as it ends, and returns the results in the order of the rows."""
     with concurrent.futures.ThreadPoolExecutor(workers) as pool:
         pending = [pool.submit(row.attempt) for row in rows]
         for done in concurrent.futures.as_completed(pending):
@@ -245,7 +246,7 @@ def main():
     rows = [row for row in ROWS if wanted(row)]
     long_rows = [row for row in LONG_ROWS if arguments.long and wanted(row)]
     if arguments.list or not rows + long_rows:
-        print("\n".join(row.name for row in rows + long_rows) or "no row has such a word in its name")
+        print("\n".join(row.name for row in rows + long_rows) or "no row's name has one of the words")
         return 0 if arguments.list else 2
     OUT.mkdir(parents=True, exist_ok=True)
     start = time.monotonic()

@@ -1,14 +1,14 @@
 #!/usr/bin/python3
-"""Tells which code of utils/ the suite doesn't run, and which branches it takes one way only.
+"""Lists the code of utils/ that the tests don't run, and the branches that they take one way only.
 
 usage: coverage.py BUILD-DIRECTORY
 
-Runs the suite, built there with clang's -fprofile-instr-generate -fcoverage-mapping and -mllvm
--runtime-counter-relocation. The last keeps the counters in a file that the children write too, so that a violated
-precondition, which ends a process, is seen. What wasn't taken is a difference of counters, of which two threads at once
-lose some, so the tests of threads are left out. What a template does counts for all its instances together. A violated
-precondition counts as one for those behind it in the function too, since their counts are differences; that each is
-reported is what the tables of tests/PreconditionTest.cpp are for. Ends with 1 if anything is missed.
+The tests are built there with clang's -fprofile-instr-generate -fcoverage-mapping and -mllvm
+-runtime-counter-relocation. The last option keeps the counters in a file that child processes write too, so a violated
+precondition, which ends its process, is counted. The tests of threads are left out: a branch not taken is a difference of
+counters, and concurrent threads lose some counts. The instances of a template count together. A violated precondition
+also counts for those behind it in the function, since their counts are differences; the tables of
+tests/PreconditionTest.cpp check that each is reported. Exits with 1 if anything is missed.
 """
 
 import collections
@@ -19,10 +19,10 @@ import subprocess
 import sys
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
-# This one, and emulated ones that choose other kernels, or none.
+# This processor, and emulated ones with other kernels and without any.
 PROCESSORS = {"this": [], "sse4": ["qemu-x86_64", "-cpu", "Nehalem"], "none": ["qemu-x86_64", "-cpu", "core2duo"]}
-COMPILE_TIME = {"ConversionTables.cpp"}  # what is run by the compiler alone
-BY_THE_COMPILER = "// the compiler decides"  # the end of a line of which nothing is left in a program
+COMPILE_TIME = {"ConversionTables.cpp"}  # code that only the compiler runs
+BY_THE_COMPILER = "// the compiler decides"  # ends a line that generates no code
 
 
 def run_suite(build):
@@ -40,7 +40,7 @@ def run_suite(build):
 
 
 def region_counts(functions):
-    """{file: {(line, column) where a piece of code begins: how often it was run}}"""
+    """{file: {(line, column) where a code region begins: how often it was run}}"""
     counts = collections.defaultdict(lambda: collections.defaultdict(int))
     for function in functions:
         for line, column, _, _, count, file, _, kind in function["regions"]:
@@ -50,8 +50,8 @@ def region_counts(functions):
 
 
 def branch_counts(file):
-    """{(place, number at that place): [times true, times false]}; the parts of an assertion's condition have one
-    place, that of the assertion."""
+    """{(place, number at that place): [times true, times false]}; the parts of an assertion's condition share the
+    assertion's place."""
     counts = collections.defaultdict(lambda: [0, 0])
 
     def add(place, branches):
@@ -76,7 +76,7 @@ def main():
         if path.name in COMPILE_TIME:
             continue
         source = path.read_text().splitlines()
-        # Where neither way was taken the condition is a constant in all instances, or its code is in the other list.
+        # If neither way was taken, the condition is constant in all instances, or its code is in the other list.
         branches = {at: count for at, count in branch_counts(file).items() if any(count)}
         for (line, _), count in sorted(regions[file["filename"]].items()):
             if count == 0 and not source[line - 1].endswith(BY_THE_COMPILER):
@@ -86,7 +86,7 @@ def main():
             if (not true or not false) and not source[at[0] - 1].endswith(BY_THE_COMPILER):
                 missed += 1
                 print(f"{path.name}:{at[0]}: never {'true' if not true else 'false'}: {source[at[0] - 1].strip()}")
-        print(f"{path.name}: {len(regions[file['filename']])} pieces of code, {len(branches)} branches")
+        print(f"{path.name}: {len(regions[file['filename']])} code regions, {len(branches)} branches")
     print(f"{missed} missed")
     return missed > 0
 

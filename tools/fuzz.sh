@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Runs the fuzzers side by side, each for the given number of seconds: fuzz.sh [SECONDS]. They start from the seeds
-# and from what earlier runs have found, which stays in build/fuzz.
+# Runs the fuzzers in parallel, each for the given number of seconds: fuzz.sh [SECONDS]. They start from the seeds and
+# from the inputs that earlier runs have found, which stay in build/fuzz.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 seconds=${1:-60}

@@ -1,21 +1,21 @@
 """Shows mirel's vectors and strings as text in GDB and in LLDB.
 
-GDB runs this file by itself when it starts, if the file lies in its data directory, and with `source FILE` elsewhere,
-then in GDB's own namespace, hence the prefix on every name. LLDB runs it with `command script import FILE`.
+GDB runs this file when it starts, if the file lies in its data directory; `source FILE` runs it from elsewhere, in GDB's
+own namespace, so every name has a prefix. LLDB runs it with `command script import FILE`.
 """
 
 import codecs
 
 MIREL_TYPES = r"^mirel::(VectorOfByte|(xvector|basic_xstring|MovableString)<(char|unsigned short|short unsigned int)>)$"
 
-# So many elements are shown at most, whatever limit is set: a corrupt size must not keep the debugger busy.
+# The most elements that are shown, whatever limit is set: a corrupt size must not keep the debugger busy.
 MIREL_MOST = 1 << 20
 
 MIREL_ESCAPES = {'"': '\\"', "\\": "\\\\", "\n": "\\n", "\r": "\\r", "\t": "\\t"}
 
 
 def mirel_escaped(character, width, charset):
-    """A character as it is shown; what wasn't well-formed has come here as a surrogate."""
+    """A character as it is shown; malformed text has been decoded to surrogates."""
     code = ord(character)
     if character in MIREL_ESCAPES:
         return MIREL_ESCAPES[character]
@@ -29,7 +29,7 @@ def mirel_escaped(character, width, charset):
 
 
 def mirel_literal(units, width, order, charset, is_cut):
-    """Code units as a literal: octal escapes are bytes, the others are code points or lone UTF-16 units."""
+    """Code units as a literal: octal escapes are bytes, other escapes are code points or unpaired surrogates."""
     encoding, errors = ("utf-8", "surrogateescape") if width == 1 else (f"utf-16-{order}", "surrogatepass")
     text = codecs.getincrementaldecoder(encoding)(errors).decode(units, final=not is_cut)
     escaped = "".join(mirel_escaped(character, width, charset) for character in text)
@@ -37,7 +37,7 @@ def mirel_literal(units, width, order, charset, is_cut):
 
 
 class MirelFault(Exception):
-    """Why an object can't be shown, in words."""
+    """The reason why an object can't be shown."""
 
     kind = "corrupt or uninitialised"
 
@@ -49,16 +49,16 @@ class MirelUnavailable(MirelFault):
 
 
 class MirelObject:
-    """A vector or string of the program, as far as no debugger is needed to understand it.
+    """A vector or string of the program, whatever the debugger.
 
-    A subclass for a debugger has a `width`, the bytes of an element, a byte `order`, "le" or "be", a `charset` of the
-    terminal, and these two, which raise MirelFault:
-      fields()              where the storage is, the size and the capacity, in bytes
-      read(address, count)  so many bytes of the program's memory
+    A subclass for a debugger has the `width` of an element in bytes, the byte `order`, "le" or "be", the `charset` of the
+    terminal, and these two methods, which raise MirelFault:
+      fields()              the address of the storage, and the size and the capacity in bytes
+      read(address, count)  count bytes of the program's memory
     """
 
     def check(self):
-        """The three fields, if they can be true."""
+        """The three fields; raises MirelFault if they contradict each other."""
         address, size, capacity = self.fields()
         if size < 0:
             raise MirelFault(f"its size is negative, {size} bytes")
@@ -76,7 +76,7 @@ class MirelObject:
         return address, size, capacity
 
     def summary(self, limit):
-        """The text up to so many elements, or any number of them where the limit is None or 0; or what is wrong."""
+        """The text, up to limit elements unless that is None or 0; or what is wrong with the object."""
         try:
             address, size, capacity = self.check()
             shown = min(size // self.width, limit or MIREL_MOST, MIREL_MOST) * self.width
@@ -88,7 +88,7 @@ class MirelObject:
 
 
 class MirelInGdb(MirelObject):
-    """A pretty-printer of GDB. Everything is read anew at each call, as a front end may keep it while it steps."""
+    """A pretty-printer of GDB. Each call reads everything anew, since a front end may keep a printer while it steps."""
 
     def __init__(self, value):
         self.value = value
@@ -118,7 +118,7 @@ class MirelInGdb(MirelObject):
 
     @property
     def charset(self):
-        """GDB takes the text in the program's character set and writes it unchanged."""
+        """The character set, if the program's and the terminal's are the same: GDB writes the text unchanged."""
         try:
             charsets = {codecs.lookup(name).name for name in (gdb.target_charset(), gdb.host_charset())}
         except (LookupError, AttributeError):
@@ -132,7 +132,7 @@ class MirelInGdb(MirelObject):
 
 
 class MirelWithElements(MirelInGdb):
-    """Adds the elements, which front ends show in place of the text."""
+    """Adds the elements, which front ends show instead of the text."""
 
     def children(self):
         try:
@@ -147,7 +147,7 @@ class MirelWithElements(MirelInGdb):
 
 
 class MirelInLldb(MirelObject):
-    """What LLDB's summary is made of; its strings are UTF-8, whatever the terminal."""
+    """Makes LLDB's summary; LLDB's strings are UTF-8, whatever the terminal."""
 
     charset = "utf-8"
 
@@ -178,7 +178,7 @@ class MirelInLldb(MirelObject):
 
 
 class MirelElementsInLldb:
-    """What LLDB shows below the summary, once its category is enabled."""
+    """Shows the elements below LLDB's summary, once their category is enabled."""
 
     def __init__(self, value, _):
         self.object = MirelInLldb(value)
@@ -225,7 +225,7 @@ except ImportError:
 else:
     try:
         gdb.parameter("print mirel-elements")
-    except RuntimeError:  # it wasn't run before
+    except RuntimeError:  # this is the first run
         class MirelElements(gdb.Parameter):
             """Whether the elements of mirel's vectors and strings are shown beside their text."""
 

@@ -1,14 +1,14 @@
 #!/usr/bin/python3
-"""Breaks the library in small ways, one at a time, and sees whether the suite notices.
+"""Breaks the library in small ways, one at a time, and checks whether the tests notice.
 
 usage: mutants.py [--jobs N] [NUMBER...]
-       mutants.py --check    builds nothing; ends with 1 if some mutant no longer fits the source
+       mutants.py --check    builds nothing; exits with 1 if a mutant no longer fits the source
 
-The mutants stand in tools/mutants.txt, a file's name and below it pairs of lines: what stands in the source, once,
-and what is put in its place, with \\n for the end of a line. Each is built in a copy of the tree, one copy for each
-processor, with the address sanitizer, which notices what happens to go well on this machine; those of a file that is
-marked as Release are noticed by the tests of an ordinary build alone. Ends with 1 if one survives. A mutant that makes
-a loop endless is noticed too, by the time that it takes.
+tools/mutants.txt lists the mutants: a file's name, and below it pairs of lines, a text that occurs once in the source
+and its replacement, with \\n for the end of a line. Each mutant is built in a copy of the tree, one copy for each
+processor, with the address sanitizer, which notices errors that happen to do no harm on this machine. A file marked
+"Release" gets an ordinary build, whose tests alone must notice. A mutant with an endless loop is killed when its time is
+up. Exits with 1 if a mutant survives.
 """
 
 import argparse
@@ -26,13 +26,13 @@ OUT = ROOT / "build" / "mutants"
 
 
 def read_mutants():
-    """(kind of build, file, what stands there, what is put there) of each."""
+    """(kind of build, file, original text, replacement) of each."""
     mutants, kind, file, original = [], None, None, None
     for line in (ROOT / "tools" / "mutants.txt").read_text().splitlines():
         line = line.replace("\\n", "\n")
         if line.startswith("- "):
             original = line[2:]
-        elif line.startswith("+"):  # nothing may stand behind it
+        elif line.startswith("+"):  # the replacement may be empty
             mutants.append((kind, file, original, line[2:]))
         elif line and not line.startswith("#"):
             file, _, kind = line.partition(", ")
@@ -40,11 +40,11 @@ def read_mutants():
 
 
 def is_stale(number, _kind, file, original, _replacement):
-    """Whether a mutant can't be made, because the source was changed under it; says so."""
+    """Whether the source has changed so that a mutant no longer fits; prints that."""
     path = ROOT / file
     found = path.read_text().count(original) if path.exists() else 0
     if found != 1:
-        print(f"mutant {number}: {file} has {found} in place of one: {original}")
+        print(f"mutant {number}: must occur once in {file}, occurs {found} times: {original}")
     return found != 1
 
 
@@ -57,13 +57,13 @@ class Build:
 
     def __init__(self, tree, build, kind):
         self.build, self.test_seconds = build, None
-        shutil.rmtree(build, ignore_errors=True)  # what an interrupted run has left may be broken
+        shutil.rmtree(build, ignore_errors=True)  # an interrupted run may have left a broken one
         self.run("cmake", "-S", tree, "-B", build, "-G", "Ninja", *BUILDS[kind], "-DMIREL_BUILD_EXAMPLES=OFF",
                  "-DMIREL_BUILD_TESTS=ON").check_returncode()
         start = time.monotonic()
         if self.verdict() != "survived":
             raise RuntimeError(f"the suite fails as it is, in {build}")
-        self.test_seconds = time.monotonic() - start  # with the build, and so much more than the tests alone take
+        self.test_seconds = time.monotonic() - start  # including the build, so much longer than the tests alone
 
     def run(self, *command, timeout=None, **env):
         return subprocess.run(command, stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, stderr=subprocess.STDOUT,
@@ -85,7 +85,7 @@ class Build:
 
 
 class Copy:
-    """A copy of the tree, and the builds of it that have been needed."""
+    """A copy of the tree, and the builds made of it so far."""
 
     def __init__(self, number):
         self.number, self.tree, self.builds = number, OUT / f"tree{number}", {}

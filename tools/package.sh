@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Builds the Debian packages for amd64 and arm64 in build/package, and checks them: what lintian says, the binary
-# interface beside the last version's, and their use in a bare root.
+# Builds the Debian packages for amd64 and arm64 in build/package, and checks them: runs lintian, compares the binary
+# interface with the last version's, and uses the packages in a bare root.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 out=$PWD/build/package
@@ -22,8 +22,8 @@ build() { # ARCHITECTURE [OPTION...]
   done
 }
 
-# Compares the binary interface with the one that is kept. From that version on functions may only be added; within the
-# version, as long as it isn't released, all may change, and is kept anew.
+# Compares the binary interface with the stored description. A later version may only add functions; the described
+# version may change in every way until it is released, and is then described again.
 compare_interfaces() {
   local kept=(debian/abi/*.xz) version
   say "comparing the binary interface with ${kept[0]}"
@@ -33,16 +33,16 @@ compare_interfaces() {
     usr/lib/*/libmirel_utils.so.*.*.*) >"$out/new.abi"
   xz -dc "${kept[0]}" >"$out/old.abi"
   abidiff --no-added-syms --suppressions debian/abi/suppressions "$out/old.abi" "$out/new.abi" && return
-  [ $(($? & 3)) = 0 ] || exit 1 # it couldn't compare
-  echo "To keep this interface: xz -9c $out/new.abi >debian/abi/$version.xz"
+  [ $(($? & 3)) = 0 ] || exit 1 # abidiff failed
+  echo "To store this interface: xz -9c $out/new.abi >debian/abi/$version.xz"
   [ "${kept[0]}" = "debian/abi/$version.xz" ] || exit 1
 }
 
-# A bare root with what programs are compiled by, from the archive that apt uses here; made once.
+# Makes, once, a bare root with what it takes to compile programs, from the archive that apt uses here.
 make_base() {
   [ ! -e "$out/base.tar" ] || return 0
   local format='deb $(REPO_URI) $(RELEASE) $(COMPONENT)'
-  # Where apt has no lists, it doesn't know yet which of its archives are Debian's.
+  # Without its lists, apt doesn't know which of its archives are Debian's.
   [ -n "$(apt-get indextargets 'Created-By: Packages' 'Origin: Debian')" ] || $as_root apt-get update >/dev/null
   apt-get indextargets --format "$format" 'Created-By: Packages' 'Origin: Debian' >"$out/sources.list"
   $as_root mmdebstrap --quiet --mode=root --variant=apt --include=g++,make,cmake,pkg-config '' "$out/partial.tar" \
@@ -51,12 +51,12 @@ make_base() {
 }
 
 mkdir -p "$out"
-trap wait EXIT # leaves nothing behind that still works on the root
+trap wait EXIT # a process may still be at work on the root
 make_base &
 base=$!
 build amd64 -b
 compare_interfaces
-build arm64 -B -aarm64 -d -Pcross,nocheck # without arm64's own packages: only headers are needed
+build arm64 -B -aarm64 -d -Pcross,nocheck # -d: only headers are needed, so no packages of arm64
 qemu-aarch64 -L /usr/aarch64-linux-gnu -E LD_LIBRARY_PATH="$out/arm64/root/usr/lib/aarch64-linux-gnu" \
   "$out/arm64/root/usr/bin/transcode" --version
 say 'making a bare root'

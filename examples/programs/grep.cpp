@@ -1,4 +1,4 @@
-// Prints the lines of a file that have a text in them, with the lines around them, and where in the line the
+// Prints the lines of a file that contain a text, with the lines around them, and the column at which the
 // text begins. Columns count code points.
 
 #include <algorithm>
@@ -41,7 +41,7 @@ int main(int argc, char** argv) {
   };
 
   const std::size_t lines = begins.size() - 1, around = static_cast<std::size_t>(context);
-  std::size_t printed = 0; // lines before this one are done with
+  std::size_t printed = 0; // the lines before this one are done
   for (std::size_t i = 0; i < lines; ++i) {
     if (line(i).find(needle) == std::string_view::npos)
       continue;

@@ -1,5 +1,5 @@
-// A text buffer in UTF-16, as an editor has it: every edit can be undone and redone, and backspace takes a
-// code point, not half of a surrogate pair.
+// A text buffer in UTF-16 for an editor: every edit can be undone and redone, and backspace erases a code
+// point, not half of a surrogate pair.
 
 #include <iostream>
 #include <utility>
@@ -17,7 +17,7 @@ class Buffer {
 public:
   const string16& Text() const { return m_text; }
 
-  /// Puts a text in the place of n units from index i on.
+  /// Replaces n units from index i on by a text.
   void Replace(ssize_t i, ssize_t n, const string16& by) {
     m_undone.clear();
     m_done.push_back(Exchange({i, by, n}));
@@ -37,7 +37,7 @@ public:
   bool Redo() { return Step(m_undone, m_done); }
 
 private:
-  /// The text that goes in the place of n units from index i on. Vectors of these grow without copying text.
+  /// Replaces n units from index i on by a text. Vectors of edits grow without copying text.
   struct Edit {
     ssize_t i;
     mstring16 text;

@@ -1,5 +1,5 @@
-// The text of a JSON string. Its escapes name UTF-16 code units, so it is put together in UTF-16: halves of a
-// surrogate pair meet there by themselves, and one that stays alone becomes U+FFFD on the way to UTF-8.
+// Decodes JSON strings. Their escapes name UTF-16 code units, so the text is built in UTF-16: two surrogates
+// become a pair there by themselves, and the conversion to UTF-8 replaces an unpaired one by U+FFFD.
 
 #include <charconv>
 #include <iostream>
@@ -13,7 +13,7 @@ using mirel::ssize_t;
 using mirel::string16;
 using mirel::string8;
 
-/// Appends the unit that an escape stands for; rest is what follows the backslash, and loses what is used.
+/// Appends the unit of an escape. rest begins behind the backslash; the escape is removed from it.
 bool AppendEscape(string16& text, std::string_view& rest) {
   constexpr std::string_view kLetters = "\"\\/bfnrt", kUnits = "\"\\/\b\f\n\r\t";
   const char letter = rest.empty() ? '\0' : rest.front();
@@ -32,7 +32,7 @@ bool AppendEscape(string16& text, std::string_view& rest) {
   return true;
 }
 
-/// Replaces text by what stands between the quotes. @return the index at which json is at fault, or npos
+/// Sets text to the contents of the quotes. @return the index of the first error in json, or npos
 ssize_t Unescape(string8& text, std::string_view json) {
   string16 units;
   std::string_view rest = json;
@@ -40,11 +40,11 @@ ssize_t Unescape(string8& text, std::string_view json) {
   if (rest.empty() || rest.front() != '"')
     return here();
   for (rest.remove_prefix(1);;) {
-    const std::string_view plain = rest.substr(0, rest.find_first_of("\"\\"));
-    if (const ssize_t at = mirel::FindMalformed(plain); at >= 0)
+    const std::string_view literal = rest.substr(0, rest.find_first_of("\"\\"));
+    if (const ssize_t at = mirel::FindMalformed(literal); at >= 0)
       return here() + at;
-    mirel::AppendUtf16(units, plain);
-    rest.remove_prefix(plain.size());
+    mirel::AppendUtf16(units, literal);
+    rest.remove_prefix(literal.size());
     const bool isEscape = !rest.empty() && rest.front() == '\\';
     if (rest.empty() || (!isEscape && rest.size() > 1))
       return here();
@@ -64,7 +64,7 @@ int main() {
         "\"\xC3\"", R"("\x")", R"("")"}) {
     string8 text;
     if (const ssize_t at = Unescape(text, json); at >= 0)
-      std::cout << json.size() << " bytes, at fault at " << at << '\n';
+      std::cout << json.size() << " bytes, error at byte " << at << '\n';
     else
       std::cout << '<' << text << ">\n";
   }
@@ -73,9 +73,9 @@ int main() {
 /* Prints:
 <a	b "quoted" é>
 <Grüße, 😀 and � alone>
-6 bytes, at fault at 3
-5 bytes, at fault at 5
-3 bytes, at fault at 1
-4 bytes, at fault at 3
+6 bytes, error at byte 3
+5 bytes, error at byte 5
+3 bytes, error at byte 1
+4 bytes, error at byte 3
 <>
 */

@@ -1,4 +1,4 @@
-// The standard algorithms over our containers: iterators are pointers, so each of them takes them.
+// The standard algorithms take our containers, whose iterators are pointers.
 
 #include <algorithm>
 #include <cstdio>

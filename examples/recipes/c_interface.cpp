@@ -1,4 +1,4 @@
-// Text to and from a C interface in UTF-16, as system and database libraries have them.
+// Text to and from a C interface in UTF-16, such as those of system and database libraries.
 
 #include <cstdint>
 #include <cstdio>
@@ -11,8 +11,8 @@ using mirel::string8;
 
 extern "C" {
 
-// The interface: a zero-terminated run, and a result that is written into the caller's buffer. The length
-// that the result has is returned also where there is no room for it.
+// The interface: null-terminated text, and a result that is written into the caller's buffer. The length of
+// the result is returned even if it doesn't fit.
 int CountUnits(const uint16_t* text) {
   int count = 0;
   while (text[count] != 0)

@@ -1,8 +1,8 @@
-// Which call had a bad argument: a handler for SIGABRT that writes the call stack behind the assertion's
+// Finds the call that had a bad argument: a handler for SIGABRT writes the call stack after the assertion's
 // report.
 //
-// It writes lines such as "PROGRAM(+0x123f) [0x5646123f]". Where PROGRAM was built with -g, the command
-// `addr2line -Cfipe PROGRAM +0x123f` turns what is in parentheses into a function, a file and a line.
+// It writes lines such as "PROGRAM(+0x123f) [0x5646123f]". If PROGRAM was built with -g, the command
+// `addr2line -Cfipe PROGRAM +0x123f` turns the address in parentheses into a function, a file and a line.
 
 #include <csignal>
 #include <cstdio>
@@ -17,12 +17,12 @@
 using mirel::ssize_t;
 using mirel::string8;
 
-// When it returns, abort() ends the process as it would have without it, with a core file where those are on.
+// When the handler returns, abort() ends the process as usual, with a core file if these are enabled.
 void WriteCallStack(int) {
   void* frames[64];
   const int n = backtrace(frames, 64);
   for (int i = 0; i < n; ++i)
-    frames[i] = static_cast<char*>(frames[i]) - 1; // behind a call there may be another line, or function
+    frames[i] = static_cast<char*>(frames[i]) - 1; // the return address may be on another line or function
   backtrace_symbols_fd(frames, n, STDERR_FILENO);
 }
 
@@ -33,10 +33,10 @@ void InstallHandler() {
 }
 
 int PortOf(const string8& address) {
-  return std::atoi(address.substr(address.find(':') + 1, 4).c_str()); // a mistake: it may have fewer digits
+  return std::atoi(address.substr(address.find(':') + 1, 4).c_str()); // a bug: it may have fewer digits
 }
 
-// What a process that makes the mistake writes to its standard error.
+// Returns what a process with the bug writes to standard error.
 string8 Report() {
   int ends[2];
   if (pipe(ends) != 0)

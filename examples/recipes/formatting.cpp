@@ -18,7 +18,7 @@ using mirel::string8;
 int main() {
   string8 name = "Ada Lovelace";
 
-  // printf counts in int. With a count it needs no terminator and prints up to the first zero, if there is
+  // printf counts in int. With a count it needs no terminator, and prints up to the first null if there is
   // one.
   std::printf("<%.*s> <%.3s>\n", static_cast<int>(name.size()), name.data(), name.c_str());
   std::fflush(stdout);
@@ -27,7 +27,7 @@ int main() {
 
   std::cout << formatting::format("<{}> <{:_>16}> <{:.3}>\n", name, name, name);
 
-  // A string16 comes out as UTF-8, with U+FFFD where it is malformed.
+  // A string16 is written as UTF-8, with U+FFFD in place of malformed text.
   string16 wide = mirel::ToString16(u"Zoë");
   wide.push_back(0xD800);
   std::cout << formatting::format("<{}> <{:*^8.3}>\n", wide, wide);

@@ -1,5 +1,5 @@
-// Strings as keys of maps. By Less, or Hash and Equal, a map is searched with a literal, a view or a string
-// of either kind, and no key is made for it.
+// Strings as keys of maps. With Less, or Hash and Equal, a map is searched by a literal, a view or a string
+// of either kind, without making a key.
 
 #include <cstdio>
 #include <map>

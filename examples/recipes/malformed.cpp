@@ -1,5 +1,5 @@
-// Text from outside, which may be malformed: where and why, what to do about it, and walking it by code
-// points.
+// Text from outside, which may be malformed: find out where and why, replace what is malformed, and walk the
+// code points.
 
 #include <cstdio>
 #include <string_view>
@@ -13,19 +13,19 @@ using mirel::string8;
 int main() {
   const std::string_view input = "caf\xC3\xA9 \xC0\xAF \xF0\x9F\x98\x80\xE2\x82";
 
-  // What is wrong, as a message has it.
+  // Say what is wrong.
   if (const ssize_t at = mirel::FindMalformed(input); at >= 0) {
     const mirel::MalformedText fault = mirel::ExplainMalformed(input, at);
     std::printf("%s at byte %jd\n", Describe(fault.reason), fault.offset);
   }
 
-  // With U+FFFD where it is malformed; the lengths are known before.
+  // Convert, with U+FFFD in place of malformed text. The lengths could be asked for before.
   string16 wide;
   const ssize_t replaced = mirel::Utf16FromUtf8Lossy(wide, input);
   std::printf("%td replaced, %td units, %td code points\n", replaced, wide.size(),
               mirel::CountCodePoints(input));
 
-  // One code point after the other, into another string.
+  // Append one code point after the other to another string.
   string8 spaced;
   for (const char32_t c : mirel::CodePoints(wide)) {
     mirel::AppendCodePoint(spaced, c);
@@ -34,7 +34,7 @@ int main() {
   }
   std::printf("%s\n", spaced.c_str());
 
-  // In pieces, as it comes from a socket, which may cut it anywhere.
+  // Convert in pieces, as they arrive from a socket, which may cut the text anywhere.
   mirel::Utf8Stream stream(mirel::OnMalformed::kReplace);
   string16 received;
   for (const char& byte : input)

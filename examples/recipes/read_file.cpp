@@ -1,5 +1,5 @@
-// A whole file in a string: FillFrom() lets the reader write where the text will stand, and no byte is
-// written twice.
+// Reads a whole file into a string. FillFrom() lets the reader write directly into the string's storage, so
+// no byte is written twice.
 
 #include <algorithm>
 #include <cerrno>
@@ -15,7 +15,7 @@
 using mirel::ssize_t;
 using mirel::string8;
 
-// From a C stream, whose size tells how much storage it takes. A descriptor's read() is used likewise.
+// Reads a C stream. The file's size says how much storage it takes. A descriptor's read() is used likewise.
 string8 ReadFile(const char* name) {
   const std::unique_ptr<FILE, int (*)(FILE*)> file(std::fopen(name, "rb"), std::fclose);
   if (!file)
@@ -24,13 +24,13 @@ string8 ReadFile(const char* name) {
   mirel::FillFrom(bytes, std::filesystem::file_size(name), [&](char* p, ssize_t n) {
     const std::size_t got = std::fread(p, 1, static_cast<std::size_t>(n), file.get());
     if (std::ferror(file.get()))
-      throw std::system_error(errno, std::generic_category(), name); // and the string is as it was
-    return got;                                                      // less where the file was cut meanwhile
+      throw std::system_error(errno, std::generic_category(), name); // the string stays as it was
+    return got; // less if the file was truncated meanwhile
   });
   return bytes;
 }
 
-// From a standard stream of unknown length, block by block. Storage grows as with any other edits.
+// Reads a standard stream of unknown length, block by block. The storage grows as with any other edits.
 string8 ReadStream(std::istream& stream) {
   string8 bytes;
   while (mirel::FillFrom(bytes, 65536, [&](char* p, ssize_t n) { return stream.read(p, n).gcount(); }) > 0)

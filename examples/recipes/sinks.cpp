@@ -1,4 +1,4 @@
-// What an xostream writes to: a string, a C stream, and a POSIX file descriptor such as a socket's.
+// Sinks that an xostream writes to: a string, a C stream, and a POSIX file descriptor such as a socket's.
 
 #include <cerrno>
 #include <cstdio>
@@ -16,7 +16,7 @@
 using mirel::ssize_t;
 using mirel::string8;
 
-// What a sink throws leaves the stream member that wrote.
+// An exception of a sink passes through the stream's member that wrote.
 void Check(bool good) {
   if (!good)
     throw std::system_error(errno, std::generic_category());
@@ -41,8 +41,8 @@ struct FileSink : mirel::IOutputStream {
   FILE* file;
 };
 
-// A descriptor takes as much as it likes, and may be busy or interrupted. A socket whose reader has gone also
-// raises SIGPIPE, which a program that writes to one ignores.
+// A descriptor may take fewer bytes, be busy or be interrupted. A socket without a reader also raises
+// SIGPIPE, which a program that writes to sockets ignores.
 struct DescriptorSink : mirel::IOutputStream {
   explicit DescriptorSink(int d) : descriptor(d) {}
   void WriteStream(const void* address, ssize_t count) override {
@@ -59,7 +59,7 @@ struct DescriptorSink : mirel::IOutputStream {
       }
     }
   }
-  void FlushStream() override {} // nothing is kept back
+  void FlushStream() override {} // nothing is buffered
 
   int descriptor;
   int writes = 0; // only this example counts them

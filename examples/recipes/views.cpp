@@ -1,4 +1,4 @@
-// Views of our strings, and strings from views: what other interfaces take and give.
+// Views of our strings, and strings made from views.
 
 #include <cstdio>
 #include <string>
@@ -14,10 +14,9 @@ using mirel::char16;
 using mirel::string16;
 using mirel::string8;
 
-// A string16 is seen through a span, or before C++20 through the two pointers that a span stands for. A
-// u16string_view may not look at it: its units are uint16_t, which may not be read through a char16_t*,
-// another type. Nor is there a basic_string_view of uint16_t: the standard has character traits for character
-// types only.
+// Pass a string16 as a span, or before C++20 as a pair of pointers. A u16string_view can't refer to it: its
+// units are uint16_t, which may not be read through a char16_t*. Nor is there a basic_string_view of
+// uint16_t: the standard has character traits for character types only.
 #if defined(__cpp_lib_span)
 int Sum(std::span<const char16> units) {
   int sum = 0;
@@ -42,9 +41,9 @@ int main() {
   std::string_view name = mirel::View(line);
   name.remove_suffix(name.size() - name.find(' '));
 
-  const string8 copy = mirel::ToString8(name); // with all its zeros
+  const string8 copy = mirel::ToString8(name); // nulls included
   string8 reused;
-  reused.assign(name.begin(), name.end()); // into storage that is there already
+  reused.assign(name.begin(), name.end()); // keeps storage that is large enough
 
   const std::string standard = mirel::ToString(line);
   const string8 back = mirel::ToString8(standard);

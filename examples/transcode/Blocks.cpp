@@ -7,23 +7,23 @@ namespace transcode {
 
 namespace {
 
-/// What a pipe holds. A block stays in the cache while it is decoded, counted and written; from half to four
-/// times the size was no faster.
+/// The capacity of a pipe. A block stays in the cache while it is decoded, counted and written; blocks of
+/// half the size and up to four times the size were no faster.
 constexpr ssize_t kBlock = 1 << 16;
-/// The most bytes that a block leaves to the next one: of a UTF-8 sequence, a unit and a half of UTF-16, or
-/// of a unit of UTF-32.
+/// The most bytes that a block leaves to the next one: part of a UTF-8 sequence, one and a half UTF-16 units,
+/// or part of a UTF-32 unit.
 constexpr ssize_t kMaxUnfinished = 3;
 
-/// The first of some units, which are well-formed, and what comes behind them: nothing, the beginning of a
-/// sequence, or a malformed one.
+/// The well-formed units at the beginning of a text, and what follows them: nothing, an incomplete sequence,
+/// or a malformed one.
 struct Piece {
   ssize_t size;
-  ssize_t malformed;  ///< the units of the malformed sequence
-  const char* reason; ///< null where it is none
+  ssize_t malformed;  ///< the number of units of the malformed sequence
+  const char* reason; ///< null if there is none
 };
 
-/// Finds the first fault of UTF-8 or UTF-16. What the next block may complete, as a stream would keep it, is
-/// none.
+/// Finds the first fault of UTF-8 or UTF-16. A sequence at the end that the next block may complete isn't a
+/// fault; a stream decides that.
 template <class T> Piece FindPiece(const T* p, ssize_t n, bool isEnd) {
   const ssize_t size = mirel::FindMalformed(p, n);
   if (size < 0)
@@ -84,7 +84,7 @@ bool Blocks::Next() {
   return true;
 }
 
-/// Sets the block to what is well-formed, replaced or dropped.
+/// Decodes the buffer as far as it is well-formed, replaced or dropped; that is the block.
 void Blocks::Decode(bool isEnd) {
   m_utf8.clear();
   m_resumptions.clear();
@@ -104,14 +104,14 @@ void Blocks::Decode(bool isEnd) {
   case Form::kLatin1:
   case Form::kAscii: DecodeBytes(); break;
   }
-  const ssize_t rest = m_filled - m_size; // a part of a unit?
+  const ssize_t rest = m_filled - m_size;
   if (isEnd && rest > 0 && rest < UnitSize(m_from.form) &&
       GoesOnBehind({m_size, Describe(mirel::MalformedReason::kTruncated)}, rest))
     m_size = m_filled;
 }
 
-/// The order that the first bytes tell. Without a mark it is big-endian: RFC 2781, section 4.3, and the
-/// Unicode Standard, definitions D98 and D101.
+/// Reads the byte order from the mark. Without one it is big-endian: RFC 2781, section 4.3, and the Unicode
+/// Standard, definitions D98 and D101.
 ByteOrder Blocks::OrderByMark() const {
   const ssize_t size = UnitSize(m_from.form);
   const std::string_view mark =
@@ -146,8 +146,8 @@ void Blocks::DecodeUtf16(bool isEnd) {
                  [isEnd](const char16* p, ssize_t n) { return FindPiece(p, n, isEnd); });
 }
 
-/// Converts all units at once, which is the fast path. @return how many make whole sequences, or -1 where one
-/// of them is malformed and the stream doesn't replace it
+/// Converts all units at once: the fast path. @return how many units make complete sequences, or -1 if one is
+/// malformed and the stream doesn't replace it
 template <class Stream, class CharOut, class CharIn>
 ssize_t Blocks::DecodeWhole(mirel::basic_xstring<CharOut>& dst, const CharIn* p, ssize_t n, bool isEnd) {
   // A stream replaces by U+FFFD only, and drops nothing.
@@ -183,7 +183,7 @@ void Blocks::DecodeBytes() {
   DecodePieces(m_units16.data(), m_filled, FindPieceOfAscii);
 }
 
-/// Decodes a block that isn't known to be well-formed.
+/// Decodes the block piece by piece, with a fault after each piece but the last.
 template <class T, class FindPiece> void Blocks::DecodePieces(const T* p, ssize_t n, FindPiece findPiece) {
   const ssize_t unitSize = UnitSize(m_from.form);
   m_text.clear();
@@ -200,7 +200,7 @@ template <class T, class FindPiece> void Blocks::DecodePieces(const T* p, ssize_
   }
 }
 
-/// Notes a fault of as many bytes, and replaces it if it is to be. @return whether the text goes on behind it
+/// Notes a fault of length bytes, and replaces it in kReplace. @return whether decoding continues after it
 bool Blocks::GoesOnBehind(const Fault& fault, ssize_t length) {
   if (m_faults == 0)
     m_fault = fault;

@@ -1,4 +1,4 @@
-// The input, taken block by block, and what each block is as UTF-16 and UTF-8.
+// Reads the input block by block, and decodes each block to UTF-16 and UTF-8.
 
 #pragma once
 
@@ -14,8 +14,8 @@
 
 namespace transcode {
 
-/// What is done with text that is malformed or that the output's encoding lacks, and whether there is more to
-/// do than to look for it.
+/// What to do with text that is malformed or that the output's encoding lacks. kCheck only looks for
+/// malformed text.
 enum class Mode { kConvert, kReplace, kDrop, kCheck };
 
 /// Where the first malformed sequence of a block is, in bytes, and what is wrong with it.
@@ -24,42 +24,43 @@ struct Fault {
   const char* reason;
 };
 
-/// Goes through a file in blocks that end between sequences.
+/// Reads a file in blocks that end between sequences.
 ///
-/// A block is there as UTF-16, and as UTF-8 for no more than a conversion: where the input is one of the two,
-/// it is that which checks the text, too. To look for faults alone takes none, and then blocks are there as
-/// they stand in the input only.
+/// A block is available as UTF-16 and as UTF-8, at the cost of one conversion: where the input is one of the
+/// two, the conversion to the other also checks the text. kCheck converts nothing, and only the bytes of a
+/// block are available.
 class Blocks {
 public:
-  /// The replacement is what stands for malformed text if that is replaced.
+  /// The replacement is the unit that replaces malformed text in kReplace.
   Blocks(Input& input, const Encoding& from, Mode mode, char16 replacement);
 
   /// Goes to the next block. @return false past the last one
   bool Next();
-  /// The first fault of the file, if it is in the block; the block ends before it if it ends the program.
+  /// The first fault of the file, if this block has it. If the fault ends the program, the block ends before
+  /// it.
   const std::optional<Fault>& FirstFault() const { return m_fault; }
-  /// How many malformed sequences have been replaced or dropped so far.
+  /// The number of malformed sequences that have been replaced or dropped so far.
   int64 Faults() const { return m_faults; }
 
-  /// The block as it stands in the input.
+  /// The bytes of the block in the input.
   std::string_view Bytes() const { return {m_buffer.data(), static_cast<std::size_t>(m_size)}; }
-  /// The code units of the input, of which those of the block come first: of UTF-16, and of UTF-32.
+  /// The code units of UTF-16 or UTF-32 input: those of the block, and then perhaps some of the next one.
   const string16& Units16() const { return m_hasOwnUnits ? m_units16 : m_text; }
   const std::u32string& Units32() const { return m_units32; }
   Form From() const { return m_from.form; }
-  /// The byte order of the units, which a mark has decided if it was to.
+  /// The byte order of the units; for kByMark, the one that the mark tells.
   ByteOrder Order() const { return m_order; }
 
   /// The text of the block, as UTF-16 in the machine's byte order and as UTF-8.
   const string16& Text() const { return m_text; }
   std::string_view Utf8();
-  /// Whether the text begins with a byte order mark that the file begins with.
+  /// Returns whether the text begins with the file's byte order mark.
   bool BeginsWithMark() const { return m_isFirst && !m_text.empty() && m_text[0] == kByteOrderMark; }
-  /// The bytes of the block that stand before an index of its text; not where U+FFFD replaces some.
+  /// The number of the block's bytes before an index of its text, unless U+FFFD replaces some of them.
   ssize_t OffsetOf(ssize_t index) const;
 
 private:
-  /// Where the text goes on behind a malformed sequence.
+  /// Where the text continues after a malformed sequence.
   struct Resumption {
     ssize_t offset; ///< in bytes of the block
     ssize_t index;  ///< in units of its text
@@ -81,11 +82,11 @@ private:
   const Mode m_mode;
   const char16 m_replacement;
   ByteOrder m_order;
-  bool m_isFirst = true; ///< whether the block is the first one
-  string8 m_buffer;      ///< the block, and behind it the start of a sequence that goes on in the next one
-  ssize_t m_filled = 0;  ///< bytes of the buffer that are of the input
-  ssize_t m_size = 0;    ///< bytes of the buffer that are of the block
-  bool m_hasOwnUnits = false; ///< whether the units of UTF-16 aren't the text, since that isn't well-formed
+  bool m_isFirst = true;      ///< whether the block is the first one
+  string8 m_buffer;           ///< the block, then the beginning of a sequence that the next block completes
+  ssize_t m_filled = 0;       ///< the number of bytes in the buffer
+  ssize_t m_size = 0;         ///< the number of bytes in the block
+  bool m_hasOwnUnits = false; ///< whether m_units16 isn't the text, because the input is malformed
   bool m_isChanged = false;   ///< whether anything in the block is replaced or dropped
   string16 m_text;
   string16 m_units16;

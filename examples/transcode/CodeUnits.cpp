@@ -48,7 +48,7 @@ ssize_t EncodedSize(Form form, const char16* p, ssize_t n) {
 }
 
 ssize_t LengthBelow(char16 limit, const char16* p, ssize_t n) {
-  constexpr ssize_t kAtOnce = 64; // compilers look at as many at once as a wide register has
+  constexpr ssize_t kAtOnce = 64; // compilers test a wide register of units at once
   const auto isBelow = [limit](const char16* begin) {
     char16 all = 0; // the limit is a power of two
     for (ssize_t i = 0; i < kAtOnce; ++i)

@@ -1,4 +1,4 @@
-// Text as code units, and as the bytes that they are.
+// Code units and their bytes.
 
 #pragma once
 
@@ -15,27 +15,27 @@ using mirel::ssize_t;
 using mirel::string16;
 using mirel::string8;
 
-/// The bytes of a code unit.
+/// The number of bytes of a code unit.
 ssize_t UnitSize(Form form);
-/// The bytes that units of UTF-16 take in a form.
+/// The number of bytes that n UTF-16 units take in a form.
 ssize_t EncodedSize(Form form, const char16* p, ssize_t n);
-/// How many of n units stand before the first that is at the limit or above.
+/// Counts the units before the first that is at the limit or above. The limit is a power of two.
 ssize_t LengthBelow(char16 limit, const char16* p, ssize_t n);
 
-/// Sets units to those that n bytes hold, of two bytes or of four; the part of a unit at the end is left out.
-/// The order is little or big.
+/// Reads units of two or four bytes from n bytes, in little or big order. Part of a unit at the end is left
+/// out.
 void ReadUnits(string16& units, const char* p, ssize_t n, ByteOrder order);
 void ReadUnits(std::u32string& units, const char* p, ssize_t n, ByteOrder order);
 
 std::string_view BytesOf(const string8& s);
 std::string_view BytesOf(const string16& s);
 
-/// Where the bytes of a text are put, if its units aren't these bytes already.
+/// Storage for the result of Encode().
 struct Room {
   string16 units;
   string8 bytes;
 };
-/// The bytes of a text of which the form has every code point. They stand in the text or in the room.
+/// Encodes a text in a form that has all its code points. The result refers to the text or to the room.
 std::string_view Encode(const string16& text, Form form, ByteOrder order, Room& room);
 
 } // namespace transcode

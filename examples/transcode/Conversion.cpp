@@ -17,7 +17,7 @@ std::optional<Output> OpenOutput(const Options& options) {
   return std::optional<Output>(std::in_place, options.output.empty() ? "-" : options.output);
 }
 
-/// In words: "U+20AC, which ascii lacks,".
+/// Returns a description: "U+20AC, which ascii lacks,".
 std::string Describe(const Lack& lack, const Encoding& to) {
   char name[16];
   std::snprintf(name, sizeof(name), "U+%04lX", static_cast<unsigned long>(lack.codePoint));
@@ -34,7 +34,7 @@ public:
   Result Run();
 
 private:
-  /// The file at hand.
+  /// The file that is being converted.
   struct File {
     const std::string& name;
     Statistics statistics = {};
@@ -106,7 +106,7 @@ void Conversion::TakeBlock(Blocks& blocks, File& file) {
   m_progress.Add(size);
 }
 
-/// @return the place of what is replaced or dropped. Anything else ends the program there.
+/// Returns the place of a fault that is replaced or dropped; any other fault ends the program there.
 std::string Conversion::GoOnBehind(const File& file, const std::string& what, const std::string& place) {
   if (m_options.mode == Mode::kReplace || m_options.mode == Mode::kDrop)
     return place;
@@ -115,7 +115,7 @@ std::string Conversion::GoOnBehind(const File& file, const std::string& what, co
   throw std::runtime_error(file.name + ": " + what + " at " + place);
 }
 
-/// Tells how many of something have been replaced or dropped, and where the first was: "2 malformed sequences
+/// Reports how many faults have been replaced or dropped, and where the first was: "2 malformed sequences
 /// replaced, the first at byte 3 (line 1, column 4)".
 void Conversion::Tell(const File& file, int64 count, const std::string& one, const std::string& many,
                       const std::string& first) {

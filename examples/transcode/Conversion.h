@@ -1,4 +1,4 @@
-// The whole run: the text of all files from the input to the output.
+// Converts the text of all files from input to output.
 
 #pragma once
 
@@ -8,15 +8,16 @@
 
 namespace transcode {
 
-/// What there is to say of a run that has come to its end.
+/// The outcome of a run that has reached its end.
 struct Result {
   bool isWell = true;   ///< whether no file that was checked has a fault
   std::string messages; ///< lines for standard error
   std::string reports;  ///< lines for standard output
 };
 
-/// @throw std::runtime_error with the first fault, unless files are only checked; the file that was to be
-/// written is left alone then
+/// Converts the files that the options name.
+/// @throw std::runtime_error with the first fault, unless files are only checked; the output file is then as
+/// it was
 Result Convert(const Options& options);
 
 } // namespace transcode

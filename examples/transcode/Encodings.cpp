@@ -20,10 +20,10 @@ constexpr Encoding kEncodings[] = {
     {"latin1", "iso-8859-1 iso-ir-100 l1 8859_1 cp819 ibm819", Form::kLatin1, ByteOrder::kNone},
     {"ascii", "us-ascii ansi_x3.4-1968 iso646-us us cp367 ibm367", Form::kAscii, ByteOrder::kNone}};
 
-/// What iconv lists behind each name, and takes options behind.
+/// iconv lists each name with this suffix, and takes options after it.
 constexpr std::string_view kSuffix = "//";
 
-/// A name without what doesn't count in it.
+/// Removes from a name what doesn't count: case, dashes and underscores.
 std::string Simplify(std::string_view name) {
   std::string simple;
   for (const char c : name)
@@ -42,10 +42,10 @@ std::vector<std::string> NamesOf(const Encoding& encoding) {
   return names;
 }
 
-/// The least number of characters that are inserted, deleted or replaced to make b of a: the distance of
-/// Levenshtein.
+/// Returns the Levenshtein distance: how many characters must be inserted, deleted or replaced to turn a into
+/// b.
 std::size_t EditDistance(const std::string& a, const std::string& b) {
-  std::vector<std::size_t> row(b.size() + 1); // of the beginnings of b, from that of a which is reached
+  std::vector<std::size_t> row(b.size() + 1); // the distance of each prefix of b from the current prefix of a
   std::iota(row.begin(), row.end(), std::size_t(0));
   for (std::size_t i = 0; i < a.size(); ++i) {
     std::size_t diagonal = row[0]++;
@@ -74,7 +74,7 @@ const Encoding* FindEncoding(std::string_view name) {
 
 std::string NearestNames(std::string_view name) {
   const std::string simple = Simplify(name.substr(0, name.find(kSuffix)));
-  std::size_t least = std::max<std::size_t>(1, simple.size() * 2 / 5); // more is no slip
+  std::size_t least = std::max<std::size_t>(1, simple.size() * 2 / 5); // more is no typing error
   std::vector<std::string> nearest;
   for (const Encoding& encoding : kEncodings) {
     for (const std::string& known : NamesOf(encoding)) {

@@ -1,4 +1,4 @@
-// The encodings, and the names that they go by.
+// The encodings and their names.
 
 #pragma once
 
@@ -11,10 +11,10 @@ namespace transcode {
 
 using mirel::char16;
 
-/// What a code point becomes, apart from the order of bytes.
+/// How code points are encoded, apart from the byte order.
 enum class Form { kUtf8, kUtf16, kUtf32, kLatin1, kAscii };
 
-/// How the bytes of a unit follow each other; units of one byte have no order.
+/// The order of the bytes in a unit; units of one byte have none.
 enum class ByteOrder { kNone, kLittle, kBig, kByMark };
 
 struct Encoding {
@@ -24,21 +24,21 @@ struct Encoding {
   ByteOrder order;
 
   bool IsByMark() const { return order == ByteOrder::kByMark; }
-  /// Whether it has every code point; the others have those below Limit() only.
+  /// Returns whether it has every code point; other encodings have only those below Limit().
   bool IsUnicode() const { return form != Form::kLatin1 && form != Form::kAscii; }
   char16 Limit() const { return form == Form::kAscii ? 0x80 : 0x100; }
 };
 
 constexpr char16 kByteOrderMark = 0xFEFF;
-/// The encoding that is meant where none is given.
+/// The encoding of input and output by default.
 extern const Encoding& kDefaultEncoding;
 
-/// The encoding of that name, or null. Case, dashes, underscores and "//" at its end don't count.
+/// Finds the encoding of a name, or returns null. Case, dashes, underscores and "//" at its end don't count.
 const Encoding* FindEncoding(std::string_view name);
-/// The names that take the fewest edits to become the given one, in words: "utf-16le or utf-16be". Empty
-/// where even these are no likely slips.
+/// Finds the names that are the fewest edits away from the given one: "utf-16le or utf-16be". The result is
+/// empty if none is close enough to be a typing error.
 std::string NearestNames(std::string_view name);
-/// All names, the aliases behind the one that they stand for, a line for each encoding.
+/// Returns a line for each encoding: its name, then its aliases.
 std::string ListEncodings();
 
 } // namespace transcode

@@ -19,17 +19,17 @@ namespace transcode {
 
 namespace {
 
-/// The temporary file that a signal which ends the process removes, or null.
+/// The temporary file that the signal handler removes, or null.
 std::atomic<const char*> unfinished{nullptr};
-static_assert(std::atomic<const char*>::is_always_lock_free, "others may not be used by a signal handler");
+static_assert(std::atomic<const char*>::is_always_lock_free, "a signal handler needs a lock-free atomic");
 
 extern "C" void RemoveUnfinished(int signal) {
   if (const char* const name = unfinished)
     unlink(name);
-  raise(signal); // with its own effect now
+  raise(signal); // SA_RESETHAND has restored its default action
 }
 
-/// Whether a signal that nobody handles lets the process live, if only after a stop.
+/// Returns whether the default action of a signal lets the process live, if only after a stop.
 bool IsHarmless(int signal) {
   constexpr int kHarmless[] = {SIGCHLD, SIGCONT, SIGTSTP, SIGTTIN, SIGTTOU, SIGURG, SIGWINCH};
   return std::find(std::begin(kHarmless), std::end(kHarmless), signal) != std::end(kHarmless);
@@ -40,14 +40,14 @@ void RemoveWhenInterrupted(const char* name) {
   for (int signal = 1; signal <= SIGRTMAX; ++signal) {
     struct sigaction action = {};
     if (IsHarmless(signal) || sigaction(signal, nullptr, &action) != 0 || action.sa_handler != SIG_DFL)
-      continue; // who started the program wants it ignored
+      continue; // the parent process wants it ignored
     action.sa_handler = RemoveUnfinished;
     action.sa_flags = static_cast<int>(SA_RESETHAND);
     sigaction(signal, &action, nullptr);
   }
 }
 
-/// Holds signals back, so that none comes between the making of a file and the note that it is to be removed.
+/// Blocks signals, so that none arrives between the creation of a file and the note to remove it.
 class SignalBlocker {
 public:
   SignalBlocker() {
@@ -63,7 +63,7 @@ private:
   sigset_t m_before;
 };
 
-/// What a link, or a chain of them, leads to; it need not exist.
+/// Returns what a link, or a chain of links, leads to. That need not exist.
 std::string FollowLinks(const std::string& name) {
   namespace fs = std::filesystem;
   constexpr int kMaxLinks = 40;
@@ -78,7 +78,7 @@ std::string FollowLinks(const std::string& name) {
 
 void HoldClosedStreams() {
   for (const int fd : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
-    if (fcntl(fd, F_GETFD) == -1) // the first that is free is taken
+    if (fcntl(fd, F_GETFD) == -1) // open() returns the lowest free descriptor
       open("/dev/null", fd == STDIN_FILENO ? O_WRONLY : O_RDONLY);
 }
 
@@ -136,14 +136,14 @@ Output::Output(const std::string& name) : m_name(name), m_fd(STDOUT_FILENO) {
     return;
   }
   if (exists && faccessat(AT_FDCWD, name.c_str(), W_OK, AT_EACCESS) != 0)
-    throw SystemError(name); // to rename asks for no leave of the file that goes
+    throw SystemError(name); // rename() needs no permission for the file that it replaces
   m_target = FollowLinks(name);
   const mode_t mask = umask(0);
   umask(mask);
   OpenTemporary(exists ? old.st_mode & 07777 : 0666 & ~mask);
 }
 
-/// Its name is a short one, so that a target may have one of any length that is allowed.
+/// The temporary name is short, so that the target may have a name of any length that is allowed.
 void Output::OpenTemporary(unsigned mode) {
   m_temporary = std::filesystem::path(m_target).replace_filename(".transcode-XXXXXX");
   const SignalBlocker blocker;
@@ -176,8 +176,8 @@ void Output::Write(std::string_view bytes) {
 void Output::Finish() {
   if (m_target.empty())
     return;
-  // Without it, a machine that goes down soon may come up with the new name for no text.
-  if (fsync(m_fd) != 0 && errno != EINVAL) // which tells of a file system that can't
+  // Without fsync(), a machine that fails soon may come up with the new name and no text.
+  if (fsync(m_fd) != 0 && errno != EINVAL) // EINVAL: the file system doesn't support it
     throw SystemError(m_name);
   const int fd = m_fd;
   m_fd = -1;

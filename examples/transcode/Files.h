@@ -1,5 +1,4 @@
-// The files that are read and written, without anything in between: what is converted comes in blocks
-// already.
+// The files that are read and written. They have no buffers, since the text is converted in blocks.
 
 #pragma once
 
@@ -15,11 +14,11 @@ namespace transcode {
 using mirel::int64;
 using mirel::ssize_t;
 
-/// Fills the places of standard streams that were closed when the program started: another file would get
-/// them, and be taken for the stream. Using one is an error.
+/// Opens /dev/null for each standard stream that was closed when the program started. Otherwise another file
+/// would get its descriptor and be taken for the stream. To read or write such a stream is an error.
 void HoldClosedStreams();
 
-/// The error that errno tells of, about the file of that name.
+/// Makes an error of errno for the file of that name.
 std::runtime_error SystemError(const std::string& name);
 
 /// A file that is read, or standard input for the name "-".
@@ -30,7 +29,7 @@ public:
   Input(const Input&) = delete;
   Input& operator=(const Input&) = delete;
 
-  /// Reads up to n bytes, as many as there are at once. @return 0 at the end
+  /// Reads up to n bytes, as many as are available at once. @return 0 at the end
   ssize_t Read(char* p, ssize_t n);
   const std::string& Name() const { return m_name; } ///< for messages
   int Descriptor() const { return m_fd; }
@@ -40,13 +39,13 @@ private:
   int m_fd;
 };
 
-/// The bytes that are left to read of the files of these names, or 0 where they can't be told.
+/// Returns the number of bytes that are left to read in these files, or 0 if it isn't known.
 int64 BytesLeft(const std::vector<std::string>& names);
 
 /// A file that is written, or standard output for the name "-".
 ///
-/// A regular file is written under another name first, and takes its own only when it is finished and on the
-/// disk: until then what was there is left alone. A link to one stays a link, and the mode stays as it was.
+/// A regular file is written under a temporary name, and renamed when it is complete and on the disk; until
+/// then an old file is left alone. A symbolic link stays a link, and the mode stays as it was.
 class Output {
 public:
   explicit Output(const std::string& name);
@@ -57,15 +56,15 @@ public:
   void Write(std::string_view bytes);
   void Finish();
   bool IsTerminal() const;
-  /// Whether what is written could be read again from the input.
+  /// Returns whether the output is the file of the input, and would be read again.
   bool IsFedBackTo(const Input& input) const;
 
 private:
   void OpenTemporary(unsigned mode);
 
   std::string m_name;
-  std::string m_target;    ///< what the file is called in the end; empty where it is written in place
-  std::string m_temporary; ///< what it is called until then
+  std::string m_target;    ///< the final name; empty if the file is written in place
+  std::string m_temporary; ///< the name until then
   int m_fd;
 };
 

@@ -32,7 +32,7 @@ struct Options {
   bool version = false;
 };
 
-/// @throw UsageError with what is wrong, or without words when the parser has printed them
+/// Parses the command line. @throw UsageError that says what is wrong, or is empty if the parser has said it
 Options ParseOptions(int argc, char** argv);
 
 } // namespace transcode

@@ -34,7 +34,7 @@ std::string_view Outgoing::EndFile() {
   return transcode::Encode(m_text, m_to.form, m_order, m_room);
 }
 
-/// The text without its mark and the code points that the encoding lacks, or up to the first of these.
+/// Leaves out the mark, and replaces, drops or stops at code points that the encoding lacks.
 const string16& Outgoing::Fit(const Blocks& block) {
   const string16& text = block.Text();
   m_firstLack.reset();

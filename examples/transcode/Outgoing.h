@@ -1,4 +1,4 @@
-// What becomes of the text on its way to the output.
+// Prepares text for the output: byte order mark, line ends, encoding.
 
 #pragma once
 
@@ -13,7 +13,7 @@ namespace transcode {
 enum class Mark { kKeep, kStrip, kAdd };
 enum class LineEnds { kKeep, kLf, kCrLf };
 
-/// A code point that the encoding lacks, and where it stands in the text of a block.
+/// A code point that the encoding lacks, and its index in the text of a block.
 struct Lack {
   ssize_t index;
   char32_t codePoint;
@@ -21,23 +21,23 @@ struct Lack {
 
 /// Gives the text of one file after another the mark, the line ends and the encoding of the output.
 ///
-/// What is to stay as it is isn't copied: the bytes may be those of the block. The mark that a file begins
-/// with isn't part of its text, so behind the text of another file it is dropped.
+/// Text that doesn't change isn't copied: the result may refer to the block. The mark that a file begins with
+/// isn't part of its text, so it is dropped behind the text of another file.
 class Outgoing {
 public:
   Outgoing(const Encoding& to, Mark mark, LineEnds lineEnds, Mode mode)
       : m_to(to), m_mark(mark), m_lineEnds(lineEnds), m_mode(mode), m_order(to.order) {}
 
   void BeginFile();
-  /// The bytes of a block, up to the first code point that the encoding lacks if that ends the program; valid
-  /// until the next call.
+  /// Encodes a block, up to the first code point that the encoding lacks if that ends the program. The result
+  /// is valid until the next call.
   std::string_view Encode(Blocks& block);
-  /// The bytes that were kept back at the end of the last block.
+  /// Encodes what was kept back at the end of the last block.
   std::string_view EndFile();
 
   /// The first code point of the file that the encoding lacks, if it is in the block.
   const std::optional<Lack>& FirstLack() const { return m_firstLack; }
-  /// How many of the file's code points have been replaced or dropped so far, as the encoding lacks them.
+  /// The number of the file's code points that the encoding lacks and that have been replaced or dropped.
   int64 Lacks() const { return m_lacks; }
 
 private:

@@ -13,10 +13,10 @@ using namespace std::chrono_literals;
 constexpr auto kMoment = 500ms;
 constexpr auto kInterval = 100ms;
 
-/// A program in the background shares the terminal with others, who may be typing.
+/// A program in the background shares the terminal with others, and must not write over them.
 bool IsInForeground() { return tcgetpgrp(STDERR_FILENO) == getpgrp(); }
 
-/// The width is that of the longest line, so that each one covers the one before.
+/// Overwrites the line before; the width is that of the longest line.
 void Print(const char* text) {
   std::fprintf(stderr, "\r%-30s\r%s", "", text);
   std::fflush(stderr);

@@ -1,4 +1,4 @@
-// How far a long run has got, shown on the terminal.
+// Shows the progress of a long run on the terminal.
 
 #pragma once
 
@@ -10,11 +10,11 @@ namespace transcode {
 
 using mirel::int64;
 
-/// A line on standard error, if that is the terminal that the program was started from. It appears only when
-/// the run takes longer than a moment, and goes with the object: before anything else is printed.
+/// A line on standard error, if that is the terminal that the program was started from. It appears once the
+/// run takes longer than half a second, and is erased with the object, before anything else is printed.
 class Progress {
 public:
-  /// total is 0 where it isn't known.
+  /// The total is in bytes, 0 if it isn't known.
   Progress(bool isWanted, int64 total);
   ~Progress();
   Progress(const Progress&) = delete;

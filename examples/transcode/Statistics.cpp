@@ -13,8 +13,8 @@ namespace {
 
 using mirel::char16;
 
-/// How many units of [p, end) are of a kind. The inner loop counts in units, which lets compilers look at as
-/// many of them at once as there are in a wide register.
+/// Counts the units of [p, end) that are of a kind. The inner loop's counter is as wide as a unit, so that
+/// compilers test a wide register of units at once.
 template <class T, class Predicate> ssize_t Count(const T* p, const T* end, Predicate isOfKind) {
   using Counter = std::conditional_t<sizeof(T) == 1, unsigned char, char16>;
   constexpr ssize_t kMax = std::numeric_limits<Counter>::max();
@@ -29,7 +29,7 @@ template <class T, class Predicate> ssize_t Count(const T* p, const T* end, Pred
   return total;
 }
 
-/// A sink that keeps what it is given.
+/// A sink that collects what is written.
 struct MemorySink : mirel::IOutputStream {
   void WriteStream(const void* address, ssize_t count) override {
     text.append(static_cast<const char*>(address), count);
@@ -87,15 +87,16 @@ void Statistics::Examine(Blocks& block) {
       ++p;
     }
   }
-  m_comesBack = ComesBack(block) && m_comesBack;
+  m_isSameAfterRoundTrip = IsSameAfterRoundTrip(block) && m_isSameAfterRoundTrip;
 }
 
-/// Converts the block back from what it was converted to, and tells whether it is what came in.
-bool Statistics::ComesBack(Blocks& block) {
-  const bool wasUtf8 = block.From() == Form::kUtf8; // the text is what that was converted to
-  if (!wasUtf8)
-    mirel::Utf16FromUtf8(m_backText, block.Utf8());
-  return Encode(wasUtf8 ? block.Text() : m_backText, block.From(), block.Order(), m_room) == block.Bytes();
+/// Converts the block back, and returns whether that gives the bytes of the input.
+bool Statistics::IsSameAfterRoundTrip(Blocks& block) {
+  const bool isUtf8 = block.From() == Form::kUtf8; // the text has been converted to UTF-16 already
+  if (!isUtf8)
+    mirel::Utf16FromUtf8(m_roundTripText, block.Utf8());
+  return Encode(isUtf8 ? block.Text() : m_roundTripText, block.From(), block.Order(), m_room) ==
+         block.Bytes();
 }
 
 std::string Statistics::Place() const {
@@ -129,7 +130,7 @@ string8 Statistics::Report(const std::string& title) const {
              : 100.0 * static_cast<double>(m_asciiCodePoints) / static_cast<double>(m_codePoints));
   os << " %";
   os.endl();
-  os << "round trip            " << (m_comesBack ? "  same bytes" : " OTHER BYTES");
+  os << "round trip            " << (m_isSameAfterRoundTrip ? "  same bytes" : " OTHER BYTES");
   os.Indent(0);
   os.endl();
   return sink.text;

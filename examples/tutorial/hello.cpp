@@ -1,4 +1,4 @@
-// A text that stands in the program: counts, finds and replaces.
+// Counts, finds and replaces in a text.
 
 #include <cstdio>
 

@@ -17,7 +17,8 @@ struct Encoding {
   bool isBigEndian;
 };
 
-// UTF-32 stands before UTF-16, whose little-endian mark its own begins with. An empty mark begins every file.
+// UTF-32 comes before UTF-16, since the mark of UTF-32LE begins with that of UTF-16LE. Every file begins with
+// the empty mark.
 inline const Encoding kEncodings[] = {
     {"UTF-32LE", {"\xFF\xFE\0\0", 4}, 4, false}, {"UTF-32BE", {"\0\0\xFE\xFF", 4}, 4, true},
     {"UTF-16LE", "\xFF\xFE", 2, false},          {"UTF-16BE", "\xFE\xFF", 2, true},

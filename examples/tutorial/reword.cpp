@@ -16,7 +16,7 @@ int main(int argc, char** argv) {
 
     mirel::string8 result;
     int count = 0;
-    mirel::ssize_t from = 0; // what stands before it is in the result
+    mirel::ssize_t from = 0; // the text before it is in the result
     for (mirel::ssize_t at; (at = file.text.find(oldWord, from)) != mirel::string8::npos; ++count) {
       result.append(file.text, from, at - from);
       result += newWord;

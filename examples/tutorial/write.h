@@ -27,7 +27,7 @@ inline mirel::string8 Encode(const TextFile& file) {
   return bytes;
 }
 
-// Writes another file first, so that the old one is whole until the new one is.
+// Writes a new file and renames it, so that the old one is there until the new one is complete.
 inline void Write(const std::string& name, const TextFile& file) {
   const mirel::string8 bytes = Encode(file);
   const std::string newName = name + ".new";
