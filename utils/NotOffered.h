@@ -10,6 +10,7 @@
 #include <iosfwd>
 #include <type_traits>
 
+#include "Integers.h"
 #include "xchar.h"
 
 namespace mirel {
@@ -97,7 +98,9 @@ struct InPlaceOf<T, X, U,
   typedef std::conditional_t<sizeof(T) == 1, ConvertToUtf8First, ConvertToUtf16First> Conversion;
   typedef std::conditional_t<sizeof(T) == sizeof(U), Copy, Conversion> type;
 };
-template <class T, class X> using Instead = typename InPlaceOf<T, X>::type;
+/// The name of that as a type, where integers follow X: for the last parameter of a deleted template.
+template <class T, class X, class... N>
+using Instead = std::enable_if_t<kIsEachInteger<N...>, typename InPlaceOf<T, X>::type>;
 
 } // namespace detail
 

@@ -226,7 +226,7 @@ public:
     return *this;
   }
 
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   explicit basic_xstring(const X&, N...) = delete;
   template <class X, class Hint = detail::Instead<T, X>> void operator=(const X&) = delete;
   template <class N, class Hint = detail::WritePointerAndCount, detail::IfIntegers<N> = 0>

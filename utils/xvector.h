@@ -808,31 +808,31 @@ public:
   detail::ReverseIteratorsOnlyStep replace(const detail::ReversePointer&, A...) = delete;
   detail::ReverseIteratorsOnlyStep operator+=(const detail::ReversePointer&) = delete;
   // Text of other units, and other strings. What to write is the argument for Hint.
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void assign(const X&, N...) = delete;
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void append(const X&, N...) = delete;
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void find(const X&, N...) const = delete;
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void rfind(const X&, N...) const = delete;
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void find_first_of(const X&, N...) const = delete;
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void find_first_not_of(const X&, N...) const = delete;
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void find_last_of(const X&, N...) const = delete;
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void find_last_not_of(const X&, N...) const = delete;
-  template <class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void compare(const X&, N...) const = delete;
   template <class X, class Hint = detail::Instead<T, X>> void _Eq(const X&) const = delete;
   template <class X, class Hint = detail::Instead<T, X>> void _Lt(const X&) const = delete;
-  template <class I, class X, class Hint = detail::Instead<T, X>, class... N, detail::IfIntegers<N...> = 0>
+  template <class I, class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void insert(I, const X&, N...) = delete;
-  template <class I, class J, class X, class Hint = detail::Instead<T, X>, class... N>
+  template <class I, class J, class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void replace(I, J, const X&, N...) = delete;
-  template <class I, class J, class X, class Hint = detail::Instead<T, X>, class... N>
+  template <class I, class J, class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void compare(I, J, const X&, N...) const = delete;
   /// @endcond
 
