@@ -54,6 +54,7 @@ template <class T, class N> constexpr bool HasBitsFor(N x) {
   }
 }
 
+/// What the compiler says of a constant that doesn't fit.
 #define MIREL_CUT                                                                                            \
   "this constant has more bits than the code unit that it is passed as: cast it if that is meant"
 
