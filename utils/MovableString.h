@@ -60,6 +60,9 @@ public:
     this->swap(taken);
     return *this;
   }
+  /// @cond
+  template <class X, class Hint = detail::Instead<T, X>> void operator=(const X&) = delete;
+  /// @endcond
 };
 
 /// Exchanges the contents of two strings in constant time.

@@ -310,6 +310,12 @@ bool UtfToUtf([[maybe_unused]] basic_xstring<CharOut>& result, const CharIn*, ss
 /// @cond
 template <> MIREL_API bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);
 template <> MIREL_API bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen);
+// A reverse iterator converts to a pointer, but not to one at the element that it designates.
+template <class... N>
+detail::ReverseIteratorsOnlyStep Utf16FromUtf8(string16&, const detail::ReversePointer&, N...) = delete;
+template <class... N>
+detail::ReverseIteratorsOnlyStep Utf8FromUtf16(string8&, const detail::ReversePointer&, N...) = delete;
+detail::ReverseIteratorsOnlyStep Utf16FromAscii(string16&, const detail::ReversePointer&, ssize_t) = delete;
 /// @endcond
 
 /// @}

@@ -809,6 +809,8 @@ public:
   detail::ReverseIteratorsOnlyStep operator+=(const detail::ReversePointer&) = delete;
   // Text of other units, and other strings. What to write is the argument for Hint.
   template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
+  explicit xvector(const X&, N...) = delete;
+  template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void assign(const X&, N...) = delete;
   template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void append(const X&, N...) = delete;
