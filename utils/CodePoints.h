@@ -1,8 +1,9 @@
 /// @file
 /// Code points: a range that decodes UTF-8 or UTF-16 while a loop walks it, and a function that appends one.
 ///
-/// The decoder here decides for the whole library where a sequence ends and whether it is well-formed. It
-/// knows single sequences only, has no state, and allocates nothing.
+/// Lossy conversions, counts, lengths and the description of malformed text decode single sequences by the
+/// functions here. The strict conversions don't: they have kernels and a scalar path of their own. Nothing
+/// here has state or allocates.
 
 #pragma once
 
@@ -75,8 +76,8 @@ inline bool IsLowSurrogate(char16 unit) { return (unit & 0xFC00) == 0xDC00; }
   return {kReplacement, 1, false};
 }
 
-/// Returns the beginning of the sequence that ends at p, one of those that repeated Decode() finds from begin
-/// on. A unit that isn't a continuation byte always begins a sequence, so at most four units are read.
+/// Returns where the last sequence before p begins, if [begin, p) is decoded from begin on. A unit that isn't
+/// a continuation byte always begins a sequence, so at most four units are read.
 inline const char8* Previous(const char8* begin, const char8* p) {
   for (int k = 1; k <= 4 && p - begin >= k; ++k)
     if (!IsContinuation(p[-k]))
@@ -143,8 +144,9 @@ inline ssize_t SizeOf(std::string_view text) { return static_cast<ssize_t>(text.
 /// @snippet examples/reference.cpp code point iterators
 template <class T> class CodePointIterator {
 public:
-  typedef std::bidirectional_iterator_tag iterator_concept; ///< For C++20, where it may yield values.
-  typedef std::input_iterator_tag iterator_category; ///< For C++17, where any other promises references.
+  typedef std::bidirectional_iterator_tag
+      iterator_concept;                              ///< C++20: bidirectional, though it yields values.
+  typedef std::input_iterator_tag iterator_category; ///< C++17: no other category may yield values.
   typedef char32_t value_type;                       ///< A Unicode scalar value.
   typedef std::ptrdiff_t difference_type;            ///< Counts code points.
   typedef void pointer;                              ///< A code point has no address.

@@ -37,7 +37,7 @@ inline void p_create(char8* r1, char8* r2, char8 x) {
 /// Fills [r1, r2) with x, a 16-bit code unit, by assigning_p_create().
 inline void p_create(char16* r1, char16* r2, char16 x) { assigning_p_create<char16>(r1, r2, x); }
 
-/// Copies [src1, src2) to dst, which may not lie in it, as one block.
+/// Copies [src1, src2) to dst as one block. The two ranges may not overlap.
 /// @pre "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)"
 template <class T> void memcpy_p_copy(T* dst, const T* src1, const T* src2) {
   MIREL_ASSERT(src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr));

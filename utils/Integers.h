@@ -14,24 +14,27 @@ namespace mirel {
 
 namespace detail {
 
-/// Lets an overload take part only for integers. An integer argument of any type matches such an overload
-/// exactly, which is how a literal 0 stays an index or a count where a pointer could be meant too.
+/// Whether N is an integer type or an unscoped enumeration.
 template <class N>
 constexpr bool kIsInteger = std::is_integral_v<N> || (std::is_enum_v<N> && std::is_convertible_v<N, int>);
 template <class... N> constexpr bool kIsEachInteger = (kIsInteger<N> && ...);
+/// Lets an overload take part in overload resolution only for integers. An integer argument of any type
+/// matches such an overload exactly, which is how a literal 0 stays an index, a count or a unit where a
+/// pointer could be meant too.
 template <class... N> using IfIntegers = std::enable_if_t<kIsEachInteger<N...>, int>;
 
-/// Lets a template take part only for (pointer, integer), where a literal 0 counts as an integer.
+/// Lets a template take part in overload resolution only for (pointer, integer). A literal 0 is an integer.
 template <class P, class Ptr, class N>
 using IfPointerAndCount = std::enable_if_t<
     (std::is_pointer_v<P> || std::is_null_pointer_v<P>)&&std::is_convertible_v<P, Ptr> && kIsInteger<N>, int>;
 
-/// Lets a template take part only for a pointer and an integer, in whatever order.
+/// Lets a template take part in overload resolution only for a pointer and an integer, in whatever order.
 template <class P, class Q>
 using IfPointerAndInteger =
     std::enable_if_t<(std::is_pointer_v<P> && kIsInteger<Q>) || (kIsInteger<P> && std::is_pointer_v<Q>), int>;
 
-/// The unsigned value of an integer, an enumerator or a code unit: what a source unit of any type counts by.
+/// Converts an integer, an enumerator or a code unit to the unsigned type of its width, which is how every
+/// unit of a source is read.
 template <class N> constexpr auto UnsignedValue(N x) {
   if constexpr (std::is_enum_v<N>)
     return UnsignedValue(static_cast<std::underlying_type_t<N>>(x));
@@ -41,7 +44,7 @@ template <class N> constexpr auto UnsignedValue(N x) {
     return static_cast<std::make_unsigned_t<N>>(x);
 }
 
-/// Whether a T has as many bits as x needs, with a sign or without.
+/// Whether x fits in a T, as a signed or as an unsigned number.
 template <class T, class N> constexpr bool HasBitsFor(N x) {
   using Unsigned = decltype(UnsignedValue(x));
   using Max = std::numeric_limits<std::make_unsigned_t<T>>;
@@ -59,10 +62,10 @@ template <class T, class N> constexpr bool HasBitsFor(N x) {
   "this constant has more bits than the code unit that it is passed as: cast it if that is meant"
 
 #ifdef __clang__
-// MIREL_FITS does this, and better: clang knows what is a constant in the source.
+// With clang, MIREL_FITS refuses such constants, and at any optimisation level.
 template <class T, bool kStored, class N> constexpr void CheckConstant(N) {}
 #else
-/// Isn't defined: a call that is left in a program doesn't compile.
+/// Isn't defined: the compilation fails if a call remains after optimisation.
 void ConstantDoesNotFit() __attribute__((error(MIREL_CUT)));
 /// Stays in the program where it is called, so that the compiler warns of it.
 __attribute__((noipa, warning(MIREL_CUT))) inline void ConstantIsCut() {}
@@ -79,7 +82,7 @@ template <class T, bool kStored, class N>
 }
 #endif
 
-/// A difference or count of any type as an ssize_t, the nearest one where that has fewer bits.
+/// Converts a difference or a count to ssize_t, clamped to the limits of ssize_t where that has fewer bits.
 template <class N> constexpr ssize_t Saturated(N n) {
   if constexpr (sizeof(N) > sizeof(ssize_t)) { // the compiler decides
     using Limits = std::numeric_limits<ssize_t>;
@@ -89,7 +92,8 @@ template <class N> constexpr ssize_t Saturated(N n) {
   }
 }
 
-/// An argument as a count or an index. One of more bits must not become one that is allowed.
+/// Converts an argument to a count or an index. A 64-bit value saturates where ssize_t has 32 bits, so that
+/// it can't wrap around to a valid one.
 template <class N> constexpr ssize_t Count(N n) {
   if constexpr (sizeof(N) == sizeof(int64))
     return Saturated(static_cast<int64>(n));
@@ -97,14 +101,15 @@ template <class N> constexpr ssize_t Count(N n) {
     return static_cast<ssize_t>(n);
 }
 
-/// An argument as a code unit, by its unsigned value: the char E9 is the char16 00E9 on every processor.
+/// Converts an argument to a code unit by its unsigned value: the char E9 is the char16 00E9 on every
+/// processor.
 template <class T, class X> [[gnu::always_inline]] inline T Unit(X x) {
   CheckConstant<T, true>(x);
   return static_cast<T>(UnsignedValue(x));
 }
 
-/// An argument as a unit that is searched for, with so many more integers after it. Two would be an offset
-/// and the length of a needle, and the first a null pointer.
+/// Converts an argument to the code unit that is searched for. kMore integers follow it in the call; two
+/// would be an offset and a needle's length, so the first was meant as a pointer: refused.
 template <class T, int kMore, class X> [[gnu::always_inline]] inline T UnitToFind(X x) {
   static_assert(kMore <= 1,
                 "an empty needle is (nullptr, offset, 0): a literal 0 is a unit, never a pointer");
@@ -116,8 +121,8 @@ template <class T, int kMore, class X> [[gnu::always_inline]] inline T UnitToFin
 
 } // namespace mirel
 
-/// Behind the parameters of an overload that takes a code unit x: refuses a constant that has too many bits.
-/// Clang's own way, which looks at the source, at any level of optimisation.
+/// Stands after the parameters of an overload that takes a code unit x. With clang it refuses a constant x
+/// that has too many bits, at any optimisation level; with g++, CheckConstant() does so.
 #ifdef __clang__
 #define MIREL_FITS(T, x)                                                                                     \
   _Pragma("clang diagnostic push") _Pragma("clang diagnostic ignored \"-Wgcc-compat\"")                      \

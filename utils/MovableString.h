@@ -12,7 +12,7 @@
 
 namespace mirel {
 
-/// A string whose moves exchange storage in constant time, where those of a basic_xstring copy.
+/// A string whose moves take over the storage in constant time, where those of a basic_xstring copy.
 ///
 /// A `std::vector` of movable strings grows, sorts and erases without copying any text. A moved-from string
 /// is empty and has no storage.

@@ -1,9 +1,9 @@
 /// @file
-/// Calls that vectors and strings don't have, and what is written instead, as the compiler names it.
+/// Calls that vectors and strings don't have: deleted, with a return type that tells what to write instead.
 ///
-/// The operators take their arguments by a conversion that a class defines, which is worse than any other:
-/// whatever operator a program or another header declares for such arguments is called in their place, among
-/// them those of utils/Std.h. The members are deleted where the others of their name are declared.
+/// The operators take their arguments by user-defined conversions, so overload resolution prefers whatever
+/// operator a program or another header declares for such arguments, those of utils/Std.h included. The
+/// members are deleted where the others of their name are declared.
 
 #pragma once
 
@@ -23,31 +23,31 @@ namespace detail {
 template <class T> std::true_type IsVector(const xvector<T>*);
 std::false_type IsVector(...);
 
-/// What any vector or string converts to.
+/// Any vector or string converts to it.
 struct AnyVector {
   template <class T> AnyVector(const xvector<T>&);
 };
 
-/// What those that can be changed convert to.
+/// Any non-const vector or string converts to it.
 struct ChangeableVector {
   template <class T> ChangeableVector(xvector<T>&);
 };
 
-/// What vectors and strings of T convert to.
+/// Vectors and strings of T convert to it.
 template <class T> struct VectorOf { VectorOf(const xvector<T>&); };
 
-/// What everything converts to.
+/// Everything converts to it.
 struct Anything {
   template <class X> Anything(const X&);
 };
 
-/// What everything else converts to.
+/// Everything but a vector or a string converts to it.
 struct NoVector {
   template <class X, std::enable_if_t<!decltype(IsVector(static_cast<X*>(nullptr)))::value, int> = 0>
   NoVector(const X&);
 };
 
-/// What nothing converts to.
+/// Nothing converts to it: as a list of it, an argument can only be {}.
 class NoUnit {
   NoUnit();
 };
@@ -81,8 +81,9 @@ template <class X> struct TextUnit<X, std::void_t<decltype(X::npos), typename X:
 template <class C> struct TextUnit<C*> { typedef std::remove_cv_t<C> type; };
 template <class U, class... C> constexpr bool kIsOneOf = (std::is_same_v<U, C> || ...);
 
-/// What to write in place of X where text of T is taken: defined for text of other units and standard
-/// strings, and for reverse iterators, which would be taken for the pointers that they convert to.
+/// The hint for an argument of type X where text of T is expected. It is defined only for text of other
+/// units, for standard strings, and for reverse iterators, which would be taken for the pointers that they
+/// convert to.
 template <class T, class X, class U = typename TextUnit<std::decay_t<X>>::type, class = void>
 struct InPlaceOf {};
 template <class T, class X>
@@ -98,7 +99,8 @@ struct InPlaceOf<T, X, U,
   typedef std::conditional_t<sizeof(T) == 1, ConvertToUtf8First, ConvertToUtf16First> Conversion;
   typedef std::conditional_t<sizeof(T) == sizeof(U), Copy, Conversion> type;
 };
-/// The name of that as a type, where integers follow X: for the last parameter of a deleted template.
+/// The hint for X, if nothing but integers follows it. It is a parameter of a deleted template, so that
+/// compilers print it.
 template <class T, class X, class... N>
 using Instead = std::enable_if_t<kIsEachInteger<N...>, typename InPlaceOf<T, X>::type>;
 

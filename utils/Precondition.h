@@ -14,7 +14,7 @@ namespace mirel {
 /// Where no such facility is known, it prints the same line to standard error itself.
 ///
 /// @param expression  the violated expression, as text
-/// @param file        the source file of the check; the report has it from the last folder utils/ on
+/// @param file        the source file of the check; the report shows its path from the last utils/ on
 /// @param line        the line in that file
 /// @param function    the signature of the function that made the check
 [[noreturn, gnu::cold]] MIREL_API void AssertionFailed(const char* expression, const char* file, int line,
@@ -22,8 +22,8 @@ namespace mirel {
 
 namespace detail {
 
-/// Returns whether n elements from index i on lie within size elements. It holds for every pair of values; a
-/// sum i + n could overflow and pass.
+/// Returns whether n elements from index i on lie within size elements. It is right for all values: i + n,
+/// which could overflow, isn't computed.
 constexpr bool IsSubrange(ssize_t i, ssize_t n, ssize_t size) {
   return 0 <= i && 0 <= n && i <= size && n <= size - i;
 }

@@ -1,8 +1,8 @@
 /// @file
 /// What connects the strings to the standard library: operators, hashes, views, copies, and streams.
 ///
-/// It uses only public members of the strings, but for FillFrom(), and costs nothing where it isn't included.
-/// Formatted output is in utils/Format.h.
+/// All but FillFrom() uses only public members of the strings. A program that doesn't include it pays
+/// nothing. Formatted output is in utils/Format.h.
 
 #pragma once
 
@@ -51,7 +51,7 @@ template <class T> using Operand = typename NotDeduced<T>::type;
 template <class A>
 using UnitOf = std::conditional_t<std::is_convertible_v<const A&, TextRef<char16>>, char16, char8>;
 
-/// Matches texts of one width.
+/// Lets a template take part in overload resolution only if all A are texts of code units T.
 template <class T, class... A>
 using IfTexts = std::enable_if_t<(std::is_convertible_v<const A&, TextRef<T>> && ...), int>;
 

@@ -20,8 +20,8 @@ class Credit {
 public:
   explicit Credit(ssize_t needleLength) : m_credit(needleLength / 2 + 64) {}
 
-  /// Returns whether the search may go on, after a comparison that failed behind equalUnits equal units. The
-  /// search has passed so many places in all.
+  /// Returns whether the search may go on, after a comparison that failed after equalUnits equal units;
+  /// passed is the number of places searched so far.
   bool Allows(ssize_t equalUnits, ssize_t passed) {
     m_credit -= equalUnits / 4 + 8;
     return m_credit + 4 * int64(passed) >= 0;
@@ -41,7 +41,8 @@ template <class It1, class It2> ssize_t EqualElements(It1 x, It2 y, ssize_t n) {
 
 /// Two-way string matching, by Crochemore and Perrin (1991). The needle is cut in two. Its right part is
 /// compared forwards; a mismatch there moves the needle past it. Then the left part is compared backwards; a
-/// mismatch there moves the needle by its period, or, where that is long, by more than the longer part.
+/// mismatch there moves the needle by its period if it is periodic, otherwise by one more than the longer
+/// part.
 template <class It> class TwoWay {
 public:
   /// Prepares a needle of at least one element.

@@ -25,9 +25,9 @@ public:
   /// Makes a stream at the beginning of a text.
   explicit UtfStream(OnMalformed onMalformed = OnMalformed::kStop) : m_onMalformed(onMalformed) {}
 
-  /// Converts the units kept from the last piece and the pn units at p, and appends the result to dst. Units
-  /// at the end that may begin a sequence are kept until the next piece completes it: up to three bytes of
-  /// UTF-8, one unit of UTF-16.
+  /// Converts the units pending from the last piece and the pn units at p, and appends the result to dst.
+  /// Units at the end that may begin a sequence are pending until the next piece completes it: up to three
+  /// bytes of UTF-8, one unit of UTF-16.
   ///
   /// A failed allocation throws std::bad_alloc; dst then holds the beginning of the result, and the stream
   /// can't go on: assign a new one to it. The source may not lie in dst.
@@ -48,15 +48,15 @@ public:
     const std::string_view view = text;
     return Append(dst, view.data(), static_cast<ssize_t>(view.size()));
   }
-  /// Ends the text. Units that were kept are malformed, since nothing completes them: they become U+FFFD or
+  /// Ends the text. Pending units are malformed, since nothing completes them: they become U+FFFD or
   /// stop the stream. The next call begins another text; until then the members below describe this one.
-  /// @return whether the text was well-formed, or its malformed parts have been replaced
+  /// @return false if the stream has stopped at malformed text; always true with kReplace
   bool Finish(basic_xstring<CharOut>& dst);
 
-  /// The number of units taken so far, with those that are kept; once the stream has stopped, the offset of
+  /// The number of units taken so far, with the pending ones; once the stream has stopped, the offset of
   /// the malformed sequence.
   int64 position() const { return m_converted + m_pending; }
-  /// The number of units kept for the next piece.
+  /// The number of units that wait for the next piece.
   ssize_t pending() const { return m_pending; }
   /// The number of U+FFFD that have replaced malformed text so far.
   int64 replacements() const { return m_replacements; }
