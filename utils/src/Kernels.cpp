@@ -6,11 +6,11 @@
 #include <utils/Kernels.h>
 #include <utils/VectorOfByte.h>
 
-// The kernels take the first byte of a unit or word for its lowest.
+// The kernels assume little-endian byte order.
 #if defined(MIREL_KERNELS) && __BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__
 
 // The kernels use neither AES nor conversions of floating-point numbers, so no processor has to have them.
-// The targets that are left out weren't found to gain a third over the others.
+// No other target was found to gain a third over these.
 #define HWY_DISABLE_PCLMUL_AES
 #define HWY_DISABLE_F16C
 #define HWY_DISABLED_TARGETS                                                                                 \
@@ -54,7 +54,7 @@ constexpr Kernels kKernels = {
 
 #if HWY_ONCE
 
-// As a number, so that all of them are asked without branches.
+// As 0 or 1, so that & combines the answers without branches.
 #define HAS(feature) static_cast<unsigned>(__builtin_cpu_supports(feature) != 0)
 
 namespace mirel {
