@@ -12,8 +12,7 @@
 
 #include <utils/Std.h>
 
-// The linker puts the wrapper in the place of realloc in a static library; a shared one finds it in the
-// program.
+// The linker replaces the static library's realloc by the wrapper; a shared library finds it in the program.
 #ifdef MIREL_SHARED
 #define REAL_REALLOC __libc_realloc
 #define WRAPPED_REALLOC realloc
@@ -26,11 +25,11 @@ extern "C" void* REAL_REALLOC(void* p, std::size_t n) noexcept;
 extern "C" void* WRAPPED_REALLOC(void* p, std::size_t n) noexcept {
   ++allocation::count;
   allocation::requested = n;
-  if (allocation::failAfter == 0 || n > PTRDIFF_MAX / 4) // also where a machine of 32 bits has so much
+  if (allocation::failAfter == 0 || n > PTRDIFF_MAX / 4) // even if a 32-bit machine has so much memory
     return nullptr;
   if (allocation::failAfter > 0)
     --allocation::failAfter;
-  // Each growth moves, and what points to the storage before reads other bytes.
+  // Each growth moves the storage and overwrites the old one, so that stale pointers read other bytes.
   void* const moved = REAL_REALLOC(nullptr, n);
   if (p != nullptr && moved != nullptr) {
     const std::size_t size = malloc_usable_size(p);
@@ -44,7 +43,7 @@ extern "C" void* WRAPPED_REALLOC(void* p, std::size_t n) noexcept {
 namespace {
 
 const volatile ssize_t kMax = std::numeric_limits<ssize_t>::max(); // unknown to the compiler
-const volatile mirel::int64 kWide = mirel::int64(1) << 62;         // has nothing in its lower 32 bits
+const volatile mirel::int64 kWide = mirel::int64(1) << 62;         // its lower 32 bits are 0
 
 /// An edit of s.
 #define EDIT(...) [&](auto& s) { __VA_ARGS__; }
@@ -55,14 +54,14 @@ TYPED_TEST_SUITE(Allocation, CodeUnits);
 
 TYPED_TEST(Allocation, GrowthIsGeometric) {
   using S = basic_xstring<TypeParam>;
-  const S run = Of<TypeParam>("seventeen units..");
+  const S text = Of<TypeParam>("seventeen units..");
   const EditsOf<S> edits = {EDIT(s.push_back('x')),
                             EDIT(s.append(1, 'x')),
                             EDIT(s.resize(s.size() + 1, 'x')),
-                            EDIT(s += run),
+                            EDIT(s += text),
                             EDIT(s.push_back('x'), s.c_str()),
                             EDIT(s.append(1, 'x'), s.c_str()),
-                            EDIT(s += run, s.c_str()),
+                            EDIT(s += text, s.c_str()),
                             EDIT(FillFrom(s, 10, [](auto*, ssize_t n) { return n - 3; }))};
   const auto allocations = [](int times, const auto& edit) {
     S s;
@@ -90,15 +89,18 @@ TYPED_TEST(Allocation, CapacityFollowsTheStatedRules) {
   EXPECT_EQ(s.capacity(), 16);
   EXPECT_EQ(S(s, 0, 5).capacity(), 5);
   EXPECT_EQ(s.substr(1, 6).capacity(), 6);
-  s.assign(9, 'a'), s.erase(0, 8), s.resize(0, 'a'), s.clear();
-  EXPECT_EQ(s.capacity(), 16);
-  EXPECT_EQ(allocation::Count([&] { s + s; }), 0) << "an empty sum takes none";
+  s.assign(9, 'a');
+  s.erase(0, 8);
+  s.resize(0, 'a');
+  s.clear();
+  EXPECT_EQ(s.capacity(), 16) << "only growth changes it";
+  EXPECT_EQ(allocation::Count([&] { s + s; }), 0) << "an empty sum allocates nothing";
   s.resize(12, 'a');
   EXPECT_EQ(allocation::Count([&] { s + s; }), 1);
   EXPECT_EQ(allocation::Count([&] { s + 'x'; }), 1);
 }
 
-TYPED_TEST(Allocation, NoneWhereThereIsRoomAndNothingAliases) {
+TYPED_TEST(Allocation, NoneIfThereIsRoomAndNothingAliases) {
   using S = basic_xstring<TypeParam>;
   const S r = Of<TypeParam>("xyz");
   const EditsOf<S> edits = {EDIT(s.append(r)),
@@ -120,18 +122,18 @@ TYPED_TEST(Allocation, NoneWhereThereIsRoomAndNothingAliases) {
                             EDIT(s.push_back('x'), s.push_back('y'), s.push_back('z'))};
   for (const auto& edit : edits) {
     S s = Of<TypeParam>("abc");
-    s.reserve(6); // an exact fit for most of them
+    s.reserve(6); // most edits fill it exactly
     EXPECT_EQ(allocation::Count([&] { edit(s); }), 0) << &edit - edits.data();
     EXPECT_EQ(s.capacity(), 6) << &edit - edits.data();
   }
 }
 
-/// Expects that each edit throws where one of its allocations fails, and leaves v as it was.
+/// Expects that each edit throws if one of its allocations fails, and leaves v as it was.
 template <class V> void ExpectSafe(const V& v, const EditsOf<V>& edits) {
   for (const auto& edit : edits) {
     SCOPED_TRACE(&edit - edits.data());
     int failures = 0;
-    for (; failures < 4; ++failures) { // some never succeed
+    for (; failures < 4; ++failures) { // some edits never succeed
       V s(v);
       const auto* const data = s.data();
       allocation::failAfter = failures;
@@ -163,7 +165,7 @@ TYPED_TEST(Allocation, AFailureChangesNothing) {
        EDIT(s.insert(1, s.begin(), s.end())), EDIT(s *= 3), EDIT(s + s), EDIT(s.substr()), EDIT(S copy(s)),
        EDIT(s.push_front(s[1])), EDIT(s.insert(1, r)), EDIT(s.replace(1, 1, 5, 'x')),
        EDIT(s.push_back(3, r.begin(), r.end())), EDIT(s.append(z, 4)), EDIT(s.append(z)),
-       // What no machine can have.
+       // More than any machine has.
        EDIT(s.reserve(kMax)), EDIT(s.resize(kMax, 'x')), EDIT(s.append(kMax, 'x')),
        EDIT(s.append((kMax - 1) / ssize_t(sizeof(TypeParam)), 'x')), EDIT(s.insert(0, kMax / 2 + 1, 'x')),
        EDIT(s.assign(kMax, 'x')), EDIT(s *= kMax), EDIT(s *= kMax / 3 + 1), EDIT(s.append(s.data(), kMax))});
@@ -189,7 +191,7 @@ TYPED_TEST(Allocation, SumsOfSizesDontOverflow) {
   mirel::VectorOfByte& bytes = reinterpret_cast<mirel::VectorOfByte&>(v);
   const TypeParam* const data = v.data();
   const auto expectFailure = [&](ssize_t size, const std::function<void(S&)>& edit, ssize_t requested) {
-    bytes.size_ = bytes.m_capacity = size * unit; // which the storage doesn't have: nothing may be moved
+    bytes.size_ = bytes.m_capacity = size * unit; // the storage is smaller, so nothing may be moved
     allocation::requested = 0;
     EXPECT_THROW(edit(v), std::bad_alloc);
     EXPECT_EQ(allocation::requested, std::size_t(requested * unit));
@@ -200,7 +202,7 @@ TYPED_TEST(Allocation, SumsOfSizesDontOverflow) {
   for (const auto& edit : EditsOf<S>{EDIT(s.push_back('x')), EDIT(s.append(1, 'x')), EDIT(s.insert(0, 'x')),
                                      EDIT(s.c_str()), EDIT(s + s), EDIT(s + 'x'), EDIT(s *= 2)})
     expectFailure(largest, edit, 0);
-  // Growth asks for no more than it must where more couldn't be counted.
+  // Growth asks for no more than the edit needs if the doubled capacity would overflow.
   const ssize_t size = largest / 4 * 3;
   expectFailure(size, EDIT(s.push_back('x')), size + 1);
   expectFailure(size, EDIT(s.append(5, 'x')), size + 5);

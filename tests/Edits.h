@@ -1,5 +1,5 @@
-// Edits of a string and, beside it, of a standard one. What is edited, and how, is decided by numbers: random
-// ones in the suite, an input's bytes under a fuzzer.
+// Makes the same edits of a string and a standard string, and compares them. Numbers choose the edits: random
+// ones in the tests, the bytes of an input under a fuzzer.
 
 #pragma once
 
@@ -7,7 +7,7 @@
 
 #include "Support.h"
 
-/// Makes text of a few different units, so that they meet often.
+/// Makes text of a few different units, so that searches find some.
 template <class T, class Numbers> class TextMaker {
 public:
   using S = basic_xstring<T>;
@@ -15,7 +15,7 @@ public:
 
   explicit TextMaker(Numbers& numbers) : m_numbers(numbers) {}
 
-  /// From 0 to max.
+  /// A number from 0 to max.
   ssize_t Number(ssize_t max) { return m_numbers(max); }
   T Unit() { return static_cast<T>(kAlphabet[Number(3)]); }
   Model Text(ssize_t max) {
@@ -27,7 +27,7 @@ public:
 
 private:
   static constexpr unsigned kAlphabet[] = {'a', 'b', 0,
-                                           sizeof(T) == 1 ? 0xE9 : 0x61E9}; // both bytes of one are units too
+                                           sizeof(T) == 1 ? 0xE9 : 0x61E9}; // whose low byte is E9, too
   Numbers& m_numbers;
 };
 
@@ -47,20 +47,23 @@ public:
 
   /// Makes one edit of both, and compares them.
   void Step() {
-    if (v.size() > 80)
-      S().swap(v), m.clear();
+    if (v.size() > 80) {
+      S().swap(v);
+      m.clear();
+    }
     const M before = m;
     const ssize_t size = v.size(), i = this->Number(size), n = this->Number(size - i),
                   count = this->Number(4);
     const ssize_t ri = this->Number(size), rn = this->Number(size - ri), k = std::min(n, rn);
     const M text = this->Text(9), own = m.substr(size_t(ri), size_t(rn));
     const S r(text.data(), static_cast<ssize_t>(text.size()));
-    const M upToZero = m.substr(size_t(ri), std::min(m.find(T(0), size_t(ri)), m.size()) - size_t(ri));
+    const M upToNull = m.substr(size_t(ri), std::min(m.find(T(0), size_t(ri)), m.size()) - size_t(ri));
     const T x = this->Unit(), own1 = n > 0 ? m[size_t(i)] : x;
-    const T& x1 = n > 0 ? v[i] : x; // own and own1 are copies of what p and x1 stand for in the vector
+    const T& x1 =
+        n > 0 ? v[i] : x; // p and x1 refer to the vector; own and own1 are copies of the same elements
     const T* const p = v.data() + ri;
     auto at = v.begin() + i;
-    ssize_t erased = kNpos; // what an edit says how many it has erased
+    ssize_t erased = kNpos; // the result of an edit that returns how many it has erased
     const char* edit = "";
     const auto becomes = [&](ssize_t pos, ssize_t len, const M& with) {
       m.replace(size_t(pos), size_t(len), with);
@@ -100,10 +103,10 @@ public:
       EDIT(29, (v.resize(i, x), v *= 2), i, size - i, M(m, 0, size_t(i)));
       EDIT(30, (n > 0 ? at = v.erase(at) : at), at - v.begin(), n > 0, {});
       EDIT(31, erased = v.FindAndEraseFirst(x), ssize_t(std::min(m.rfind(x), m.size())), 1, {});
-      EDIT(32, v.append(v.c_str() + ri), size, 0, upToZero);
-      EDIT(33, v.assign(v.c_str() + ri), 0, size, upToZero);
-      EDIT(34, v.insert(i, v.c_str() + ri), i, 0, upToZero);
-      EDIT(35, v.replace(i, n, v.c_str() + ri), i, n, upToZero);
+      EDIT(32, v.append(v.c_str() + ri), size, 0, upToNull);
+      EDIT(33, v.assign(v.c_str() + ri), 0, size, upToNull);
+      EDIT(34, v.insert(i, v.c_str() + ri), i, 0, upToNull);
+      EDIT(35, v.replace(i, n, v.c_str() + ri), i, n, upToNull);
       EDIT(36, v.move(i, ri, k), i, k, own.substr(0, size_t(k)));
       EDIT(37, v.append(v.c_str() + ri, size - ri + 1), size, 0, M(m, size_t(ri)) + T(0));
       EDIT(38, v.push_front(x1), 0, 0, {own1});
@@ -124,7 +127,7 @@ public:
       ASSERT_EQ(std::as_const(v)[v.size() / 2], m[m.size() / 2]);
     }
     if (this->Number(3) == 0)
-      return S(v).swap(v); // without unused capacity, so that the next edit has to move it
+      return S(v).swap(v); // leaves no unused capacity, so that the next edit must move the storage
     const T* const z = v.c_str();
     ASSERT_EQ(z, v.data());
     ASSERT_EQ(z[v.size()], 0);
@@ -143,13 +146,13 @@ public:
   using typename TextMaker<T, Numbers>::S;
   using TextMaker<T, Numbers>::TextMaker;
 
-  /// Searches text of up to so many units for some other.
+  /// Searches a text of up to so many units for a random needle, and compares it with another text.
   void Step(ssize_t longest) {
     const auto sign = [](int x) { return (x > 0) - (x < 0); };
     const auto text = this->Text(longest);
-    const auto pattern = this->Text(3);
+    const auto needle = this->Text(3);
     S v(text.data(), static_cast<ssize_t>(text.size()));
-    S r(pattern.data(), static_cast<ssize_t>(pattern.size()));
+    S r(needle.data(), static_cast<ssize_t>(needle.size()));
     const ssize_t forward = this->Number(v.size());
     const ssize_t reverse = v.empty() ? kNpos : this->Number(v.size()) - 1;
     const auto uf = static_cast<std::size_t>(forward), ur = static_cast<std::size_t>(reverse);
@@ -159,10 +162,10 @@ public:
     const ssize_t pn = r.size();
 #define SEARCH(NAME, OURS, THEIRS)                                                                           \
   ASSERT_EQ(v.NAME(c, OURS), ssize_t(text.NAME(c, THEIRS)));                                                 \
-  ASSERT_EQ(v.NAME(r, OURS), ssize_t(text.NAME(pattern, THEIRS)));                                           \
+  ASSERT_EQ(v.NAME(r, OURS), ssize_t(text.NAME(needle, THEIRS)));                                            \
   ASSERT_EQ(v.NAME(z, OURS), ssize_t(text.NAME(z, THEIRS)));                                                 \
-  ASSERT_EQ(v.NAME(p, OURS, pn), ssize_t(text.NAME(pattern, THEIRS)));                                       \
-  ASSERT_EQ(v.NAME(p, p + pn, OURS), ssize_t(text.NAME(pattern, THEIRS)));                                   \
+  ASSERT_EQ(v.NAME(p, OURS, pn), ssize_t(text.NAME(needle, THEIRS)));                                        \
+  ASSERT_EQ(v.NAME(p, p + pn, OURS), ssize_t(text.NAME(needle, THEIRS)));                                    \
   ASSERT_EQ(v.NAME(number, OURS), ssize_t(text.NAME(c, THEIRS)))
     SEARCH(find, forward, uf);
     SEARCH(find_first_of, forward, uf);
@@ -171,7 +174,7 @@ public:
     SEARCH(find_last_of, reverse, ur);
     SEARCH(find_last_not_of, reverse, ur);
 #undef SEARCH
-    ASSERT_EQ(v.contains(r.begin(), r.end(), forward), text.compare(uf, pattern.size(), pattern) == 0);
+    ASSERT_EQ(v.contains(r.begin(), r.end(), forward), text.compare(uf, needle.size(), needle) == 0);
     ASSERT_EQ(Std(v.substr(forward, kNpos)), text.substr(uf));
     const auto other = std::basic_string<T>(this->Text(12));
     const S o(other.data(), static_cast<ssize_t>(other.size()));
@@ -179,15 +182,17 @@ public:
       const auto less = [](T x, T y) { return std::make_unsigned_t<T>(x) < std::make_unsigned_t<T>(y); };
       return std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end(), less) ? -1 : a != b;
     };
-    const int expected = order(text, other), expectedUpToZero = order(text, other.c_str());
-    ASSERT_EQ(sign(v.compare(other.c_str())), expectedUpToZero);
-    ASSERT_EQ(v._Eq(other.c_str()), expectedUpToZero == 0);
-    ASSERT_EQ(v._Lt(other.c_str()), expectedUpToZero < 0);
+    const int expected = order(text, other), expectedUpToNull = order(text, other.c_str());
+    ASSERT_EQ(sign(v.compare(other.c_str())), expectedUpToNull);
+    ASSERT_EQ(v._Eq(other.c_str()), expectedUpToNull == 0);
+    ASSERT_EQ(v._Lt(other.c_str()), expectedUpToNull < 0);
     ASSERT_EQ(sign(v.compare(o)), expected);
     ASSERT_EQ(sign(v.compare(0, v.size(), o, 0, o.size())), expected);
     ASSERT_EQ(sign(v.compare(o.data(), o.size())), expected);
     ASSERT_EQ(v._Eq(o), expected == 0);
     ASSERT_EQ(v._Lt(o), expected < 0);
-    ASSERT_TRUE(sizeof(T) == 1 || v.compare(o) == expected);
+    if (sizeof(T) == 2) { // whose result is -1, 0 or 1
+      ASSERT_EQ(v.compare(o), expected);
+    }
   }
 };

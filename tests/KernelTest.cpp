@@ -1,5 +1,4 @@
-// Which kernels the library chooses. That each of them is right is tested where the work is: UtfTest.cpp and
-// VectorOfByteTest.cpp.
+// Which kernels the library chooses. UtfTest.cpp, TextTest.cpp and VectorOfByteTest.cpp test each of them.
 #include "Support.h"
 
 #include <cstdio>
@@ -11,7 +10,7 @@
 
 namespace {
 
-/// Converted by whatever is chosen before main() begins.
+/// Converted before main() begins.
 const mirel::string16 kBeforeMain = [] {
   mirel::string16 wide;
   mirel::Utf16FromUtf8(wide, "Gr\u00FC\u00DFe, \u4E16\u754C, before anything is initialised");
@@ -25,7 +24,7 @@ TEST(Kernels, AreChosenBeforeMain) {
   EXPECT_EQ(kBeforeMain.find(u'z'), kNpos);
 }
 
-/// The environment may say which ones an emulated processor has.
+/// The environment may name those of an emulated processor.
 TEST(Kernels, AreThoseOfTheProcessor) {
   std::printf("kernels: %s\n", mirel::KernelName());
   const char* const expected = std::getenv("MIREL_EXPECTED_KERNELS");

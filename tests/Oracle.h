@@ -38,8 +38,7 @@ inline std::size_t SequenceLength(View<char8> text) {
   return 0;
 }
 
-/// The length of the maximal subpart that malformed text begins with: as much of a row as is there, or one
-/// byte.
+/// The length of the maximal subpart that malformed text begins with: of an incomplete row, or one byte.
 inline std::size_t SubpartLength(View<char8> text) {
   const auto byte = [&](std::size_t i) { return i < text.size() ? static_cast<unsigned char>(text[i]) : -1; };
   for (const Row& row : kTable)
@@ -53,25 +52,25 @@ inline std::size_t SubpartLength(View<char8> text) {
 inline std::size_t SubpartLength(View<char16>) { return 1; }
 
 inline void Put(Text<char8>& text, char32_t c) {
-  const auto tail = [&](int shift) { text += static_cast<char8>(0x80 | (c >> shift & 0x3F)); };
+  const auto put = [&](char32_t byte) { text += static_cast<char8>(byte); };
   if (c < 0x80)
-    text += static_cast<char8>(c);
-  else if (c < 0x800)
-    text += static_cast<char8>(0xC0 | c >> 6), tail(0);
-  else if (c < 0x10000)
-    text += static_cast<char8>(0xE0 | c >> 12), tail(6), tail(0);
-  else
-    text += static_cast<char8>(0xF0 | c >> 18), tail(12), tail(6), tail(0);
+    return put(c);
+  put(c < 0x800 ? 0xC0 | c >> 6 : c < 0x10000 ? 0xE0 | c >> 12 : 0xF0 | c >> 18);
+  for (int shift = c < 0x800 ? 0 : c < 0x10000 ? 6 : 12; shift >= 0; shift -= 6)
+    put(0x80 | (c >> shift & 0x3F));
 }
 
 inline void Put(Text<char16>& units, char32_t c) {
-  if (c >= 0x10000)
-    units += static_cast<char16>(0xD800 + ((c - 0x10000) >> 10)), c = 0xDC00 + ((c - 0x10000) & 0x3FF);
+  if (c >= 0x10000) {
+    units += static_cast<char16>(0xD800 + ((c - 0x10000) >> 10));
+    c = 0xDC00 + ((c - 0x10000) & 0x3FF);
+  }
   units += static_cast<char16>(c);
 }
 
-constexpr bool IsLead(char32_t c) { return c >= 0xD800 && c <= 0xDBFF; }
-constexpr bool IsTrail(char32_t c) { return c >= 0xDC00 && c <= 0xDFFF; }
+constexpr bool IsHighSurrogate(char32_t c) { return c >= 0xD800 && c <= 0xDBFF; }
+constexpr bool IsLowSurrogate(char32_t c) { return c >= 0xDC00 && c <= 0xDFFF; }
+constexpr bool IsSurrogate(char32_t c) { return c >= 0xD800 && c <= 0xDFFF; }
 
 /// A sequence of a text: well-formed, or a maximal subpart that U+FFFD replaces.
 struct Sequence {
@@ -92,13 +91,12 @@ inline Sequence First(View<char8> text) {
 }
 inline Sequence First(View<char16> text) {
   const char32_t a = text[0], b = text.size() > 1 ? text[1] : 0u;
-  if (IsLead(a) && IsTrail(b))
+  if (IsHighSurrogate(a) && IsLowSurrogate(b))
     return {0, 2, 0x10000 + ((a - 0xD800) << 10) + (b - 0xDC00), true};
-  const bool isSurrogate = IsLead(a) || IsTrail(a);
-  return {0, 1, isSurrogate ? 0xFFFD : a, !isSurrogate};
+  return {0, 1, IsSurrogate(a) ? 0xFFFD : a, !IsSurrogate(a)};
 }
 
-/// Makes out what the strict conversion of source comes to; whether it is well-formed.
+/// Converts source strictly. @return whether it is well-formed
 template <class CharOut, class CharIn> bool Convert(Text<CharOut>& out, View<CharIn> source) {
   out.clear();
   while (!source.empty()) {
@@ -116,7 +114,7 @@ template <class CharOut, class CharIn> bool Convert(Text<CharOut>& out, const Te
 
 /// Calls f with each way to convert on this processor: a function like UtfToUtf(), and its name.
 template <class CharOut, class CharIn, class F> void ForEachWay(const F& f) {
-#ifdef MIREL_SHARED // the others are hidden in the library
+#ifdef MIREL_SHARED // a shared library hides its kernels
   f(mirel::UtfToUtf<CharOut, CharIn>, "as chosen");
 #else
   const mirel::detail::Kernels* kernels = nullptr;
@@ -129,32 +127,36 @@ template <class CharOut, class CharIn, class F> void ForEachWay(const F& f) {
 #endif
 }
 
-/// Converts source in every way, from a destination that held text, and expects what the oracle says.
+/// Converts source in every way, into a destination that held text, and expects the oracle's result.
 template <class CharOut, class CharIn> void Check(View<CharIn> source) {
   static thread_local Text<CharOut> expected;
   const bool isWellFormed = Convert(expected, source);
   ForEachWay<CharOut, CharIn>([&](const auto& convert, const char* name) {
-    basic_xstring<CharOut> dst(3, 'x'); // without room, so that it grows meanwhile
+    basic_xstring<CharOut> dst(3, 'x'); // without room, so that the conversion makes it grow
     const CharIn* const src = source.data();
     const ssize_t srcLen = static_cast<ssize_t>(source.size());
     const bool ok = convert(dst, src, srcLen);
     const View<CharOut> units(dst.data(), static_cast<std::size_t>(dst.size()));
-    if (ok != isWellFormed || units != expected) // a macro for each would take too long for billions of them
+    if (ok != isWellFormed || units != expected) // expectations would take too long for billions of texts
       FAIL() << name << ": " << testing::PrintToString(source) << (ok ? " is " : " is not ")
              << "converted: " << testing::PrintToString(units);
   });
 }
 
-/// Checks source by itself, and between letters of the kind with which it may begin, of which some are
-/// converted at once.
-template <class T> void CheckAmongLetters(View<T> source) {
+/// Checks source by itself, and between sequences as long as the one with which it may begin, since several
+/// of these are converted at once.
+template <class T> void CheckAmongSequences(View<T> source) {
   using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
   static thread_local Text<T> text;
   const bool isHigh = sizeof(T) == 1 ? (source[0] & 0xF0) == 0xE0 : static_cast<char16>(source[0]) >= 0x800;
-  const char32_t letter = isHigh ? 0x20AC : 0xE9;
-  text.clear(), Put(text, letter), text += source;
-  Put(text, letter), Put(text, letter), Put(text, letter);
-  Check<Other>(source), Check<Other>(View<T>(text));
+  const char32_t c = isHigh ? 0x20AC : 0xE9;
+  text.clear();
+  Put(text, c);
+  text += source;
+  for (int k = 0; k < 3; ++k)
+    Put(text, c);
+  Check<Other>(source);
+  Check<Other>(View<T>(text));
 }
 
 } // namespace oracle

@@ -1,5 +1,5 @@
-// What users write compiles and means what it says; the declared signatures are there. POSIX headers come
-// first here and last in another file, and both use the whole namespace.
+// Calls that users write compile and mean what they say, and the declared signatures exist. POSIX headers are
+// included first here and last in another file, and both use the whole namespace.
 #include <sys/socket.h>
 #include <sys/types.h>
 #include <unistd.h>
@@ -24,27 +24,37 @@ TYPED_TEST_SUITE(Overload, CodeUnits);
 template <class T, class N> void CallWithIntegers() {
   const N n = 3, i = 1, zero = 0;
   const T x = 'x';
-  basic_xstring<T> s(n, x);
+  basic_xstring<T> s;
   const basic_xstring<T> r = Of<T>("ab");
-  EXPECT_EQ(xvector<T>(n, x).size(), 3);
-  EXPECT_EQ((basic_xstring<T>(r.data(), i).size()), 1);
-  EXPECT_EQ((basic_xstring<T>(r, zero, i).size()), 1);
-  s.assign(n, x), s.append(n, x), s.insert(i, x), s.insert(i, n, x), s.insert(s.begin(), n, x),
-      s.insert(zero, r);
-  EXPECT_EQ(s.size(), 15);
-  s.assign(r.data(), i), s.append(r.data(), i), s.insert(i, r.data(), i), s.insert(zero, r.begin(), r.end());
-  EXPECT_EQ(s.size(), 5);
-  s.replace(zero, i, r), s.replace(i, i, n, x), s.replace(zero, zero, r.data(), 2), s.replace(i, i, r, 0, 1);
-  EXPECT_EQ(s.size(), 10);
-  s.erase(zero, i), s.erase_range(zero, i), s.erase_element(i), s.reserve(n), s.resize(n, x);
-  EXPECT_EQ(s.size(), 3);
-  EXPECT_EQ(s.find(x, zero) + s.substr(i, i).size() + s.compare(zero, n, s), 2);
-  s *= n;
-  EXPECT_TRUE(s[i] == x && std::as_const(s).front() == 'a');
-  s = std::as_const(s);
-  EXPECT_EQ(s.length(), 9);
-  s.insert(ssize_t(i), 2, x);
-  EXPECT_EQ(s.size(), 11);
+  EXPECT_EDIT(s, (s = basic_xstring<T>(n, x)), "xxx");
+  EXPECT_EDIT(s, (s = xvector<T>(n, x)), "xxx");
+  EXPECT_EDIT(s, (s = basic_xstring<T>(r, zero, i)), "a");
+  EXPECT_EDIT(s, (s = basic_xstring<T>(r.data(), i)), "a");
+  EXPECT_EDIT(s, s.append(n, x), "axxx");
+  EXPECT_EDIT(s, s.assign(n, x), "xxx");
+  EXPECT_EDIT(s, s.insert(zero, r), "abxxx");
+  EXPECT_EDIT(s, s.insert(i, x), "axbxxx");
+  EXPECT_EDIT(s, s.insert(i, n, x), "axxxxbxxx");
+  EXPECT_EDIT(s, s.insert(s.begin(), n, x), "xxxaxxxxbxxx");
+  EXPECT_EDIT(s, s.assign(r.data(), i), "a");
+  EXPECT_EDIT(s, s.append(r.data(), i), "aa");
+  EXPECT_EDIT(s, s.insert(i, r.data(), i), "aaa");
+  EXPECT_EDIT(s, s.insert(zero, r.begin(), r.end()), "abaaa");
+  EXPECT_EDIT(s, s.replace(zero, i, r), "abbaaa");
+  EXPECT_EDIT(s, s.replace(i, i, n, x), "axxxbaaa");
+  EXPECT_EDIT(s, s.replace(zero, zero, r.data(), 2), "abaxxxbaaa");
+  EXPECT_EDIT(s, s.replace(i, i, r, 0, 1), "aaaxxxbaaa");
+  EXPECT_EDIT(s, s.erase(zero, i), "aaxxxbaaa");
+  EXPECT_EDIT(s, s.erase_range(zero, i), "axxxbaaa");
+  EXPECT_EDIT(s, s.erase_element(i), "axxbaaa");
+  EXPECT_EDIT(s, s.reserve(n), "axxbaaa");
+  EXPECT_EDIT(s, s.resize(n, x), "axx");
+  EXPECT_EDIT(s, s *= n, "axxaxxaxx");
+  EXPECT_EDIT(s, s.insert(ssize_t(i), 2, x), "axxxxaxxaxx");
+  ExpectText(s.substr(i, i), "x", "substr");
+  EXPECT_EQ(s.find(x, zero), 1);
+  EXPECT_EQ(s.compare(zero, n, s), -1);
+  EXPECT_EQ(s[i], x);
 }
 
 template <class T, class... N> void CallWithEach() { (CallWithIntegers<T, N>(), ...); }
@@ -58,29 +68,52 @@ TYPED_TEST(Overload, LiteralZeroIsANumber) {
   const S r = Of<TypeParam>("ab");
   const TypeParam x = 'x';
   const ssize_t two = 2;
-  S s;
-  s.insert(0, x), s.insert(0, 3, x), s.insert(0, r), s.insert(0, 0x41), s.insert(0, r.data(), 1);
-  EXPECT_EQ(Std(s), Std(Of<TypeParam>("aAabxxxx")));
-  s.erase(0, 0), s.erase(0, 2), s.replace(0, 0, r), s.replace(0, 0, 1, x), s.replace(0, 0, r, 0, 1);
-  s.replace(0, 0, r.data(), 1), s.replace(0, 0, r.c_str());
-  EXPECT_EQ(Std(s), Std(Of<TypeParam>("abaaxababxxxx")));
-  s.insert(1, 0), s += 0, s.append(1, 0), s.append(0, 0x41), s.assign(3, 0x41), s.append(0, two);
-  EXPECT_EQ(Std(s), Std(Of<TypeParam>("AAA")));
-  s.insert(1, 3, 0x41), s.assign(0, 0x41), s.push_back(0);
-  EXPECT_EQ(s.find(0) + s.find(0, 0) + s.rfind(0) + s.find_first_of(0) + s.find_last_of(0), 0);
-  EXPECT_EQ(s.find_first_not_of(0) + s.find_last_not_of(0), 2 * kNpos);
-  EXPECT_EQ(s.find(0x2A, 0), kNpos);
-  EXPECT_EQ(r.rfind(r, 0) + r.find_last_of(x, 0) + r.find_last_not_of(r.data(), 0, 1), 0 + 2 * kNpos);
-  EXPECT_TRUE(S(0, 0x41).empty() && S(0, x).empty() && xvector<TypeParam>(0, 0x41).empty());
-  EXPECT_TRUE(S(nullptr, 0).empty() && S(nullptr, nullptr).empty() && xvector<TypeParam>(nullptr, 0).empty());
-  EXPECT_EQ(xvector<TypeParam>(r.data(), 0).size(), 0);
-  s = {};
-  EXPECT_EQ(s.size(), 0);
   enum { kZero };
-  s.replace(s.begin(), s.end(), 0, 0x41), s.insert(0, kZero, x), s.insert(s.begin(), 0, 0x41),
-      s.replace(0, 0, kZero, x);
+  S s;
+  EXPECT_EDIT(s, s.insert(0, x), "x");
+  EXPECT_EDIT(s, s.insert(0, 3, x), "xxxx");
+  EXPECT_EDIT(s, s.insert(0, r), "abxxxx");
+  EXPECT_EDIT(s, s.insert(0, 0x41), "Aabxxxx");
+  EXPECT_EDIT(s, s.insert(0, r.data(), 1), "aAabxxxx");
+  EXPECT_EDIT(s, s.erase(0, 0), "aAabxxxx");
+  EXPECT_EDIT(s, s.erase(0, 2), "abxxxx");
+  EXPECT_EDIT(s, s.replace(0, 0, r), "ababxxxx");
+  EXPECT_EDIT(s, s.replace(0, 0, 1, x), "xababxxxx");
+  EXPECT_EDIT(s, s.replace(0, 0, r, 0, 1), "axababxxxx");
+  EXPECT_EDIT(s, s.replace(0, 0, r.data(), 1), "aaxababxxxx");
+  EXPECT_EDIT(s, s.replace(0, 0, r.c_str()), "abaaxababxxxx");
+  EXPECT_EDIT(s, s.assign(3, 0x41), "AAA");
+  EXPECT_EDIT(s, s.append(0, 0x41), "AAA");
+  EXPECT_EDIT(s, s.append(0, two), "AAA");
+  EXPECT_EDIT(s, s.insert(1, 3, 0x41), "AAAAAA");
+  EXPECT_EDIT(s, s.insert(0, kZero, x), "AAAAAA");
+  EXPECT_EDIT(s, s.insert(s.begin(), 0, 0x41), "AAAAAA");
+  EXPECT_EDIT(s, s.replace(0, 5, kZero, x), "A");
+  EXPECT_EDIT(s, s.insert(1, 0), std::string("A\0", 2));
+  EXPECT_EDIT(s, s += 0, std::string("A\0\0", 3));
+  EXPECT_EDIT(s, s.append(1, 0), std::string("A\0\0\0", 4));
+  EXPECT_EDIT(s, s.replace(s.begin(), s.end(), 0, 0x41), "");
+  EXPECT_EDIT(s, s.push_back(0), std::string(1, '\0'));
+  EXPECT_EQ(s.find(0), 0);
+  EXPECT_EQ(s.find(0, 0), 0);
+  EXPECT_EQ(s.rfind(0), 0);
+  EXPECT_EQ(s.find_first_of(0), 0);
+  EXPECT_EQ(s.find_last_of(0), 0);
+  EXPECT_EQ(s.find_first_not_of(0), kNpos);
+  EXPECT_EQ(s.find_last_not_of(0), kNpos);
+  EXPECT_EQ(s.find(0x2A, 0), kNpos);
+  EXPECT_EQ(r.rfind(r, 0), 0);
+  EXPECT_EQ(r.find_last_of(x, 0), kNpos);
+  EXPECT_EQ(r.find_last_not_of(r.data(), 0, 1), kNpos);
+  EXPECT_EDIT(s, s.assign(0, 0x41), "");
+  EXPECT_EDIT(s, s = {}, "");
+  for (const S& empty :
+       {S(0, 0x41), S(0, x), S(nullptr, 0), S(nullptr, nullptr), S({r.data(), 0}), S({r, 0, 0})})
+    EXPECT_EQ(empty.size(), 0);
+  EXPECT_EQ(xvector<TypeParam>(0, 0x41).size(), 0);
+  EXPECT_EQ(xvector<TypeParam>(nullptr, 0).size(), 0);
+  EXPECT_EQ(xvector<TypeParam>(r.data(), 0).size(), 0);
   VectorOfByte().insert(nullptr, 0, 0);
-  EXPECT_TRUE(s.empty() && S({r.data(), 0}).empty() && S({r, 0, 0}).empty());
   static_assert(!std::is_constructible_v<S, std::nullptr_t>);
 }
 

@@ -1,4 +1,4 @@
-// Ranges of every kind of iterator, given to every member that takes one.
+// Ranges of every kind of iterator, passed to every member that takes one.
 #include "Support.h"
 
 #include <cstdint>
@@ -23,7 +23,7 @@ namespace {
 template <class T> class Range : public testing::Test {};
 TYPED_TEST_SUITE(Range, CodeUnits);
 
-const char kUnits[] = "ab\xE9\x80"; // the last two are negative where plain char has a sign
+const char kUnits[] = "ab\xE9\x80"; // the last two are negative if plain char is signed
 constexpr std::size_t kSize = 4;
 
 // Expectations stand outside the templates over iterators, which are compiled for every kind of range.
@@ -68,7 +68,7 @@ template <class T, class It> void ExpectSearches(It r1, It r2) {
   Expect(allocation::Count([&] { s.find(r1, r2), s.rfind(r1, r2), s.find_last_of(r1, r2); }), 0);
 }
 
-/// Expects the same of both, and how often an edit into storage with room allocates.
+/// Expects that members copy and find [r1, r2), and how often an edit into storage with room allocates.
 template <class T, class It> void ExpectAll(It r1, It r2, long allocations) {
   ExpectCopies<T>(r1, r2);
   ExpectSearches<T>(r1, r2);
@@ -88,13 +88,13 @@ template <class U> std::vector<U> Units() {
   return v;
 }
 
-/// Elements in one piece are copied without help if they are as wide as T.
-template <class T, class U> constexpr long kHelp = sizeof(U) == sizeof(T) ? 0 : 1;
+/// The allocations for a contiguous range, which isn't copied first if its elements are as wide as T.
+template <class T, class U> constexpr long kCopies = sizeof(U) == sizeof(T) ? 0 : 1;
 
 enum class Scoped : short {};
 template <class T, class... U> void ExpectElements() {
   const std::tuple<std::vector<U>...> units(Units<U>()...);
-  std::apply([](const auto&... v) { (ExpectAll<T>(v.data(), v.data() + kSize, kHelp<T, U>), ...); }, units);
+  std::apply([](const auto&... v) { (ExpectAll<T>(v.data(), v.data() + kSize, kCopies<T, U>), ...); }, units);
 }
 
 TYPED_TEST(Range, OfElementsOfAnyType) {
@@ -108,16 +108,16 @@ template <class T, class U> void ExpectIterators() {
   const std::list<U> list(v.begin(), v.end());
   const std::deque<U> deque(v.rbegin(), v.rend());
   const std::forward_list<U> forward(v.begin(), v.end());
-  ExpectAll<T>(std::as_const(v), kHelp<T, U>);
+  ExpectAll<T>(std::as_const(v), kCopies<T, U>);
   ExpectAll<T>(list, 1);
   ExpectAll<T>(forward, 1);
   ExpectAll<T>(deque.rbegin(), deque.rend(), 1);
   basic_xstring<T> s(v.begin(), v.end());
   s.reserve(100);
-  Expect(allocation::Count([&] { s.push_back(v.begin(), v.end()); }), kHelp<T, U>); // they aren't const
+  Expect(allocation::Count([&] { s.push_back(v.begin(), v.end()); }), kCopies<T, U>); // they aren't const
   Expect(s, Std(Of<T>(std::string(kUnits) + kUnits)));
 #if __cplusplus >= 202002L
-  ExpectAll<T>(std::span(v.data(), kSize), kHelp<T, U>);
+  ExpectAll<T>(std::span(v.data(), kSize), kCopies<T, U>);
 #endif
 }
 
@@ -131,13 +131,13 @@ TYPED_TEST(Range, OfStringsAndViewsAndOurs) {
   using T = TypeParam;
   const std::string narrow = kUnits;
   const std::u16string wide = u"ab\xE9\x80";
-  const long helpNarrow = sizeof(T) == 1 ? 0 : 1, helpWide = 1 - helpNarrow;
-  ExpectAll<T>(narrow, helpNarrow);
-  ExpectAll<T>(std::string_view(narrow), helpNarrow);
-  ExpectAll<T>(Of<char8>(kUnits), helpNarrow);
-  ExpectAll<T>(wide, helpWide);
-  ExpectAll<T>(std::u16string_view(wide), helpWide);
-  ExpectAll<T>(Of<char16>(kUnits), helpWide);
+  const long copiesNarrow = sizeof(T) == 1 ? 0 : 1, copiesWide = 1 - copiesNarrow;
+  ExpectAll<T>(narrow, copiesNarrow);
+  ExpectAll<T>(std::string_view(narrow), copiesNarrow);
+  ExpectAll<T>(Of<char8>(kUnits), copiesNarrow);
+  ExpectAll<T>(wide, copiesWide);
+  ExpectAll<T>(std::u16string_view(wide), copiesWide);
+  ExpectAll<T>(Of<char16>(kUnits), copiesWide);
   auto reversed = Of<T>(std::string(narrow.rbegin(), narrow.rend()));
   const auto& constant = reversed;
   ExpectCopies<T>(reversed.rbegin(), reversed.rend());
@@ -157,17 +157,16 @@ TYPED_TEST(Range, InTheStringItselfIsTakenAsItWas) {
   const auto* const p = reinterpret_cast<const Other*>(s.data());
   s.insert(1, p + 1, p + 4);
   EXPECT_EQ(Std(s), Std(Of<T>("abcdbcd")));
-  s.assign(s.rbegin(), s.rend());
-  EXPECT_EQ(Std(s), Std(Of<T>("dcbdcba")));
-  s.push_back(2, s.begin(), s.begin() + 1);
-  EXPECT_EQ(Std(s), Std(Of<T>("dcbdcbadd")));
+  EXPECT_EDIT(s, s.assign(s.rbegin(), s.rend()), "dcbdcba");
+  EXPECT_EDIT(s, s.push_back(2, s.begin(), s.begin() + 1), "dcbdcbadd");
 }
 
-TEST(RangeTest, UnitsWrittenAsAnotherTypeAreSeen) { // compilers take them for other memory
+TEST(RangeTest, UnitsWrittenAsAnotherTypeAreRead) { // compilers may assume that they don't alias ours
   const auto s = Of<char16>("abc");
   char16_t units[2];
   for (const int i : {0, 1}) {
-    units[0] = static_cast<char16_t>('a' + i), units[1] = static_cast<char16_t>('b' + i);
+    units[0] = static_cast<char16_t>('a' + i);
+    units[1] = static_cast<char16_t>('b' + i);
     EXPECT_TRUE(s.contains(units, units + 2, i));
     EXPECT_EQ(s.rfind(units, units + 2), i);
   }
@@ -176,7 +175,7 @@ TEST(RangeTest, UnitsWrittenAsAnotherTypeAreSeen) { // compilers take them for o
 TYPED_TEST(Range, ElementsThatDontFitAreNowhere) {
   const auto s = Of<TypeParam>("a\xFF");
   const int high = sizeof(TypeParam) == 1 ? 0x161 : 0x10061;
-  for (const int unit : {high, -1, -159}) { // cut, they would be in the string
+  for (const int unit : {high, -1, -159}) { // truncated, they would be in the string
     const std::vector<int> v = {unit};
     const std::list<long long> list = {unit};
     EXPECT_EQ(s.find(v.begin(), v.end()), kNpos) << unit;
@@ -199,15 +198,22 @@ TEST(RangeTest, ASingleUnitCountsByItsUnsignedValue) {
   string16 w;
   const char c = '\xE9';
   const signed char d = -23;
-  w += c, w.push_back(d), w.append(1, c), w.insert(0, c), w.insert(w.begin(), d), w.resize(6, c);
-  w.replace(5, 1, 1, d), w.push_front(c);
-  EXPECT_EQ(Std(w + c), (std::basic_string<char16>(8, 0xE9)));
-  EXPECT_EQ(Std(string16(8, c)), Std(w + d));
+  EXPECT_EDIT(w, w += c, "\xE9");
+  EXPECT_EDIT(w, w.push_back(d), "\xE9\xE9");
+  EXPECT_EDIT(w, w.append(1, c), "\xE9\xE9\xE9");
+  EXPECT_EDIT(w, w.insert(0, c), "\xE9\xE9\xE9\xE9");
+  EXPECT_EDIT(w, w.insert(w.begin(), d), "\xE9\xE9\xE9\xE9\xE9");
+  EXPECT_EDIT(w, w.resize(6, c), "\xE9\xE9\xE9\xE9\xE9\xE9");
+  EXPECT_EDIT(w, w.replace(0, 5, 1, d), "\xE9\xE9");
+  EXPECT_EDIT(w, w.push_front(c), "\xE9\xE9\xE9");
+  ExpectText(w + c, "\xE9\xE9\xE9\xE9", "+");
+  ExpectText(w + d, "\xE9\xE9\xE9\xE9", "+");
+  ExpectText(string16(2, c), "\xE9\xE9", "construction");
   EXPECT_EQ(w.find(c, 1), 1);
   EXPECT_EQ(w.find(true), kNpos);
   EXPECT_EQ(w.find_last_not_of(d), kNpos);
   EXPECT_EQ(w.FindAndEraseFirst(c), 1);
-  EXPECT_EQ(w.FindAndErase(d), 6);
+  EXPECT_EQ(w.FindAndErase(d), 2);
 }
 
 } // namespace

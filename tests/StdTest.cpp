@@ -1,4 +1,4 @@
-// Under using-directives of both namespaces, since neither's names may get in the way of the other's.
+// Uses both namespaces whole, since their names must not conflict.
 #include "Support.h"
 
 #include <algorithm>
@@ -25,7 +25,7 @@ namespace {
 template <class T> class StdLibrary : public testing::Test {};
 TYPED_TEST_SUITE(StdLibrary, CodeUnits);
 
-/// How a stands to b by each operator, a bit each in the order of the alphabet of kRelations.
+/// The results of all operators on a and b, a bit each.
 template <class A, class B> int Relations(const A& a, const B& b) {
   return (a == b) | (a != b) << 1 | (a < b) << 2 | (a <= b) << 3 | (a > b) << 4 | (a >= b) << 5;
 }
@@ -63,10 +63,10 @@ TYPED_TEST(StdLibrary, OperatorsOrderUnsignedUnits) {
     }
   }
   const S zero(1, 0);
-  EXPECT_TRUE(zero > S().c_str()) << "a zero counts in a string and ends a null-terminated one";
+  EXPECT_TRUE(zero > S().c_str()) << "a null counts in a string and ends a null-terminated one";
 }
 
-// Comparisons that are none of ours, and mean what they did.
+// Comparisons that aren't ours keep their meaning.
 TEST(StdLibrary, OtherComparisonsStayTheirOwn) {
   EXPECT_TRUE("abc"s < "b"sv);
   EXPECT_TRUE(std::make_pair(string8("a"), 2) < std::make_pair(string8("b"), 1));
@@ -84,7 +84,8 @@ TYPED_TEST(StdLibrary, MapsAreSearchedWithoutCopies) {
   const TypeParam* const p = long1.c_str();
   std::map<S, int, Less> ordered;
   std::unordered_map<MovableString<TypeParam>, int, Hash, Equal> hashed;
-  ordered[long1] = 1, hashed[long1] = 2;
+  ordered[long1] = 1;
+  hashed[long1] = 2;
   const long before = allocation::count;
   EXPECT_EQ(ordered.count(p), 1U);
   if constexpr (sizeof(TypeParam) == 1) {
@@ -132,7 +133,8 @@ TEST(StdLibrary, StreamsPadAsTheyPadAView) {
     os << std::setfill('_') << '<' << std::setw(6) << text << std::left << std::setw(5) << text << text
        << '>';
   };
-  write(ours, s), write(theirs, View(s));
+  write(ours, s);
+  write(theirs, View(s));
   EXPECT_EQ(ours.str(), theirs.str());
   ours.str("");
   ours << mstring8("ab") + s;
@@ -155,7 +157,8 @@ TYPED_TEST(StdLibrary, MovableStringsMoveStorage) {
               c = std::move(c);
               EXPECT_TRUE(b.empty());
               using std::swap;
-              swap(a, c), swap(a, b);
+              swap(a, c);
+              swap(a, b);
               s.swap(b);
             }),
             0);
@@ -164,7 +167,10 @@ TYPED_TEST(StdLibrary, MovableStringsMoveStorage) {
   M copy = s, sum = s + s, of = s.c_str(), two(2, 'x');
   EXPECT_EQ(sum, Of<TypeParam>("texttext"));
   EXPECT_EQ(two, Of<TypeParam>("xx"));
-  copy = sum, of = s, sum = s + copy, two = s.c_str();
+  copy = sum;
+  of = s;
+  sum = s + copy;
+  two = s.c_str();
   EXPECT_EQ(copy, Of<TypeParam>("texttext"));
   EXPECT_EQ(sum, Of<TypeParam>("texttexttext"));
   EXPECT_EQ(of, two);

@@ -1,4 +1,4 @@
-// What the tests share: strings of either width from literals, and allocations that are counted or refused.
+// Helpers of the tests: strings of either width from literals, and allocations that are counted or fail.
 
 #pragma once
 
@@ -17,7 +17,7 @@ using mirel::xvector;
 
 constexpr ssize_t kNpos = -1;
 
-/// The units of text, one for each byte.
+/// Makes a string with a unit for each byte of text.
 template <class T> basic_xstring<T> Of(const std::string& text) {
   basic_xstring<T> result;
   for (const char c : text)
@@ -27,19 +27,29 @@ template <class T> basic_xstring<T> Of(const std::string& text) {
 
 template <class T> std::basic_string<T> Std(const xvector<T>& v) {
   return v.empty() ? std::basic_string<T>()
-                   : std::basic_string<T>(v.begin(), v.end()); // null pointers won't do
+                   : std::basic_string<T>(v.begin(), v.end()); // which takes no null pointers
 }
+
+/// Expects that an edit leaves a unit for each byte of text.
+template <class T> void ExpectText(const xvector<T>& v, const std::string& text, const char* edit) {
+  EXPECT_EQ(Std(v), Std(Of<T>(text))) << "after " << edit;
+}
+#define EXPECT_EDIT(S, EDIT, TEXT)                                                                           \
+  do {                                                                                                       \
+    EDIT;                                                                                                    \
+    ExpectText(S, TEXT, #EDIT);                                                                              \
+  } while (false)
 
 /// Every test of a template runs for both widths.
 using CodeUnits = testing::Types<char8, char16>;
 
 namespace allocation {
 
-inline thread_local long count = 0;      ///< how many allocations this thread has made
-inline thread_local long failAfter = -1; ///< how many of its next ones succeed before one fails; -1 for all
-inline thread_local std::size_t requested = 0; ///< how many bytes the last one was to have
+inline thread_local long count = 0;            ///< how many allocations this thread has made
+inline thread_local long failAfter = -1;       ///< how many more succeed before one fails; -1 for all
+inline thread_local std::size_t requested = 0; ///< the size of the last one, in bytes
 
-/// Allocations that an action takes.
+/// Counts the allocations of an action.
 template <class F> long Count(const F& action) {
   const long before = count;
   action();

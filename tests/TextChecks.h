@@ -1,4 +1,4 @@
-// What the calls for text must give beside the oracle: for the tests and the fuzzer.
+// Compares the functions for text with the oracle, for the tests and the fuzzer.
 
 #pragma once
 
@@ -16,7 +16,7 @@ using mirel::OnMalformed;
 
 template <class T> using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
 
-/// What the oracle says of a text.
+/// The oracle's results for a text.
 template <class T> struct Expected {
   explicit Expected(View<T> source) {
     std::size_t at = 0;
@@ -37,7 +37,7 @@ template <class T> struct Expected {
   ssize_t malformed = 0, first = kNpos;
 };
 
-/// Walks the code points forwards and backwards.
+/// Checks the code points, walked forwards and backwards.
 template <class T> void CheckCodePoints(View<T> source, const Expected<T>& expected) {
   const auto range = mirel::CodePoints(source.data(), ssize_t(source.size()));
   auto i = range.begin();
@@ -52,15 +52,15 @@ template <class T> void CheckCodePoints(View<T> source, const Expected<T>& expec
   ASSERT_EQ(i.position(), ssize_t(source.size()));
   for (std::size_t k = expected.sequences.size(); k-- > 0;) {
     --i;
-    ASSERT_EQ(i.position(), ssize_t(expected.sequences[k].offset)) << "going back";
-    ASSERT_EQ(*i, expected.sequences[k].codePoint) << "going back";
+    ASSERT_EQ(i.position(), ssize_t(expected.sequences[k].offset)) << "backwards";
+    ASSERT_EQ(*i, expected.sequences[k].codePoint) << "backwards";
   }
   ASSERT_EQ(i, range.begin());
 }
 
-/// Calls f with each table of kernels that there is, and with null.
+/// Calls f with each table of kernels for this processor, and with null.
 template <class F> void ForEachKernels(const F& f) {
-#ifdef MIREL_SHARED // all of them are hidden in the library
+#ifdef MIREL_SHARED // a shared library hides its kernels
   static_cast<void>(f);
 #else
   const mirel::detail::Kernels* kernels = nullptr;
@@ -70,7 +70,7 @@ template <class F> void ForEachKernels(const F& f) {
 #endif
 }
 
-/// What doesn't depend on who calls: all of it by each of the kernels.
+/// Checks the workers of the calls, by each of the kernels.
 template <class T> void CheckKernels(View<T> source, const Expected<T>& expected) {
   const T *const p = source.data(), *const end = p + source.size();
   const ssize_t n = ssize_t(source.size()), count = ssize_t(expected.sequences.size());
@@ -89,7 +89,7 @@ template <class T> void CheckKernels(View<T> source, const Expected<T>& expected
   });
 }
 
-/// The calls of the header, which choose the kernels.
+// The functions of the header, which choose the kernels.
 inline bool AppendOther(mirel::string16& dst, const char8* p, ssize_t n) {
   return mirel::AppendUtf16(dst, p, n);
 }
@@ -114,7 +114,7 @@ template <class T> void CheckCalls(View<T> source, const Expected<T>& expected) 
   basic_xstring<Other<T>> dst(3, 'x');
   ASSERT_EQ(AppendOther(dst, source.data(), n), expected.first == kNpos);
   ASSERT_EQ(Std(dst), Text<Other<T>>(3, 'x') + expected.strict);
-  if constexpr (sizeof(T) == 2) { // from the standard library's units, which are another type
+  if constexpr (sizeof(T) == 2) { // the standard library's units are another type
     ASSERT_EQ(mirel::Utf8FromUtf16(dst, std::u16string(source.begin(), source.end())),
               expected.first == kNpos);
     ASSERT_EQ(Std(dst), expected.strict);
@@ -130,7 +130,7 @@ template <class T> void CheckCalls(View<T> source, const Expected<T>& expected) 
 
 template <class T> void CheckText(const Text<T>& text) {
   SCOPED_TRACE(testing::PrintToString(text));
-  const std::vector<T> exact(text.begin(), text.end()); // whose end a sanitizer sees
+  const std::vector<T> exact(text.begin(), text.end()); // so that a sanitizer checks its end
   const View<T> source(exact.data(), exact.size());
   const Expected<T> expected(source);
   ASSERT_NO_FATAL_FAILURE(Check<Other<T>>(source));
@@ -139,13 +139,13 @@ template <class T> void CheckText(const Text<T>& text) {
   ASSERT_NO_FATAL_FAILURE(CheckCodePoints(source, expected));
 }
 
-/// Feeds a text in two or three pieces, and a byte at a time.
+/// Checks the conversion of a text in pieces that end at the cuts.
 template <class T> void CheckPieces(const Text<T>& text, const std::vector<std::size_t>& cuts) {
   const Expected<T> expected{View<T>(text)};
   for (const OnMalformed policy : {OnMalformed::kStop, OnMalformed::kReplace}) {
     const bool isStrict = policy == OnMalformed::kStop;
     mirel::UtfStream<Other<T>, T> stream(policy);
-    for (int again = 0; again < 2; ++again) { // a finished stream begins anew
+    for (int again = 0; again < 2; ++again) { // a finished stream begins another text
       basic_xstring<Other<T>> dst(1, 'x');
       std::size_t at = 0;
       bool ok = true;

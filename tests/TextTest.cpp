@@ -1,5 +1,5 @@
-// Malformed text, lengths, code points, lossy and appending conversions and those in pieces, beside the
-// oracle and, where it is installed, ICU: by every kernel that the processor has, and by the scalar path.
+// Malformed text, lengths, code points, and conversions that are lossy, append or take pieces, compared with
+// the oracle and, where it is installed, with ICU: by every kernel of the processor and by the scalar path.
 #include "TextChecks.h"
 
 #include <random>
@@ -18,7 +18,7 @@ using namespace oracle;
 const Text<char8> kPieces8[] = {
     "a", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80", "\xDF\xBF", "\xEF\xBC\x8C", "\xED\x9F\xBF",
     "\xF4\x8F\xBF\xBF",
-    // malformed: overlong, surrogates, beyond U+10FFFF, cut off or wrong in one byte, invalid
+    // malformed: overlong, surrogates, beyond U+10FFFF, truncated or wrong in one byte, invalid
     "\xC0\xAF", "\xC1\xA9", "\xE0\x9F\xBF", "\xED\xA0\x80", "\xF0\x8F\xBF\xBF", "\xF4\x90\x80\x80",
     "\xF5\x80\x80\x80", "\x80", "\xC3", "\xE1", "\xE2\x82", "\xE0\xA0", "\xF0\x9F\x98", "\xF1\x80", "\xFF",
     "\xC3 ", "\x82\xAC", "\xC3\xA9\xA9", "\xE1 \xAC", "\xE1\x82 ", "\xE2\xC0\xAC", "\xF0\xA0\x80 "};
@@ -28,8 +28,8 @@ const Text<char16> kPieces16[] = {{'a'},    {0xE9},   {0x20AC}, {0xD83D, 0xDE00}
 const auto& Pieces(char8) { return kPieces8; }
 const auto& Pieces(char16) { return kPieces16; }
 
-/// So many units of a mixture of pieces, of which kinds chooses some, with the malformed ones rarer or
-/// denser, and of other code points with as many bytes of UTF-8; the last piece may be cut off.
+/// Makes a text of so many units: some kinds of pieces, a random share of them malformed, and random code
+/// points of the same lengths in UTF-8. The last piece may be truncated.
 template <class T, class Random> Text<T> Mixture(Random& random, std::size_t size) {
   const auto& pieces = Pieces(T());
   const auto kinds = random(), rarity = 1 + random() % 60;
@@ -42,7 +42,7 @@ template <class T, class Random> Text<T> Mixture(Random& random, std::size_t siz
     const char32_t c = kLimits[length] + char32_t(random()) % (kLimits[length + 1] - kLimits[length]);
     if (kind < kWellFormed && (kinds >> kind & 1) == 0 && kinds % 8 != 0)
       continue;
-    if (kind < 4 && random() % 2 == 0 && !IsLead(c) && !IsTrail(c))
+    if (kind < 4 && random() % 2 == 0 && !IsSurrogate(c))
       Put(text, c);
     else
       text += pieces[kind];
@@ -54,9 +54,8 @@ template <class T, class Random> Text<T> Mixture(Random& random, std::size_t siz
 template <class T> class UtfText : public testing::Test {};
 TYPED_TEST_SUITE(UtfText, CodeUnits);
 
-/// One or two sequences between n of another kind on both sides: kinds of blocks, places in them, and blocks'
-/// ends.
-TYPED_TEST(UtfText, OneOrTwoAmongOthers) {
+/// One or two sequences between n equal ones on both sides: every kind of block, and every place in it.
+TYPED_TEST(UtfText, SequencesAtEveryPlaceInABlock) {
   const auto& pieces = Pieces(TypeParam());
   const Text<TypeParam> fault(1, static_cast<TypeParam>(sizeof(TypeParam) == 1 ? 0xFF : 0xDC00));
   for (std::size_t n = 0; n < 135; ++n)
@@ -68,7 +67,7 @@ TYPED_TEST(UtfText, OneOrTwoAmongOthers) {
         ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + text));
         const auto& other = pieces[n % std::size(pieces)];
         ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + other));
-        // Blocks with replacements begin at a fault.
+        // Kernels that replace malformed text begin a block at a fault.
         ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(fault + text + one + other + text));
       }
 }
@@ -80,7 +79,7 @@ TYPED_TEST(UtfText, Mixtures) {
     ASSERT_NO_FATAL_FAILURE(CheckText(Mixture<TypeParam>(random, random() % (round % 64 == 0 ? 4000 : 500))));
 }
 
-/// More than the lanes of a kernel can count before they are added up.
+/// More units than the lanes of a kernel can count before they are summed.
 TYPED_TEST(UtfText, LongTextIsCounted) {
   const Text<TypeParam> text(1200000, 'a');
   ForEachKernels([&](const mirel::detail::Kernels* kernels) {
@@ -90,7 +89,7 @@ TYPED_TEST(UtfText, LongTextIsCounted) {
   });
 }
 
-TEST(UtfText, ReasonsAreTold) {
+TEST(UtfText, EachFaultHasItsReason) {
   struct {
     Text<char8> text;
     ssize_t length;
@@ -123,7 +122,7 @@ TEST(UtfText, ReasonsAreTold) {
                "unpaired surrogate");
 }
 
-TYPED_TEST(UtfText, InPiecesAsInOne) {
+TYPED_TEST(UtfText, AnyPiecesGiveTheResultOfTheWhole) {
   std::mt19937 random(4);
   for (int round = 0; round < 400; ++round) {
     const Text<TypeParam> text = Mixture<TypeParam>(random, random() % 14);
@@ -138,7 +137,7 @@ TYPED_TEST(UtfText, InPiecesAsInOne) {
   }
 }
 
-TEST(UtfText, MalformedPiecesAreToldAtOnce) {
+TEST(UtfText, AStreamStopsAtMalformedText) {
   mirel::Utf8Stream stream;
   mirel::string16 dst;
   EXPECT_TRUE(stream.Append(dst, "ab\xE2"));
@@ -150,14 +149,14 @@ TEST(UtfText, MalformedPiecesAreToldAtOnce) {
   EXPECT_EQ(stream.malformed().offset, 2);
   EXPECT_EQ(stream.malformed().length, 2);
   EXPECT_EQ(stream.malformed().reason, MalformedReason::kTruncated);
-  EXPECT_FALSE(stream.Append(dst, "e", 1)) << "stays so";
+  EXPECT_FALSE(stream.Append(dst, "e", 1)) << "a stopped stream takes nothing";
   EXPECT_FALSE(stream.Finish(dst));
   EXPECT_EQ(dst.size(), 2);
-  EXPECT_TRUE(stream.Append(dst, "e", 1)) << "of the next text";
+  EXPECT_TRUE(stream.Append(dst, "e", 1)) << "the next text begins";
   EXPECT_EQ(stream.malformed().offset, kNpos);
   EXPECT_TRUE(stream.Append(dst, nullptr, 0));
   EXPECT_TRUE(stream.Finish(dst));
-  EXPECT_TRUE(stream.Finish(dst)) << "of an empty text";
+  EXPECT_TRUE(stream.Finish(dst)) << "an empty text is well-formed";
   EXPECT_EQ(dst.size(), 3);
 }
 
@@ -217,11 +216,12 @@ TEST(UtfText, StringsViewsAndLiterals) {
 TYPED_TEST(UtfText, CodePointsAreAppended) {
   basic_xstring<TypeParam> s;
   Text<TypeParam> expected;
-  for (const char32_t c : {0u, 0x7Fu, 0x80u, 0x7FFu, 0x800u, 0xFFFFu, 0xD7FFu, 0xE000u, 0x10000u, 0x10FFFFu})
-    mirel::AppendCodePoint(s, c), Put(expected, c);
-  for (const char32_t c : {0xD800u, 0xDFFFu, 0x110000u})
-    mirel::AppendCodePoint(s, c), Put(expected, 0xFFFD);
-  EXPECT_EQ(Std(s), expected);
+  for (const char32_t c : {0u, 0x7Fu, 0x80u, 0x7FFu, 0x800u, 0xFFFFu, 0xD7FFu, 0xE000u, 0x10000u, 0x10FFFFu,
+                           0xD800u, 0xDFFFu, 0x110000u}) {
+    mirel::AppendCodePoint(s, c);
+    Put(expected, IsSurrogate(c) || c > 0x10FFFF ? 0xFFFD : c);
+    EXPECT_EQ(Std(s), expected);
+  }
 }
 
 using Iterator = mirel::CodePointIterator<char8>;
@@ -233,7 +233,7 @@ static_assert(std::ranges::bidirectional_range<mirel::CodePointRange<char16>>);
 #endif
 
 #ifdef HAVE_ICU
-TEST(UtfText, AMillionMutatedTextsAsIcuReplacesThem) {
+TEST(UtfText, AMillionMutatedTextsAreReplacedAsByIcu) {
   std::mt19937 random(8);
   mirel::string16 wide;
   mirel::string8 narrow;

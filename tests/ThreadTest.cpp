@@ -1,4 +1,4 @@
-// Different objects may be used, and one that nobody changes be read, by different threads at the same time.
+// Threads may use different objects at the same time, and read one object that no thread changes.
 #include "Support.h"
 
 #include <thread>
@@ -30,16 +30,21 @@ TEST(Thread, UsesItsOwnObjects) {
   });
 }
 
-TEST(Thread, ReadsWhatOthersRead) {
+TEST(Thread, ReadsASharedObject) {
   const mirel::string8 text = "never \u20AC changed";
   const mirel::string16 wide = Of<char16>("never changed");
   InFourThreads([&] {
     for (int i = 0; i < 2000; ++i) {
       mirel::string16 converted;
       ASSERT_TRUE(mirel::Utf16FromUtf8(converted, text.data(), text.size()));
-      ASSERT_TRUE(text.find("chan") == 10 && text.rfind('n') == 13 && text.compare(text) == 0);
-      ASSERT_TRUE(wide.find_first_of(wide.begin() + 3, wide.end()) == 0 && wide._Eq(mirel::string16(wide)) &&
-                  wide.substr(2, 5).size() == 5 && wide[0] == 'n' && *wide.rbegin() == 'd');
+      ASSERT_EQ(text.find("chan"), 10);
+      ASSERT_EQ(text.rfind('n'), 13);
+      ASSERT_EQ(text.compare(text), 0);
+      ASSERT_EQ(wide.find_first_of(wide.begin() + 3, wide.end()), 0);
+      ASSERT_TRUE(wide._Eq(mirel::string16(wide)));
+      ASSERT_EQ(wide.substr(2, 5).size(), 5);
+      ASSERT_EQ(wide[0], 'n');
+      ASSERT_EQ(*wide.rbegin(), 'd');
     }
   });
 }

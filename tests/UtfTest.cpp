@@ -1,5 +1,5 @@
-// The conversions beside their oracle: all short inputs, and those in which kinds of sequences, ends of
-// blocks and malformed sequences meet, by every kernel that the processor has and by the scalar path.
+// The conversions compared with their oracle, by every kernel of the processor and by the scalar path: all
+// short inputs, and inputs in which different sequences, malformed ones and the ends of blocks meet.
 #include "Oracle.h"
 
 #include <algorithm>
@@ -15,25 +15,30 @@ TEST(Utf, EveryScalarValueBothWays) {
   Text<char8> allBytes, bytes;
   Text<char16> allUnits, units;
   for (char32_t c = 0; c <= 0x10FFFF; ++c) {
-    if (IsLead(c) || IsTrail(c))
+    if (IsSurrogate(c))
       continue;
-    bytes.clear(), units.clear();
-    Put(bytes, c), Put(units, c);
+    bytes.clear();
+    units.clear();
+    Put(bytes, c);
+    Put(units, c);
     ASSERT_NO_FATAL_FAILURE(Check<char16>(View<char8>(bytes)));
     ASSERT_NO_FATAL_FAILURE(Check<char8>(View<char16>(units)));
-    allBytes += bytes, allUnits += units;
+    allBytes += bytes;
+    allUnits += units;
   }
-  Check<char16>(View<char8>(allBytes)), Check<char8>(View<char16>(allUnits));
-  ASSERT_TRUE(Convert(units, allBytes) && units == allUnits) << "the oracle goes both ways";
+  Check<char16>(View<char8>(allBytes));
+  Check<char8>(View<char16>(allUnits));
+  ASSERT_TRUE(Convert(units, allBytes));
+  ASSERT_TRUE(units == allUnits) << "the oracle's two directions differ";
 }
 
 TEST(Utf, EverySequenceOfUpToThreeBytes) {
   for (unsigned bytes = 0; bytes < 1u << 24; ++bytes) {
     const char8 text[] = {static_cast<char8>(bytes >> 16), static_cast<char8>(bytes >> 8),
                           static_cast<char8>(bytes)};
-    const std::size_t zeros = bytes < 0x100 ? 2 : bytes < 0x10000; // they were seen before
+    const std::size_t zeros = bytes < 0x100 ? 2 : bytes < 0x10000; // leading ones were tested before
     const View<char8> view = View<char8>(text, 3).substr(zeros);
-    ASSERT_NO_FATAL_FAILURE(CheckAmongLetters(view));
+    ASSERT_NO_FATAL_FAILURE(CheckAmongSequences(view));
     const Sequence expected = First(view);
     const auto decoded = mirel::detail::Decode(view.data(), view.data() + view.size());
     if (decoded.codePoint != expected.codePoint || decoded.length != int(expected.length) ||
@@ -43,14 +48,14 @@ TEST(Utf, EverySequenceOfUpToThreeBytes) {
 }
 
 TEST(Utf, FourBytes) {
-  const unsigned tails[] = {0x7F, 0x80, 0x9A, 0xBF, 0xC0};
+  const unsigned nearContinuations[] = {0x7F, 0x80, 0x9A, 0xBF, 0xC0};
   for (unsigned lead = 0xF0; lead < 0x100; ++lead)
     for (unsigned second = 0; second < 0x100; ++second)
-      for (const unsigned c : tails)
-        for (const unsigned d : tails) {
-          const char8 text[] = {static_cast<char8>(lead), static_cast<char8>(second), static_cast<char8>(c),
-                                static_cast<char8>(d)};
-          ASSERT_NO_FATAL_FAILURE(CheckAmongLetters(View<char8>(text, 4)));
+      for (const unsigned third : nearContinuations)
+        for (const unsigned fourth : nearContinuations) {
+          const char8 text[] = {static_cast<char8>(lead), static_cast<char8>(second),
+                                static_cast<char8>(third), static_cast<char8>(fourth)};
+          ASSERT_NO_FATAL_FAILURE(CheckAmongSequences(View<char8>(text, 4)));
         }
 }
 
@@ -60,12 +65,12 @@ TEST(Utf, SurrogatesMustPair) {
   for (const char16 a : values)
     for (const char16 b : values)
       for (const char16 c : values)
-        ASSERT_NO_FATAL_FAILURE(CheckAmongLetters<char16>(Text<char16>{a, b, c}));
+        ASSERT_NO_FATAL_FAILURE(CheckAmongSequences<char16>(Text<char16>{a, b, c}));
 }
 
 #ifndef MIREL_SHARED
-/// Converts source by every kernel into every room: nothing is written past its end, and what is written
-/// is the beginning of the result.
+/// Converts source by every kernel into room of every size, and expects that nothing is written past its end
+/// and that the beginning of the result is written.
 template <class CharOut, class CharIn, class F> void CheckEveryRoom(View<CharIn> source, const F& convert) {
   Text<CharOut> expected;
   ASSERT_TRUE(Convert(expected, source));
@@ -104,8 +109,7 @@ TEST(Utf, StaysWithinItsRoom) {
 }
 #endif
 
-/// The destination keeps what it had, and of what a conversion obtains no more than the result and its
-/// terminator.
+/// Expects that the destination keeps its capacity, or gets that of the result and its terminator.
 template <class CharOut, class CharIn> void CheckCapacity(const Text<CharIn>& text, bool isWellFormed) {
   ForEachWay<CharOut, CharIn>([&](const auto& convert, const char* name) {
     for (const ssize_t before : {0, 1, 30, 400, 2000}) {
@@ -124,8 +128,10 @@ template <class CharOut, class CharIn> void CheckCapacity(const Text<CharIn>& te
 TEST(Utf, CapacityIsGivenBack) {
   Text<char8> bytes;
   Text<char16> units;
-  for (int n = 0; n < 200; ++n)
-    bytes += n % 3 == 0 ? "a" : "\u20AC", units += n % 3 == 0 ? char16{'a'} : char16{0x20AC};
+  for (int n = 0; n < 200; ++n) {
+    bytes += n % 3 == 0 ? "a" : "\u20AC";
+    units += n % 3 == 0 ? char16{'a'} : char16{0x20AC};
+  }
   for (const std::size_t n : {1u, 5u, 20u, 97u, 200u}) {
     CheckCapacity<char16>(bytes.substr(0, n - n % 7 + 1), true); // at boundaries of sequences
     CheckCapacity<char8>(units.substr(0, n), true);
@@ -143,7 +149,8 @@ TEST(Utf, AsciiOfEveryLength) {
     for (std::size_t at = 0; at < n; ++at) {
       std::vector<char8> text(n, 'a');
       Text<char16> expected(n, 'a');
-      text[at] = static_cast<char8>(0x80 + at), expected[at] = '?';
+      text[at] = static_cast<char8>(0x80 + at);
+      expected[at] = '?';
       mirel::Utf16FromAscii(wide, text.data(), static_cast<ssize_t>(n));
       ASSERT_EQ(Std(wide), expected);
     }

@@ -20,18 +20,19 @@ TYPED_TEST_SUITE(RangeAlgorithms, CodeUnits);
 
 TYPED_TEST(RangeAlgorithms, OrderUnitsAsUnsigned) {
   const TypeParam low[] = {1, 0x7F};
-  static TypeParam high[] = {1, static_cast<TypeParam>(0x80)}; // through non-const pointers, the template
+  static TypeParam high[] = {1, static_cast<TypeParam>(0x80)}; // non-const pointers take the template
   const TypeParam* const constHigh = high;
   EXPECT_LT(LexicographicalCompareX(low, low + 2, constHigh, constHigh + 2), 0);
   EXPECT_GT(LexicographicalCompareX(high, high + 2, low, low + 2), 0);
   const TypeParam* const null = nullptr;
   EXPECT_EQ(LexicographicalCompareX(null, null, null, null), 0);
   EXPECT_EQ(LexicographicalCompareX(null, null, low, low + 1), -1);
-  EXPECT_TRUE(IsEqual(null, null, null) && IsEqual(low, low + 1, constHigh) &&
-              !IsEqual(low, low + 2, constHigh));
+  EXPECT_TRUE(IsEqual(null, null, null));
+  EXPECT_TRUE(IsEqual(low, low + 1, constHigh));
+  EXPECT_FALSE(IsEqual(low, low + 2, constHigh));
 }
 
-/// Where the standard library finds what all eight searches look for.
+/// The results of the standard library for all eight searches.
 template <class It1, class It2> std::array<It1, 8> Expected(It1 x1, It1 x2, It2 y1, It2 y2) {
   const std::reverse_iterator<It1> r1(x2), r2(x1);
   const auto isIn = [=](auto x) { return std::find(y1, y2, x) != y2; };
@@ -42,13 +43,13 @@ template <class It1, class It2> std::array<It1, 8> Expected(It1 x1, It1 x2, It2 
           last(std::find_if(r1, r2, isIn)), last(std::find_if_not(r1, r2, isIn))};
 }
 
-/// The templates for iterators of other containers: those of a list, and random-access ones.
+/// Checks the templates for the iterators of any container.
 template <class Container> void SearchAnyContainer() {
-  const auto binary = [](unsigned bits) { // the digits of a number behind its first
-    Container letters;
+  const auto binary = [](unsigned bits) { // the binary digits of a number without the highest
+    Container digits;
     for (; bits > 1; bits /= 2)
-      letters.push_back(bits % 2 == 0 ? 'a' : 'b');
-    return letters;
+      digits.push_back(bits % 2 == 0 ? 'a' : 'b');
+    return digits;
   };
   for (unsigned bits = 1; bits < 1 << 7; ++bits)
     for (unsigned needleBits = 1; needleBits < 1 << 4; ++needleBits) {
@@ -84,7 +85,7 @@ template <class T> struct Way {
   mirel::detail::SearchKernels<T> searches;
 };
 
-/// Those that a program gets, the scalar path, and each of the processor's kernels.
+/// The functions that a program calls, the scalar path, and each of the processor's kernels.
 template <class T> std::vector<Way<T>> Ways() {
   using P = const T*;
   using namespace mirel::detail;
@@ -98,7 +99,7 @@ template <class T> std::vector<Way<T>> Ways() {
         [](P x1, P x2, P y1, P y2) { return FindLastOf(x1, x2, y1, y2); },
         [](P x1, P x2, P y1, P y2) { return FindLastNotOf(x1, x2, y1, y2); },
         BestSearches(P()).findDifference}}};
-#ifndef MIREL_SHARED // it hides the others
+#ifndef MIREL_SHARED // a shared library hides its kernels
   ways.push_back({"scalar", ScalarSearches<T>()});
   for (int k = 0; const Kernels* const kernels = KernelsAt(k); ++k)
     if constexpr (sizeof(T) == 1)
@@ -109,7 +110,7 @@ template <class T> std::vector<Way<T>> Ways() {
   return ways;
 }
 
-TYPED_TEST(RangeAlgorithms, NothingIsInNothing) {
+TYPED_TEST(RangeAlgorithms, EmptyRangesAndSets) {
   using T = TypeParam;
   const T text[] = {'a', 'b'}, *const x2 = text + 2, *const null = nullptr;
   for (const auto& [name, s] : Ways<T>()) {
@@ -127,8 +128,7 @@ TYPED_TEST(RangeAlgorithms, NothingIsInNothing) {
   EXPECT_EQ(FindLastSubSequence(text, x2, null, null), x2);
 }
 
-/// Expects of every way to search what the standard library says. Both vectors end where what may be read
-/// does.
+/// Compares every way to search with the standard library. A sanitizer checks the ends of both vectors.
 template <class T> void Check(const std::vector<T>& text, const std::vector<T>& what) {
   static const std::vector<Way<T>> ways = Ways<T>();
   const T *const x1 = text.data(), *const x2 = x1 + text.size(), *const y1 = what.data(),
@@ -143,7 +143,7 @@ template <class T> void Check(const std::vector<T>& text, const std::vector<T>& 
                               s.findFirstNotOf(x1, x2, y1, y2),
                               s.findLastOf(x1, x2, y1, y2),
                               s.findLastNotOf(x1, x2, y1, y2)};
-    for (std::size_t k = 0; k < 8; ++k) // a macro for each would take most of the time
+    for (std::size_t k = 0; k < 8; ++k) // expectations would take most of the time
       if (found[k] != expected[k])
         FAIL() << name << ", search " << k << " of " << text.size() << " units: " << found[k] - x1 << ", not "
                << expected[k] - x1 << "; " << testing::PrintToString(what);
@@ -154,15 +154,19 @@ TYPED_TEST(RangeAlgorithms, OneHitAtEveryPlace) {
   using T = TypeParam;
   using Units = std::vector<T>;
   using Texts = std::vector<Units>;
-  const T high = static_cast<T>('a' + (1u << (8 * sizeof(T) - 1))); // the highest bit is all that differs
+  const T high =
+      static_cast<T>('a' + (1u << (8 * sizeof(T) - 1))); // differs from 'a' in the highest bit only
   Texts sets = {{'a', 'b'}, {'b', 'c', 'd', 'a', high}, Units(70, high), Units(70, 'a'), {}, {}, {}};
-  for (unsigned k = 0; k < 26; ++k) // of few rows of 16, and of many
-    sets[4].push_back(static_cast<T>('b' + k)), sets[5].push_back(static_cast<T>(0xA0 + 17 * k));
-  for (unsigned k = 0; k < 72; ++k) // of nine rows, the last of which shares its bit with the one of 'a'
+  for (unsigned k = 0; k < 26; ++k) { // members in few rows of 16 units, and in many
+    sets[4].push_back(static_cast<T>('b' + k));
+    sets[5].push_back(static_cast<T>(0xA0 + 17 * k));
+  }
+  for (unsigned k = 0; k < 72;
+       ++k) // members in nine rows, the last of which shares its bit with the row of 'a'
     sets[6].push_back(static_cast<T>(k % 9 < 8 ? 0x62 + k % 9 * 16 : 0xE1));
   for (std::size_t size = 0; size < 420; size += size < 150 ? 1 : 29) {
     std::vector<T> text(size, 'a');
-    for (std::size_t at = 0; at <= size; ++at) { // in the last round there is none
+    for (std::size_t at = 0; at <= size; ++at) { // the last round has no hit
       if (at < size)
         text[at] = high;
       for (const auto& what : Texts{{high}, {high, 'a'}, {'b', high}, {'a', high, 'a'}, sets[at % 7]})
@@ -190,10 +194,10 @@ TEST(RangeAlgorithmsTest, OneDifferenceAtEveryPlace) {
   }
 }
 
-/// A unit that the tables of a set can't tell from a member, and a member so near an end that smaller vectors
-/// are left: it was missed once.
+/// A unit that a set's tables take for a member, and then a member near the end, in what smaller vectors
+/// search: it was missed once.
 TEST(RangeAlgorithmsTest, MembersBehindAFalseHit) {
-  std::vector<char16> set; // of nine rows, so that the first and the last share a bit
+  std::vector<char16> set; // in nine rows, the first and the last of which share a bit
   for (int row = 0; row < 9; ++row)
     set.push_back(static_cast<char16>(0x1009 + row * 0x1110));
   for (std::size_t between = 0; between < 20; ++between) {
@@ -207,7 +211,7 @@ TEST(RangeAlgorithmsTest, MembersBehindAFalseHit) {
   }
 }
 
-/// A place where all but one unit of the needle stand, wherever that one is.
+/// A place that differs from the needle in one unit, at every index.
 TYPED_TEST(RangeAlgorithms, NeedlesThatDifferInOneUnit) {
   using Units = std::vector<TypeParam>;
   for (const std::size_t size : {3u, 17u, 41u, 64u, 100u, 300u}) {
@@ -242,13 +246,15 @@ TYPED_TEST(RangeAlgorithms, RandomTextsNeedlesAndSets) {
   }
 }
 
-/// Needles that are found late or not at all, and are much like the text before: of the Fibonacci word, of
-/// a unit repeated with another in it, and of a period that fails behind its 40th unit.
+/// Needles that are found late or never and resemble the text before: parts of the Fibonacci word, a repeated
+/// unit with another one in it, and a period that fails behind its 40th unit.
 TYPED_TEST(RangeAlgorithms, PeriodicNeedles) {
   using T = TypeParam;
   std::string fibonacci = "ab", before = "a", period;
-  while (fibonacci.size() < 3000)
-    before.swap(fibonacci), fibonacci = before + fibonacci;
+  while (fibonacci.size() < 3000) {
+    before.swap(fibonacci);
+    fibonacci = before + fibonacci;
+  }
   while (period.size() < 3000)
     period += "aabab";
   const auto check = [](const std::string& text, std::string needle) {
@@ -258,10 +264,12 @@ TYPED_TEST(RangeAlgorithms, PeriodicNeedles) {
   for (const std::size_t n : {1u, 2u, 5u, 40u, 63u, 64u, 200u, 700u})
     for (const std::size_t m : {0u, 1u, 3u, 21u, 55u, 300u}) {
       const std::string a(n, 'a'), b = a + 'b' + std::string(m, 'a');
-      check(std::string(2000, 'a'), b), check(std::string(1500, 'a') + 'b' + std::string(m + 9, 'a'), b);
-      check(fibonacci, fibonacci.substr(m, n)), check(fibonacci, fibonacci.substr(m, n) + "bb");
-      check(period + fibonacci, period.substr(m, n + 45) + 'b'),
-          check(period + 'b', period.substr(0, m + 45) + 'b');
+      check(std::string(2000, 'a'), b);
+      check(std::string(1500, 'a') + 'b' + std::string(m + 9, 'a'), b);
+      check(fibonacci, fibonacci.substr(m, n));
+      check(fibonacci, fibonacci.substr(m, n) + "bb");
+      check(period + fibonacci, period.substr(m, n + 45) + 'b');
+      check(period + 'b', period.substr(0, m + 45) + 'b');
     }
 }
 
@@ -303,51 +311,81 @@ TYPED_TEST(RangeAlgorithms, NoNeedleIsSlow) {
   EXPECT_LT(time.count(), 8) << "seconds; with the product of the lengths one search takes longer";
 }
 
+/// Expects that an edit of b leaves these bytes.
+#define EXPECT_BYTES(EDIT, ...)                                                                              \
+  EDIT;                                                                                                      \
+  EXPECT_EQ(b, (VectorOfByte{__VA_ARGS__})) << "after " << #EDIT
+
 TEST(VectorOfByteTest, EditsAtAnyPlace) {
   VectorOfByte b;
   b.insertbytes(0, 2);
-  b[0] = 1, b[1] = 2;
-  b.insert(1, 3), b.insert(0, 2, 9), b.insert(b.end(), 7), b.push_back(uint8(8)),
-      b.push_back(b.begin(), b.end());
-  EXPECT_EQ(b, (VectorOfByte{9, 9, 1, 3, 2, 7, 8, 9, 9, 1, 3, 2, 7, 8}));
-  b.erase(0, 2), b.move(0, 1, 3), b.erase(b.begin() + 4, b.end()), b.erase_element(0);
-  EXPECT_EQ(b, (VectorOfByte{2, 7, 7}));
+  b[0] = 1;
+  EXPECT_BYTES(b[1] = 2, 1, 2);
+  EXPECT_BYTES(b.insert(1, 3), 1, 3, 2);
+  EXPECT_BYTES(b.insert(0, 2, 9), 9, 9, 1, 3, 2);
+  EXPECT_BYTES(b.insert(b.end(), 7), 9, 9, 1, 3, 2, 7);
+  EXPECT_BYTES(b.push_back(uint8(8)), 9, 9, 1, 3, 2, 7, 8);
+  EXPECT_BYTES(b.push_back(b.begin(), b.end()), 9, 9, 1, 3, 2, 7, 8, 9, 9, 1, 3, 2, 7, 8);
+  EXPECT_BYTES(b.erase(0, 8), 9, 1, 3, 2, 7, 8);
+  EXPECT_BYTES(b.move(0, 1, 3), 1, 3, 2, 2, 7, 8);
+  EXPECT_BYTES(b.erase(b.begin() + 4, b.end()), 1, 3, 2, 2);
+  EXPECT_BYTES(b.erase_element(0), 3, 2, 2);
   EXPECT_EQ(*b.insert(b.begin() + 1, 5), 5);
-  EXPECT_EQ(*b.erase(b.begin()), 5);
-  b.insert(1, b.begin(), b.end()), b += b;
-  EXPECT_EQ(b, (VectorOfByte{5, 5, 7, 7, 7, 7, 5, 5, 7, 7, 7, 7}));
-  b.assign(b.begin() + 1, b.begin() + 3), b.insert(b.begin(), 2, b.front()),
-      b.insert(0, b.data(), b.data_end());
-  EXPECT_EQ(b, (VectorOfByte{5, 5, 5, 7, 5, 5, 5, 7}));
-  b.insert(b.begin() + 1, b.begin(), b.end()), b.insert(b.end(), ssize_t(2), b.back());
-  EXPECT_EQ(b.size(), 18);
-  b.erase(8, 10), b.push_back<unsigned short>(0x0102);
+  EXPECT_BYTES(EXPECT_EQ(*b.erase(b.begin()), 5), 5, 2, 2);
+  EXPECT_BYTES(b.insert(1, b.begin(), b.end()), 5, 5, 2, 2, 2, 2);
+  EXPECT_BYTES(b.assign(b.begin() + 1, b.begin() + 3), 5, 2);
+  EXPECT_BYTES(b += b, 5, 2, 5, 2);
+  EXPECT_BYTES(b.insert(b.begin(), 2, b.front()), 5, 5, 5, 2, 5, 2);
+  EXPECT_BYTES(b.assign(b.begin() + 2, b.begin() + 4), 5, 2);
+  EXPECT_BYTES(b.insert(0, b.data(), b.data_end()), 5, 2, 5, 2);
+  EXPECT_BYTES(b.insert(b.begin() + 1, b.begin(), b.end()), 5, 5, 2, 5, 2, 2, 5, 2);
+  EXPECT_BYTES(b.insert(b.end(), ssize_t(2), b.back()), 5, 5, 2, 5, 2, 2, 5, 2, 2, 2);
+  EXPECT_BYTES(b.push_back<unsigned short>(0x0303), 5, 5, 2, 5, 2, 2, 5, 2, 2, 2, 3, 3);
+}
+
+TEST(VectorOfByteTest, AccessAndStorage) {
+  VectorOfByte b{1, 2, 3};
   const VectorOfByte c(b);
-  EXPECT_EQ(c.size(), 10);
-  EXPECT_EQ(c.front() + c.back() + c[9], 5 + 2 * c[9]);
+  EXPECT_EQ(c.size(), 3);
+  EXPECT_EQ(c.front(), 1);
+  EXPECT_EQ(c[1], 2);
+  EXPECT_EQ(c.back(), 3);
+  EXPECT_EQ(c.data_end() - c.data(), 3);
   b.reserve(40);
-  EXPECT_TRUE(b.owns(b.data() + 39) && !b.owns(b.data() + 40) && b.capacity() == 40);
-  EXPECT_TRUE(c.data_end() - c.data() == 10 && b.owns(b.data()) && !b.owns(&b) &&
-              !VectorOfByte().owns(nullptr));
+  EXPECT_EQ(b.capacity(), 40);
+  EXPECT_TRUE(b.owns(b.data()));
+  EXPECT_TRUE(b.owns(b.data() + 39));
+  EXPECT_FALSE(b.owns(b.data() + 40));
+  EXPECT_FALSE(b.owns(&b));
+  EXPECT_FALSE(VectorOfByte().owns(nullptr));
 }
 
 TEST(VectorOfByteTest, AppendsAndCopies) {
   const VectorOfByte tail{3, 4};
   VectorOfByte b{1, 2};
-  b.reserve(9), b += tail, b.push_back(tail.begin(), tail.end());
-  EXPECT_EQ(b, (VectorOfByte{1, 2, 3, 4, 3, 4}));
+  b.reserve(9);
+  EXPECT_BYTES(b += tail, 1, 2, 3, 4);
+  EXPECT_BYTES(b.push_back(tail.begin(), tail.end()), 1, 2, 3, 4, 3, 4);
   EXPECT_EQ(VectorOfByte(b).capacity(), 6);
   const auto* const data = b.data();
   b = *&b;
   EXPECT_EQ(b.data(), data);
   VectorOfByte full{1, 2};
   const auto where = full.insert(full.begin() + 1, 7);
-  EXPECT_EQ(where, full.begin() + 1) << "after a growth, which moves";
+  EXPECT_EQ(where, full.begin() + 1) << "after growth, which moves the storage";
 }
 
 TEST(VectorOfByteTest, ComparesBytes) {
   const VectorOfByte a{1, 2}, b{1, 200}, c;
-  EXPECT_TRUE(a < b && a <= b && b > a && b >= a && a != b && !(a == b) && c < a && a >= a && a <= a);
+  EXPECT_LT(a, b);
+  EXPECT_LE(a, b);
+  EXPECT_LE(a, a);
+  EXPECT_GT(b, a);
+  EXPECT_GE(b, a);
+  EXPECT_GE(a, a);
+  EXPECT_NE(a, b);
+  EXPECT_FALSE(a == b);
+  EXPECT_LT(c, a);
   EXPECT_NE(VectorOfByte(c), a);
   EXPECT_EQ(a.compare(0, 1, b, 0, 1), 0);
   EXPECT_LT(a.compare(1, 1, b, 1, 1), 0);
@@ -365,7 +403,8 @@ TEST(VectorOfByteTest, ComparesBytes) {
   d = c;
   EXPECT_EQ(d, VectorOfByte(c));
   VectorOfByte().swap(d);
-  EXPECT_TRUE(d.empty() && d.data() == nullptr);
+  EXPECT_TRUE(d.empty());
+  EXPECT_EQ(d.data(), nullptr);
 }
 
 } // namespace

@@ -3,8 +3,8 @@
 
 usage: instructions.py OBJDUMP ARCHIVE [INSTRUCTION-SET...]
 
-Disassembles the static library for x86-64 and sees that no function but the kernels of an instruction set, whose names
-tell it, has an instruction that is newer than the first 64-bit processors, and that the named instruction sets are used.
+Disassembles the static library for x86-64. Only the kernels of an instruction set, recognised by their names, may have
+instructions that are newer than the first 64-bit processors; the named instruction sets must be used.
 """
 
 import re

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Compiles each call of refused.txt, and compares what the compiler says with the text that stands above the call.
+"""Compiles each call of refused.txt, and compares the compiler's message with the text above the call.
 
 usage: refused.py SOURCE-DIRECTORY WORK-DIRECTORY C++-COMPILER [OPTION...]
 """
@@ -22,7 +22,7 @@ enum class E { e };
 enum Unscoped {};
 struct Wrapped { operator int() const; };
 struct Converts : std::string { operator string8() const; };
-namespace Program { // has operators of its own, of every kind of match
+namespace Program { // with its own operators, which match in every way
 string8 operator+(const string8&, const char*);
 template <class T> bool operator==(const basic_xstring<T>&, const basic_xstring<T>&);
 template <class T> bool operator<(const xvector<T>&, const xvector<T>&);

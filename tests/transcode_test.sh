@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# The example as a user meets it: what it writes, where, and how it fails.
+# Tests the example as users run it: what it writes, where, and how it fails.
 set -u
 transcode=$1
 sources=$(cd "$(dirname "$0")/../examples/transcode" && pwd)
@@ -18,8 +18,8 @@ check() {
 expect() { [ "$2" = "$3" ] || fail "$1: '$2' is not '$3'"; }
 same() { cmp -s "$2" "$3" || fail "$1: $2 and $3 differ"; }
 
-# The sequences recur every 10 bytes, in UTF-8 and in UTF-16. The ends of a few blocks fall everywhere in them, at odd
-# places when the first byte comes by itself.
+# The sequences recur every 10 bytes, in UTF-8 and in UTF-16, so the ends of a few blocks fall at every place in them; at
+# odd ones if the first byte arrives alone.
 printf '\357\273\277z\303\251\342\202\254\360\237\230\200\n' >in
 { cat in; yes "$(tail -c +4 in)" | tr -d '\n' | head -c 500000; cat in; } >long
 encodings='utf-8 utf-16le utf-16be utf-32le utf-32be'
@@ -38,8 +38,8 @@ UTF-8 code units 500028 UTF-16 code units 250014 code points 200012 lines 2 long
 ASCII code points 25 % round trip same bytes "
 done
 
-# Faults before, at and behind the end of a block: the text before is printed, and the fault and its place named. The
-# files are checked, and written with replacements (R), all in one run.
+# Faults before, at and behind the end of a block: the text before a fault is printed, and the fault and its place are
+# named. One more run checks all files, and one writes them with replacements (R).
 while read -r encoding width fault replaced reason; do
   bad=() messages=
   : >wanted
@@ -81,7 +81,7 @@ utf-32be 4 \0\0\0 R truncated sequence
 ascii 1 \303\251 RR byte above 7F
 ROWS
 
-# Mutated lines, replaced and dropped as Python does.
+# Mutated lines, whose faults Python replaces and drops in the same way.
 python3 - <<'PYTHON'
 import random
 random.seed(1)
@@ -107,7 +107,7 @@ same "from latin1" out latin1
 check "to latin1" 0 "$transcode" -t latin1 latin1
 same "to latin1" out mutated
 
-# The pattern is 15 bytes long, of which a block has one more than a multiple: the ends of blocks fall everywhere.
+# The lines recur every 15 bytes. A block is one byte longer than a multiple of 15, so its ends fall at every place.
 yes $'a\r\n\r\r\nb\n\n\rc\rd\r' | head -c 1200000 >lines
 echo >>lines
 for ends in 'lf s/\r$//' 'crlf s/\r\?$/\r/'; do
@@ -115,7 +115,7 @@ for ends in 'lf s/\r$//' 'crlf s/\r\?$/\r/'; do
   same "line ends, $ends" out <(sed "${ends#* }" lines)
 done
 
-# Exit code, options, the bytes of up to three files, the bytes that come out, and what is said of the files.
+# Exit code, options, the bytes of up to three files, the bytes of the output, and the messages.
 while IFS='|' read -r code options input expected message; do
   IFS=+ read -ra files <<<"$input"
   for i in 0 1 2; do printf "${files[i]-}" >file$i; done
@@ -162,7 +162,7 @@ echo old >kept
 chmod 640 kept
 check "malformed late" 1 "$transcode" -f ascii -t utf-16le -o kept bad.4
 check "what is added to" 1 timeout 5 bash -c "'$transcode' kept >>kept"
-# A run that waits for more text is ended by a signal, once its temporary file is there.
+# A signal ends a run that waits for more text, once its temporary file exists.
 mkfifo fifo
 ulimit -c 0
 exec 3<>fifo
@@ -216,7 +216,7 @@ done <<'ROWS'
 --line-endings=cr|--line-endings takes lf or crlf, not 'cr'
 ROWS
 
-# The sanitizers reserve more than any limit lets them.
+# Not under sanitizers, which reserve more address space than any limit allows.
 if bash -c "ulimit -v 32000; '$transcode' --help; exit" >/dev/null 2>&1; then
   for options in '-t utf-16be' --report; do
     check "little memory" 0 bash -c "ulimit -v 32000; head -c 64000000 /dev/zero | '$transcode' $options | wc -c"
@@ -224,13 +224,13 @@ if bash -c "ulimit -v 32000; '$transcode' --help; exit" >/dev/null 2>&1; then
   done
 fi
 
-# What a terminal gets to see, carriage returns as bars and without the blanks that cover what was there.
+# The output on a terminal, with carriage returns as bars and without blanks.
 while read -r name wanted command; do
   {
     seen=$(transcode="$transcode -t utf-8" script -qec "$command" /dev/null </dev/null | tr '\r' '|' | tr -d ' \n')
     [[ $seen =~ ^$wanted$ ]] || echo "on a terminal, $name: '$seen' is not '$wanted'"
   } >terminal.$name &
-  [ $name != short ] || wait # nothing is to slow it down
+  [ $name != short ] || wait # other runs would slow it down
 done <<'ROWS'
 short () $transcode -o copy4 in
 percent (\|\|transcode:[0-9]+%)+\|\| $transcode long | { sleep 1; cat >copy1; }
@@ -242,7 +242,7 @@ ROWS
 wait
 [ -z "$(cat terminal.*)" ] || fail "$(cat terminal.*)"
 
-# The options are the same wherever they are listed, and bash completes them, encodings and files.
+# All lists of options are the same, and bash completes options, encodings and files.
 "$transcode" --help | grep -o -e '--[a-z-]*' | sort -u >options
 for place in transcode.bash _transcode transcode.1; do
   expect "options of $place" "$(sed 's/\\-/-/g' "$sources/$place" | grep -o -e '--[a-z][a-z-]*' | sort -u)" "$(cat options)"

@@ -13,7 +13,7 @@ using namespace mirel;
 
 namespace {
 
-/// Takes all bytes of a call, or throws and takes none.
+/// A sink that takes all bytes of a call, or throws and takes none.
 struct Sink : IOutputStream {
   void WriteStream(const void* address, ssize_t count) override {
     EXPECT_GT(count, 0);
@@ -31,7 +31,9 @@ TEST(XOStream, WritesStringsAsTheyAre) {
   xostream os(sink);
   os.width(20);
   os << string8() << string8("a\0b", 3) << "c";
-  os.write(nullptr, 0), os.writebytes(nullptr, 0), os.writebytes(reinterpret_cast<const uint8*>("\0\xFF"), 2);
+  os.write(nullptr, 0);
+  os.writebytes(nullptr, 0);
+  os.writebytes(reinterpret_cast<const uint8*>("\0\xFF"), 2);
   EXPECT_EQ(sink.text, std::string("a\0bc\0\xFF", 6));
   EXPECT_EQ(os.width(0), 20);
 }
@@ -46,19 +48,40 @@ TEST(XOStream, FormatsValues) {
   };
   os.width(4);
   EXPECT_EQ(put(42), "  42");
-  EXPECT_EQ(put(true) + put('c') + put(-7L) + put(8ULL) + put(short(9)) + put(int8_t('d')), "1c-789d");
-  EXPECT_EQ(put(uint8_t('e')) + put(uint16_t(1)) + put(2u) + put(3ul) + put(-4ll), "e123-4");
-  EXPECT_EQ(os.precision(3) + os.precision(), 9);
-  EXPECT_EQ(put(3.14159) + put(2.5f) + put(1e30L), "3.142.51e+30");
-  EXPECT_EQ(put(u8'x') + put(u8"text") + put("text", 2) + put(reinterpret_cast<const void*>(0x1A)),
-            "xtextte0x1a");
-  EXPECT_EQ(put(L'\u00E9') + put(u'\u20AC') + put(U'\U0001F600'), "\u00E9\u20AC\U0001F600");
-  EXPECT_EQ(put(L'\uFFFF') + put(u'\uFFFF') + put(U'\uFFFF'), "\uFFFF\uFFFF\uFFFF");
-  for (const char32_t c : {0xD800u, 0x110000u, 0x4010000u, 0xFFFFFFFFu})
-    EXPECT_EQ(put(c) + put(static_cast<wchar_t>(c)), "\uFFFD\uFFFD");
+  EXPECT_EQ(put(true), "1");
+  EXPECT_EQ(put('c'), "c");
+  EXPECT_EQ(put(int8_t('d')), "d");
+  EXPECT_EQ(put(uint8_t('e')), "e");
+  EXPECT_EQ(put(short(9)), "9");
+  EXPECT_EQ(put(uint16_t(1)), "1");
+  EXPECT_EQ(put(2u), "2");
+  EXPECT_EQ(put(-7L), "-7");
+  EXPECT_EQ(put(3ul), "3");
+  EXPECT_EQ(put(-4ll), "-4");
+  EXPECT_EQ(put(8ULL), "8");
+  EXPECT_EQ(os.precision(3), 6);
+  EXPECT_EQ(os.precision(), 3);
+  EXPECT_EQ(put(3.14159), "3.14");
+  EXPECT_EQ(put(2.5f), "2.5");
+  EXPECT_EQ(put(1e30L), "1e+30");
+  EXPECT_EQ(put(u8'x'), "x");
+  EXPECT_EQ(put(u8"text"), "text");
+  EXPECT_EQ(put("text", 2), "te");
+  EXPECT_EQ(put(reinterpret_cast<const void*>(0x1A)), "0x1a");
+  EXPECT_EQ(put(L'\u00E9'), "\u00E9");
+  EXPECT_EQ(put(u'\u20AC'), "\u20AC");
+  EXPECT_EQ(put(U'\U0001F600'), "\U0001F600");
+  EXPECT_EQ(put(L'\uFFFF'), "\uFFFF");
+  EXPECT_EQ(put(u'\uFFFF'), "\uFFFF");
+  for (const char32_t c : {0xFFFFu, 0xD800u, 0x110000u, 0x4010000u, 0xFFFFFFFFu}) {
+    EXPECT_EQ(put(c), c == 0xFFFF ? "\uFFFF" : "\uFFFD");
+    EXPECT_EQ(put(static_cast<wchar_t>(c)), c == 0xFFFF ? "\uFFFF" : "\uFFFD");
+  }
   os.width(3);
   EXPECT_EQ(put("a", 1), "  a");
-  os.put("b", 1), os.put_internal("ab", 2, 5), os.put(nullptr, 0);
+  os.put("b", 1);
+  os.put_internal("ab", 2, 5);
+  os.put(nullptr, 0);
   EXPECT_EQ(sink.text, "  ab   ab");
 }
 
@@ -80,7 +103,9 @@ TEST(XOStream, IndentsWhatFollowsANewline) {
   os << "a\nb\n";
   EXPECT_EQ(os.GetIndent(), 18);
   os.Indent(1);
-  os.put(5), os.endl(), os.ends();
+  os.put(5);
+  os.endl();
+  os.ends();
   os << [](xostream& o) -> xostream& { return o.Indent(0), o; };
   const std::string spaces(18, ' ');
   EXPECT_EQ(sink.text, "a\n" + spaces + "b\n 5\n " + std::string(1, '\0'));
@@ -123,12 +148,13 @@ TEST(XOStream, CallsTheSinkSeldom) {
   for (const auto& [text, indent, width, calls] : rows) {
     Sink sink;
     xostream os(sink);
-    os.Indent(indent), os.put_internal(text.data(), ssize_t(text.size()), width);
+    os.Indent(indent);
+    os.put_internal(text.data(), ssize_t(text.size()), width);
     EXPECT_EQ(sink.calls, calls) << text.substr(0, 9) << " indented by " << indent << ", in " << width;
   }
 }
 
-/// What the stream should make of text without spaces.
+/// Indents text without spaces as the stream should.
 std::string Indented(const std::string& text, std::size_t indent) {
   std::string result;
   for (const char c : text)
@@ -146,7 +172,7 @@ TEST(XOStream, IndentsEachLineOnceWhicheverCallThrows) {
         text += std::string(random() % sizes[random() % 5], 'x') + (random() % 4 == 0 ? "" : "\n");
     const std::size_t indent = indents[random() % 8];
     const std::string all = std::accumulate(texts.begin(), texts.end(), std::string());
-    for (int failing = 0, calls = 0; failing <= calls; ++failing) { // in the last round no call throws
+    for (int failing = 0, calls = 0; failing <= calls; ++failing) { // no call throws in the last round
       Sink sink;
       sink.failing = failing;
       xostream os(sink);
@@ -161,7 +187,7 @@ TEST(XOStream, IndentsEachLineOnceWhicheverCallThrows) {
       os << "end";
       std::string taken = sink.text;
       taken.erase(std::remove(taken.begin(), taken.end(), ' '), taken.end());
-      ASSERT_EQ(sink.text, Indented(taken, indent)) << "call " << failing << " has thrown";
+      ASSERT_EQ(sink.text, Indented(taken, indent)) << "call " << failing << " threw";
       ASSERT_EQ(taken == all + "end", failing == calls) << taken << "\nof\n" << all;
     }
   }
@@ -174,7 +200,9 @@ TEST(XOStream, GoesOnAfterAnException) {
     sink.failing = sink.calls;
     os.width(width);
     EXPECT_THROW(os.put(1), std::runtime_error);
-    os.width(0), os.put(2), os << "x";
+    os.width(0);
+    os.put(2);
+    os << "x";
   }
   EXPECT_EQ(sink.text, "2x2x");
 }

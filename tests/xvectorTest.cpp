@@ -1,4 +1,4 @@
-// Runs of random operations beside the standard containers, both ways of looking at the same text.
+// Random edits and searches, compared with the standard strings.
 #include "Edits.h"
 
 #include <random>
@@ -31,37 +31,43 @@ TYPED_TEST(XVector, SearchesAndComparesLikeAString) {
     ASSERT_NO_FATAL_FAILURE(searches.Step(step % 100 == 0 ? 300 : 12)) << "step " << step;
 }
 
-TYPED_TEST(XVector, ReverseIteratorsHoldThePlaceBehind) {
+TYPED_TEST(XVector, ReverseIteratorsConvertToPointersPastTheirElement) {
   auto v = Of<TypeParam>("abc");
   const auto& cv = v;
   EXPECT_EQ(std::basic_string<TypeParam>(cv.rbegin(), cv.rend()), Std(Of<TypeParam>("cba")));
   auto it = v.rbegin();
   auto constIt = cv.rbegin();
-  EXPECT_TRUE(*constIt++ == 'c' && static_cast<const TypeParam*>(constIt) == v.begin() + 2);
-  EXPECT_TRUE(it == cv.rbegin() && static_cast<TypeParam*>(it) == v.end() &&
-              static_cast<TypeParam*>(v.rend()) == v.begin());
+  EXPECT_EQ(*constIt++, 'c');
+  EXPECT_EQ(static_cast<const TypeParam*>(constIt), v.begin() + 2);
+  EXPECT_TRUE(it == cv.rbegin());
+  EXPECT_EQ(static_cast<TypeParam*>(it), v.end());
+  EXPECT_EQ(static_cast<TypeParam*>(v.rend()), v.begin());
   EXPECT_EQ(*it++, 'c');
   *it = 'x';
-  EXPECT_TRUE(*it.operator->() == 'x' && v[1] == 'x' && it != v.rend());
+  EXPECT_EQ(*it.operator->(), 'x');
+  EXPECT_EQ(v[1], 'x');
+  EXPECT_TRUE(it != v.rend());
   EXPECT_EQ(*--it, 'c');
   EXPECT_EQ(*it--, 'c');
   const auto* const data = v.data();
   typename TestFixture::S w;
   v.swap(w);
-  EXPECT_TRUE(w.data() == data && v.data() == nullptr && v.rbegin() == v.rend());
+  EXPECT_EQ(w.data(), data);
+  EXPECT_EQ(v.data(), nullptr);
+  EXPECT_TRUE(v.rbegin() == v.rend());
 }
 
-TYPED_TEST(XVector, ZeroTerminatedArguments) {
+TYPED_TEST(XVector, NullTerminatedArguments) {
   using Text = basic_xstring<TypeParam>;
   const Text text = Of<TypeParam>("abcabc"), bc = Of<TypeParam>("bc"), none;
   const TypeParam* const z = bc.c_str();
   Text s = z;
-  (s = text.c_str()).append(z) += z;
-  s.insert(0, z).replace(2, 3, z).insert(s.size(), none.c_str());
-  EXPECT_EQ(Std(s), Std(Of<TypeParam>("bcbcabcbcbc")));
+  EXPECT_EDIT(s, (s = text.c_str()).append(z) += z, "abcabcbcbc");
+  EXPECT_EDIT(s, s.insert(0, z).replace(2, 3, z).insert(s.size(), none.c_str()), "bcbcabcbcbc");
   EXPECT_LT(s.compare(0, 1, z), 0);
-  EXPECT_EQ(Std(Text(text, 1, 2)) + Std(text.substr(4, 2)) + Std(Text(z, z + 1)),
-            Std(Of<TypeParam>("bcbcb")));
+  ExpectText(Text(text, 1, 2), "bc", "construction");
+  ExpectText(text.substr(4, 2), "bc", "substr");
+  ExpectText(Text(z, z + 1), "b", "construction");
   HackToForcexstringIntoUtilsDll();
 }
 

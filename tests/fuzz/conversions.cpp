@@ -1,10 +1,10 @@
-// Fuzzes all that reads UTF-8 and UTF-16: the first byte is how much ASCII stands before the text, the others
-// are the text.
+// Fuzzes the functions that read UTF-8 and UTF-16. The first byte chooses how much ASCII precedes the text,
+// the other bytes are the text.
 #include "../TextChecks.h"
 
 namespace {
 
-/// Checks text whole, cut at every place where that can make a difference, and in two pieces.
+/// Checks the text, every prefix of it, and every division in two pieces.
 template <class T> void CheckCuts(std::size_t before, const oracle::Text<T>& text) {
   const oracle::Text<T> all = oracle::Text<T>(before, 'a') + text;
   for (std::size_t size = before; size <= all.size(); ++size) {
@@ -19,8 +19,8 @@ extern "C" int LLVMFuzzerTestOneInput(const unsigned char* data, std::size_t siz
   GTEST_FLAG_SET(throw_on_failure, true);
   if (size == 0 || size > 128)
     return 0;
-  // As much ASCII as leads into each way of converting it: single units, words, blocks and the end of one,
-  // and seldom, since that takes long, the end of a chunk.
+  // Enough ASCII to reach each path of a conversion: single units, words, blocks, the end of a block and,
+  // seldom, since it takes long, the end of a chunk.
   static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 1, 2, 5, 20, 31, 34, 1000};
   const std::size_t before = kBefore[data[0] % std::size(kBefore)];
   ++data, --size;

@@ -1,10 +1,10 @@
-// Fuzzes edits and searches: each byte is a number that decides what is done next.
+// Fuzzes edits and searches: each byte is a number that chooses an edit or one of its arguments.
 #include "../Edits.h"
 
 namespace {
 
 struct Bytes {
-  /// 0 when there are none left.
+  /// The next number up to max, 0 at the end of the input.
   ssize_t operator()(ssize_t max) { return p == end ? 0 : *p++ % (max + 1); }
   const unsigned char *p, *end;
 };

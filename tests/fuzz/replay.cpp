@@ -1,4 +1,4 @@
-// Runs a fuzzer's inputs, given as files, in a program of any compiler.
+// Runs a fuzzer on inputs in files, with any compiler.
 #include <cstdio>
 #include <fstream>
 #include <iterator>

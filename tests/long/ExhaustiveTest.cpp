@@ -8,7 +8,7 @@
 
 namespace {
 
-/// Calls check(i) for i from 0 to 0xFFFF, on all processors, and shows how far it is.
+/// Calls check(i) for i from 0 to 0xFFFF, on all processors, and shows the progress.
 template <class F> void ForAll(const char* what, const F& check) {
   std::atomic<unsigned> next{0};
   const auto work = [&] {
@@ -31,8 +31,9 @@ TEST(Exhaustive, FourBytes) {
   ForAll("four bytes", [](char16 high) {
     char8 text[] = {static_cast<char8>(high >> 8), static_cast<char8>(high), 0, 0};
     for (unsigned low = 0; low <= 0xFFFF; ++low) {
-      text[2] = static_cast<char8>(low >> 8), text[3] = static_cast<char8>(low);
-      oracle::CheckAmongLetters(oracle::View<char8>(text, 4));
+      text[2] = static_cast<char8>(low >> 8);
+      text[3] = static_cast<char8>(low);
+      oracle::CheckAmongSequences(oracle::View<char8>(text, 4));
     }
   });
 }
@@ -42,7 +43,7 @@ TEST(Exhaustive, TwoUnits) {
     char16 units[] = {first, 0};
     for (unsigned second = 0; second <= 0xFFFF; ++second) {
       units[1] = static_cast<char16>(second);
-      oracle::CheckAmongLetters(oracle::View<char16>(units, 2));
+      oracle::CheckAmongSequences(oracle::View<char16>(units, 2));
     }
   });
 }

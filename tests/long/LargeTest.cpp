@@ -1,5 +1,5 @@
-// Vectors past the limits of 32 bits: more than 4 GiB of bytes, more than 2^31 units of 16 bits. Takes up to
-// 18 GiB of memory.
+// Vectors beyond the limits of 32 bits: more than 4 GiB of bytes, more than 2^31 units of 16 bits. The tests
+// take up to 18 GiB of memory.
 #include "../Support.h"
 
 namespace {
@@ -14,7 +14,9 @@ TYPED_TEST(Large, GrowsIsSearchedEditedAndConverted) {
   const basic_xstring<T> end = Of<T>("the end");
   while (s.size() < kSize)
     s += piece;
-  s.resize(kSize, 'a'), s += end, s.push_back('!');
+  s.resize(kSize, 'a');
+  s += end;
+  s.push_back('!');
   ASSERT_EQ(s.size(), kSize + 8);
   const auto expectEnd = [&](ssize_t at) {
     EXPECT_EQ(s.find(end), at);
@@ -27,10 +29,17 @@ TYPED_TEST(Large, GrowsIsSearchedEditedAndConverted) {
     EXPECT_EQ(s.compare(at, 7, end), 0);
   };
   expectEnd(kSize);
-  s.insert(kSize, 5, 'a'), s.replace(kSize + 2, 1, piece, 0, 3), s.erase(10, 3), s.insert(0, 'a');
+  s.insert(kSize, 5, 'a');
+  s.replace(kSize + 2, 1, piece, 0, 3);
+  expectEnd(kSize + 7);
+  s.erase(10, 3);
+  s.insert(0, 'a');
   expectEnd(kSize + 5);
   s.push_front('c');
-  EXPECT_TRUE(s.rfind('c') == 0 && s.find('c') == 0 && s.FindAndErase('c') == 1 && s[kSize + 4] == 'a');
+  EXPECT_EQ(s.rfind('c'), 0);
+  EXPECT_EQ(s.find('c'), 0);
+  EXPECT_EQ(s.FindAndErase('c'), 1);
+  EXPECT_EQ(s[kSize + 4], 'a');
 
   using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
   basic_xstring<Other> converted;

@@ -1,4 +1,4 @@
-# Builds the README's program by Meson and by make with the library installed, and by hand from the sources.
+# Builds the README's program with Meson and make from the installed library, and by hand from the sources.
 include(${CMAKE_CURRENT_LIST_DIR}/common.cmake)
 set(dir ${WORK_DIR}/build_systems)
 file(REMOVE_RECURSE ${dir})

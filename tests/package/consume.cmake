@@ -1,4 +1,4 @@
-# Builds the consumers with the library used in the WAY given, and runs them.
+# Builds the consumers, which find the library in the given WAY, and runs them.
 include(${CMAKE_CURRENT_LIST_DIR}/common.cmake)
 set(consumer ${CMAKE_CURRENT_LIST_DIR}/consumer)
 set(dir ${WORK_DIR}/${WAY}.${KIND})
@@ -6,7 +6,7 @@ set(warnings "-Wall -Wextra -Wpedantic -Wconversion -Wsign-conversion -Wshadow")
 file(REMOVE_RECURSE ${dir})
 
 if(WAY STREQUAL "pkg-config")
-  # As a makefile would. The C compiler links the static library: it knows nothing of the C++ runtime.
+  # As a makefile would. The C compiler links the static library, since it doesn't add the C++ runtime by itself.
   find_program(pkgconfig pkg-config REQUIRED)
   find_program(cc cc REQUIRED)
   set(ENV{PKG_CONFIG_PATH} ${LIBDIR}/pkgconfig)

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Installs the packages in a bare root, uses them as README.md and the tutorial say, removes them, and looks for what is
-# left.
+# Installs the packages in a bare root, uses them as README.md and the tutorial say, removes them, and looks for files
+# that are left.
 # usage: debian_test.sh DIRECTORY-OF-PACKAGES ROOT.tar ROOT
 set -euo pipefail
 packages=$1 base=$2 root=$3
@@ -19,7 +19,7 @@ block cpp >"$root/program/program.cpp"
   echo 'add_executable(program program.cpp)'
   block cmake
 } >"$root/program/CMakeLists.txt"
-# The programs of the tutorial, which are the same in its page.
+# The programs of the tutorial; a test compares them with its page.
 mkdir "$root/tmp/tutorial"
 cp "$top"/examples/tutorial/*.{cpp,h,txt} "$root/tmp/tutorial"
 {
@@ -37,7 +37,7 @@ files() {
 expect() { # WANTED COMMAND...
   local got
   got=$("${@:2}")
-  [ "$got" = "$1" ] || { echo "${*:2} printed $got in place of $1"; exit 1; }
+  [ "$got" = "$1" ] || { echo "${*:2} printed $got instead of $1"; exit 1; }
 }
 
 files >/tmp/before

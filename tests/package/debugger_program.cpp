@@ -1,4 +1,4 @@
-// What debugger_test.py looks at: whole objects, broken ones, and a place to stop.
+// The program of debugger_test.py: valid objects, corrupt ones, and a function to stop in.
 
 #include <cstdlib>
 

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""What the debuggers show of a real program, with the library installed as a user has it.
+"""Checks what the debuggers show of a program, with the library installed as users install it.
 
 usage: debugger_test.py SOURCE-DIRECTORY C++-COMPILER
 """
@@ -53,7 +53,7 @@ def expect(output, wanted):
 
 def expect_text_alone(output):
     if " = {" in output or re.search("warning: .*script", output):
-        sys.exit(f"elements that nobody asked for, or a warning, in\n{output}")
+        sys.exit(f"unwanted elements, or a warning, in\n{output}")
     return output
 
 
@@ -64,7 +64,7 @@ def expect_all(whole, limited):
 
 
 def gdb(program, prefix, **variables):
-    """Nothing but GDB's data directory is named: what lies there, GDB has found by itself."""
+    """Passes only GDB's data directory, in which GDB must find the script by itself."""
     output = run("gdb", "-nx", "-batch", "-data-directory", f"{prefix}/share/gdb", "-iex", "set debuginfod enabled off",
                  "-ex", "break Stop", "-ex", "run", "-ex", "up", "-ex", "info locals", "-ex", "echo LIMITED\\n",
                  "-ex", "set print elements 3", "-ex", "info locals", "-ex", "echo ELEMENTS\\n",
@@ -76,7 +76,7 @@ def gdb(program, prefix, **variables):
 
 
 def run_lldb(*arguments):
-    # Debian's package keeps its Python modules where it doesn't look for them.
+    # LLDB doesn't look for its Python modules where Debian's package puts them.
     modules = ":".join(map(str, pathlib.Path("/usr/lib").glob("llvm-*/lib/python3.*/*-packages")))
     return run("lldb", "--no-lldbinit", "-b", *arguments, PYTHONPATH=modules)
 

@@ -1,4 +1,4 @@
-# Installs the library as a KIND of its own, whole and by components, checks what that gives, and moves it.
+# Installs the library of one KIND, whole and by components, checks the files, and moves it.
 include(${CMAKE_CURRENT_LIST_DIR}/common.cmake)
 set(dir ${WORK_DIR}/${KIND})
 file(REMOVE_RECURSE ${dir})
@@ -17,7 +17,7 @@ function(expect_files component) # FILE...
   list(SORT files)
   list(SORT ARGN)
   if(NOT files STREQUAL ARGN)
-    message(FATAL_ERROR "The ${component} component is\n  ${files}\nin place of\n  ${ARGN}")
+    message(FATAL_ERROR "The ${component} component is\n  ${files}\ninstead of\n  ${ARGN}")
   endif()
 endfunction()
 

@@ -1,4 +1,4 @@
-// Strings, sinks and exceptions across the borders between a program, a shared library and the library.
+// Passes strings, sinks and exceptions between a program, a shared library and the library.
 
 #include <cstdint>
 #include <cstdio>
@@ -13,7 +13,7 @@
 #include "middle.h"
 
 #if MIREL_VERSION < 100
-#error "The version is no number that a program can decide by"
+#error "The version isn't a number that a program can compare"
 #endif
 
 namespace {

@@ -1,4 +1,5 @@
-// What a shared library that hides everything else offers: strings, streams and exceptions cross its border.
+// The exported functions of a shared library that hides everything else. They pass strings, streams and
+// exceptions.
 
 #pragma once
 
@@ -9,8 +10,8 @@
 
 #define MIDDLE_API __attribute__((visibility("default")))
 
-/// The words of a text, which are separated by single spaces.
+/// Splits a text at single spaces.
 MIDDLE_API std::vector<mirel::string16> Words(const mirel::string8& text);
 
-/// Writes a text to the sink, and passes on what that throws.
+/// Writes a text to the sink; exceptions of the sink pass through.
 MIDDLE_API void Print(mirel::IOutputStream& sink, const mirel::string16& text);
