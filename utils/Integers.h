@@ -44,7 +44,7 @@ template <class N> constexpr auto UnsignedValue(N x) {
     return static_cast<std::make_unsigned_t<N>>(x);
 }
 
-/// Whether x fits in a T, as a signed or as an unsigned number.
+/// Returns whether x fits in a T, as a signed or as an unsigned number.
 template <class T, class N> constexpr bool HasBitsFor(N x) {
   using Unsigned = decltype(UnsignedValue(x));
   using Max = std::numeric_limits<std::make_unsigned_t<T>>;
@@ -67,12 +67,12 @@ template <class T, bool kStored, class N> constexpr void CheckConstant(N) {}
 #else
 /// Isn't defined: the compilation fails if a call remains after optimisation.
 void ConstantDoesNotFit() __attribute__((error(MIREL_CUT)));
-/// Stays in the program where it is called, so that the compiler warns of it.
+/// Never inlined, so that the compiler warns of a call that remains after optimisation.
 __attribute__((noipa, warning(MIREL_CUT))) inline void ConstantIsCut() {}
 
-/// Refuses a constant that has too many bits where it is stored, and warns of it where it is searched for, as
-/// soon as the compiler optimises and so knows it. Nothing is checked at run time. The compiler also takes a
-/// variable for a constant where it knows the value, as in `if (n == 256)`: a search for that is no mistake.
+/// Refuses a constant with too many bits that is stored, and warns of one that is searched for, if the
+/// compiler optimises. Nothing is checked at run time. The compiler also takes a variable for a constant if
+/// it knows the value, as in `if (n == 256)`; a search for that is no mistake, so it is only a warning.
 template <class T, bool kStored, class N>
 [[gnu::always_inline]] inline void CheckConstant([[maybe_unused]] N x) {
 #ifdef __OPTIMIZE__

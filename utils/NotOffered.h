@@ -1,5 +1,5 @@
 /// @file
-/// Calls that vectors and strings don't have: deleted, with a return type that tells what to write instead.
+/// Calls that vectors and strings don't have: deleted, with a return type that names what to write instead.
 ///
 /// The operators take their arguments by user-defined conversions, so overload resolution prefers whatever
 /// operator a program or another header declares for such arguments, those of utils/Std.h included. The

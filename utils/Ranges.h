@@ -1,21 +1,21 @@
 /// @file
-/// What a range given to a vector is: which iterators are taken, how they are checked, and what their
-/// elements count as.
+/// Ranges as arguments: which iterators they may have, how they are checked, and what their elements count
+/// as.
 ///
 /// @par Units of other types
-/// A range may be of any iterators over integers or enumerators, and of nothing that converts to them. Each
-/// counts by its unsigned value, on every processor: the byte E9 is the unit 00E9 of a string16, whether
-/// plain char has a sign or not. What is stored must fit the vector's units, or nothing is changed. What is
-/// searched for may be any value, and one that doesn't fit is equal to nothing.
+/// A range may have any iterators over integers or enumerators, but not over types that convert to them. Each
+/// element counts by its unsigned value, on every processor: the byte E9 is the unit 00E9 of a string16,
+/// whether plain char is signed or not. A stored element must fit the vector's units, or nothing is changed.
+/// A searched element may have any value, and equals nothing if it doesn't fit.
 /// @pre "Fits<T>(*r1)" of each element that is stored
 ///
 /// @par Cost
 /// Pointers to elements of the vector's width, and the iterators of standard strings, string views and
-/// vectors of them, are as fast as `const T*`; from C++20 on so is every contiguous iterator. An edit by
-/// other iterators copies their elements first, with one allocation if they are at least forward iterators;
-/// those that aren't random-access ones are walked twice for it. A search allocates nothing.
+/// vectors of them, are as fast as `const T*`; from C++20 on so is every contiguous iterator. An edit with
+/// other iterators copies the elements first, with one allocation if they are at least forward iterators; it
+/// walks the range twice unless they are random-access iterators. A search allocates nothing.
 ///
-/// This header knows iterators and the byte buffer, no containers.
+/// This header knows iterators and the byte buffer, but no containers.
 
 #pragma once
 
@@ -48,7 +48,7 @@ template <class It, class Tag>
 constexpr bool kHasCategory = std::is_base_of_v<Tag, typename std::iterator_traits<It>::iterator_category>;
 
 #if __cpp_lib_concepts >= 202002L
-// The iterators of views are forward and random-access ones as concepts only: what * gives isn't a reference.
+// The iterators of views may satisfy the concepts alone: their `*` doesn't return a reference.
 template <class It>
 constexpr bool kIsForward = std::forward_iterator<It> || kHasCategory<It, std::forward_iterator_tag>;
 template <class It>
@@ -61,10 +61,11 @@ template <class It> constexpr bool kIsRandomAccess = kHasCategory<It, std::rando
 template <class It, class C>
 constexpr bool kIsIteratorOf =
     std::is_same_v<It, typename C::iterator> || std::is_same_v<It, typename C::const_iterator>;
-/// Pointers, and the iterators that are known to stand for pointers. Those of string views are either.
+/// Whether iterators are pointers, or known to stand for pointers. Those of string views are one or the
+/// other.
 template <class It>
 constexpr bool kIsContiguous = std::is_pointer_v<It> || kIsIteratorOf<It, std::vector<ValueType<It>>>
-#ifdef __GLIBCXX__ // elsewhere strings have the iterators of vectors, and none but those of characters exist
+#ifdef __GLIBCXX__ // libc++'s strings have the iterators of its vectors, and exist for characters only
                                || kIsIteratorOf<It, std::basic_string<ValueType<It>>>
 #endif
     ;
@@ -76,12 +77,13 @@ template <class V> constexpr bool kIsNumber = std::is_integral_v<V> || std::is_e
 template <class T, class V>
 constexpr bool kIsUnit = kIsNumber<V> && !std::is_same_v<V, bool> && sizeof(V) == sizeof(T);
 
-/// Whether what * gives must be read one by one.
+/// Whether the elements are volatile, and so must be read one by one.
 template <class It>
 constexpr bool kIsVolatile =
     std::is_volatile_v<std::remove_reference_t<typename std::iterator_traits<It>::reference>>;
 
-/// Whether iterators stand for pointers to units of the width of T. Asks for the containers of such only.
+/// Returns whether iterators stand for pointers to units as wide as T. It names the containers of such units
+/// only.
 template <class T, class It> constexpr bool StandsForPointer() { // the compiler decides
   if constexpr (!kIsUnit<T, ValueType<It>> || kIsVolatile<It>)
     return false;
@@ -89,8 +91,8 @@ template <class T, class It> constexpr bool StandsForPointer() { // the compiler
     return kIsContiguous<It>;
 }
 
-/// What reverse iterators are made from. They convert to the pointers that they hold, for which there is
-/// arithmetic with the opposite meaning: it is refused here.
+/// The base of our reverse iterators. They convert to the pointers that they hold, whose arithmetic has the
+/// opposite meaning, so it is deleted here.
 struct ReversePointer {
   template <class X> ReverseIteratorsOnlyStep operator[](const X&) const = delete;
   template <class X> ReverseIteratorsOnlyStep operator+(const X&) const = delete;
@@ -109,10 +111,10 @@ template <class X> ReverseIteratorsOnlyStep operator>(X*, const ReversePointer&)
 template <class X> ReverseIteratorsOnlyStep operator<=(X*, const ReversePointer&) = delete;
 template <class X> ReverseIteratorsOnlyStep operator>=(X*, const ReversePointer&) = delete;
 
-/// The pointer that one of our reverse iterators holds.
+/// Returns the pointer that one of our reverse iterators holds.
 template <class It> const ValueType<It>* Held(It it) { return it; }
 
-/// False for a reversed range, as far as that can be known: of random-access iterators and of pointers.
+/// Returns false for a reversed range of random-access iterators or of our own; others can't be checked.
 template <class It> constexpr bool IsRange(const It& r1, const It& r2) {
   if constexpr (std::is_base_of_v<ReversePointer, It>)
     return Held(r2) <= Held(r1);
@@ -122,7 +124,8 @@ template <class It> constexpr bool IsRange(const It& r1, const It& r2) {
     return true;
 }
 
-/// Whether an iterator is a null pointer, or stands for one, as it does when nothing has been assigned to it.
+/// Returns whether an iterator is a null pointer or stands for one, as one does to which nothing was
+/// assigned.
 template <class It> constexpr bool IsNull([[maybe_unused]] const It& it) {
   if constexpr (std::is_pointer_v<It>) {
     return it == nullptr;
@@ -131,7 +134,7 @@ template <class It> constexpr bool IsNull([[maybe_unused]] const It& it) {
     if constexpr (kIsContiguous<It>) // the compiler decides
       return std::to_address(it) == nullptr;
 #elif !defined _GLIBCXX_DEBUG
-    // With it, iterators don't compare with those of no container; it finds these by itself.
+    // In debug mode iterators without a container can't be compared; the standard library reports them.
     if constexpr (kIsContiguous<It>) // the compiler decides
       return it == It();
 #endif
@@ -143,7 +146,7 @@ template <class It>
 constexpr bool IsInMemory(const std::reverse_iterator<It>&, const std::reverse_iterator<It>&);
 template <class It> constexpr bool IsInMemory(const std::move_iterator<It>&, const std::move_iterator<It>&);
 
-/// False for pointers, and what stands for them, of which only the first in memory is null.
+/// Returns false for pointers, and iterators that stand for them, of which only the first in memory is null.
 template <class It> constexpr bool IsInMemory(const It& r1, const It& r2) {
   if constexpr (std::is_base_of_v<ReversePointer, It>)
     return IsInMemory(Held(r2), Held(r1));
@@ -159,7 +162,7 @@ constexpr bool IsInMemory(const std::move_iterator<It>& r1, const std::move_iter
   return IsInMemory(r1.base(), r2.base());
 }
 
-/// The unsigned value of an element of a range.
+/// Returns the unsigned value of an element of a range.
 template <class V, class X> constexpr auto SourceValue(const X& x) {
   static_assert(kIsNumber<V>, "code units are integers or enumerators: convert the elements first");
   if constexpr (kIsNumber<V>) // the compiler decides
@@ -172,9 +175,9 @@ template <class T, class N> constexpr bool Fits(N value) {
   return value <= std::numeric_limits<std::make_unsigned_t<T>>::max();
 }
 
-/// Units that stand one behind the other somewhere. The program may have written them as another type, which
-/// compilers take for other memory: so they are read by functions of the C library and of this one, or by
-/// CopyOf(), and never by a mere `*`.
+/// A contiguous range of units. The program may have written them as another type, and compilers assume that
+/// different types don't alias: so only functions of the C library or of this one, or CopyOf(), may read
+/// them, never a mere `*`.
 template <class T> class UnitSpan {
 public:
   template <class V> UnitSpan(const V* p, ssize_t n) : m_p(reinterpret_cast<const T*>(p)), m_size(n) {}
@@ -188,7 +191,7 @@ private:
   ssize_t m_size;
 };
 
-/// The units of any range, copied, each of which must fit.
+/// A copy of any range as units; each element must fit.
 template <class T> class UnitCopy {
 public:
   template <class It> UnitCopy(It r1, It r2) {
@@ -269,7 +272,7 @@ private:
   ValueIterator<It> m_begin, m_end;
 };
 
-/// The units of [r1, r2), which stand for pointers. The end of a range may not be dereferenced.
+/// Returns the units of [r1, r2), whose iterators stand for pointers. It doesn't dereference the end.
 template <class T, class It> UnitSpan<T> Span(It r1, It r2) {
   if constexpr (std::is_pointer_v<It>)
     return {r1, r2 - r1};
@@ -277,8 +280,8 @@ template <class T, class It> UnitSpan<T> Span(It r1, It r2) {
     return {r1 == r2 ? nullptr : __builtin_addressof(*r1), static_cast<ssize_t>(r2 - r1)};
 }
 
-/// The units of [r1, r2) in one piece, to be stored: those of a copy where the iterators aren't pointers,
-/// since only a pointer tells whether it points into the vector.
+/// Returns the units of [r1, r2) as a contiguous range to copy from. It makes a copy if the iterators don't
+/// stand for pointers, since only a pointer reveals whether it points into the vector.
 template <class T, class It> auto Source(It r1, It r2) {
   if constexpr (StandsForPointer<T, It>())
     return Span<T>(r1, r2);
@@ -286,12 +289,12 @@ template <class T, class It> auto Source(It r1, It r2) {
     return UnitCopy<T>(r1, r2);
 }
 
-/// Refuses ranges that can be read only once, where a search reads them again and again.
+/// Refuses ranges that can be read only once, since a search reads its needle many times.
 template <class It> constexpr void RequireForward() {
   static_assert(kIsForward<It>, "a search reads its needle more than once: copy it into a string first");
 }
 
-/// The units of [r1, r2), to be searched for. A search reads them more than once, contains() only once.
+/// Returns the units of [r1, r2) as a needle. A search reads them more than once, contains() only once.
 template <class T, class It> auto Needle(It r1, It r2) {
   if constexpr (StandsForPointer<T, It>())
     return Span<T>(r1, r2);

@@ -21,9 +21,9 @@ namespace mirel {
 
 namespace detail {
 
-struct Storage; // what the conversions know of a vector's storage
+struct Storage; // gives the conversions access to a vector's storage
 
-/// Throws std::bad_alloc. A header that threw it wouldn't compile in a program without exceptions.
+/// Throws std::bad_alloc. A throw in a header doesn't compile in a program without exceptions.
 [[noreturn, gnu::cold]] MIREL_API void AllocationFailed();
 
 } // namespace detail
@@ -35,7 +35,7 @@ struct Storage; // what the conversions know of a vector's storage
 /// @snippet examples/reference.cpp comparing ranges
 /// @{
 
-/// Orders two ranges by their first differing element; of a range and its proper prefix, the prefix is first.
+/// Orders two ranges by their first differing element; a proper prefix of a range orders before it.
 /// @return -1, 0 or 1
 template <class It1, class It2> int LexicographicalCompareX(It1 x1, It1 x2, It2 y1, It2 y2) {
   for (; x1 != x2 && y1 != y2; ++x1, ++y1) {
@@ -69,16 +69,16 @@ inline int LexicographicalCompareX(const char* x1, const char* x2, const char* y
   return LexicographicalCompareX(bytes(x1), bytes(x2), bytes(y1), bytes(y2));
 }
 
-/// Whether the range [x1, x2) and the one of the same length at y1 hold the same elements.
+/// Returns whether [x1, x2) and the range of the same length at y1 have equal elements.
 inline bool IsEqual(const char8* x1, const char8* x2, const char8* y1) {
   return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1)) == 0;
 }
-/// Whether the range [x1, x2) of 16-bit code units and the one of the same length at y1 hold the same ones.
+/// Returns whether [x1, x2) and the range of the same length at y1 have equal 16-bit code units.
 inline bool IsEqual(const uint16* x1, const uint16* x2, const uint16* y1) {
   return x1 == x2 || std::memcmp(x1, y1, static_cast<std::size_t>(x2 - x1) * sizeof(uint16)) == 0;
 }
 
-/// Whether [y1, y2) is a prefix of [x1, x2). An empty range is a prefix of every range.
+/// Returns whether [y1, y2) is a prefix of [x1, x2). An empty range is a prefix of every range.
 template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
   for (; y1 != y2; ++x1, ++y1)
     if (x1 == x2 || detail::UnitValue(*x1) != detail::UnitValue(*y1))
@@ -88,22 +88,23 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 
 /// @}
 /// @name Searching ranges
-/// Each search returns a position in the haystack, or its end when nothing is found. Nothing is allocated. At
-/// worst the cost is linear in the haystack for one element, and the product of both lengths for a needle or
-/// a set. It is linear in the sum of the lengths for needles of integers that both sides reach by
-/// random-access iterators, and for all that pointers to code units look for: these have overloads of the
-/// same names and results, which go by wide instructions where the processor has them.
+/// Each search returns a position in the haystack, or its end if nothing is found. Nothing is allocated. The
+/// cost is at worst linear in the haystack for one element, and the product of both lengths for a needle or a
+/// set. But it is linear in the sum of the lengths for needles if both ranges have random-access iterators
+/// over integers, and for all searches through pointers to code units: these have overloads of the same names
+/// and results, which use wide instructions if the processor has them.
 /// @snippet examples/reference.cpp searching ranges
 /// @{
 
-/// The first element equal to v, or i2.
+/// Finds the first element equal to v; returns i2 if there is none.
 template <class It, class T> It Find(It i1, It i2, const T& v) {
   while (i1 != i2 && detail::UnitValue(*i1) != detail::UnitValue(v))
     ++i1;
   return i1;
 }
 
-/// The start of the first occurrence of [y1, y2) in [x1, x2), or x2. An empty needle is found at x1.
+/// Finds the start of the first occurrence of [y1, y2) in [x1, x2); returns x2 if there is none. An empty
+/// needle is found at x1.
 template <class It1, class It2> It1 FindFirstSubSequence(It1 x1, It1 x2, It2 y1, It2 y2) {
   if constexpr (detail::kAreIntegers<It1, It2>) {
     return detail::FindNeedle(x1, x2, y1, y2);
@@ -114,21 +115,21 @@ template <class It1, class It2> It1 FindFirstSubSequence(It1 x1, It1 x2, It2 y1,
   }
 }
 
-/// The first element of [x1, x2) that occurs in [y1, y2), or x2.
+/// Finds the first element of [x1, x2) that occurs in [y1, y2); returns x2 if there is none.
 template <class It1, class It2> It1 FindFirstOf(It1 x1, It1 x2, It2 y1, It2 y2) {
   while (x1 != x2 && Find(y1, y2, *x1) == y2)
     ++x1;
   return x1;
 }
 
-/// The first element of [x1, x2) that doesn't occur in [y1, y2), or x2.
+/// Finds the first element of [x1, x2) that doesn't occur in [y1, y2); returns x2 if there is none.
 template <class It1, class It2> It1 FindFirstNotOf(It1 x1, It1 x2, It2 y1, It2 y2) {
   while (x1 != x2 && Find(y1, y2, *x1) != y2)
     ++x1;
   return x1;
 }
 
-/// The last element equal to v, or i2.
+/// Finds the last element equal to v; returns i2 if there is none.
 template <class It, class T> It FindLast(It i1, It i2, const T& v) {
   for (It p = i2; p != i1;)
     if (detail::UnitValue(*--p) == detail::UnitValue(v))
@@ -136,7 +137,8 @@ template <class It, class T> It FindLast(It i1, It i2, const T& v) {
   return i2;
 }
 
-/// The start of the last occurrence of [y1, y2) in [x1, x2), or x2. An empty needle is found at x2.
+/// Finds the start of the last occurrence of [y1, y2) in [x1, x2); returns x2 if there is none. An empty
+/// needle is found at x2.
 template <class It1, class It2> It1 FindLastSubSequence(It1 x1, It1 x2, It2 y1, It2 y2) {
   if constexpr (detail::kAreIntegers<It1, It2>) {
     return detail::FindLastNeedle(x1, x2, y1, y2);
@@ -148,7 +150,7 @@ template <class It1, class It2> It1 FindLastSubSequence(It1 x1, It1 x2, It2 y1, 
   }
 }
 
-/// The last element of [x1, x2) that occurs in [y1, y2), or x2.
+/// Finds the last element of [x1, x2) that occurs in [y1, y2); returns x2 if there is none.
 template <class It1, class It2> It1 FindLastOf(It1 x1, It1 x2, It2 y1, It2 y2) {
   for (It1 p = x2; p != x1;)
     if (Find(y1, y2, *--p) != y2)
@@ -156,7 +158,7 @@ template <class It1, class It2> It1 FindLastOf(It1 x1, It1 x2, It2 y1, It2 y2) {
   return x2;
 }
 
-/// The last element of [x1, x2) that doesn't occur in [y1, y2), or x2.
+/// Finds the last element of [x1, x2) that doesn't occur in [y1, y2); returns x2 if there is none.
 template <class It1, class It2> It1 FindLastNotOf(It1 x1, It1 x2, It2 y1, It2 y2) {
   for (It1 p = x2; p != x1;)
     if (Find(y1, y2, *--p) == y2)
@@ -180,19 +182,19 @@ template <class T> struct SearchKernels {
   P (*findFirstNotOf)(P x1, P x2, P y1, P y2);
   P (*findLastOf)(P x1, P x2, P y1, P y2);
   P (*findLastNotOf)(P x1, P x2, P y1, P y2);
-  /// The number of equal units before the first difference of the n units at x and at y, n if there is none.
+  /// Counts the equal units before the first difference of the n at x and the n at y; n if all are equal.
   ssize_t (*findDifference)(P x, P y, ssize_t n);
 };
 
-/// The best ones for such units that this processor has, or the scalar path. The result is always the same,
-/// so that a loop needs to ask only once.
+/// Returns the best kernels of this processor for such units, or the scalar path. The result never changes,
+/// so a loop needs to ask only once.
 [[gnu::const]] MIREL_API const SearchKernels<char8>& BestSearches(const char8*);
 [[gnu::const]] MIREL_API const SearchKernels<char16>& BestSearches(const char16*);
 
-/// In so short a range the loops in this file are done before a call to the others has begun.
+/// Returns whether a range is so short that the loops in this file are faster than a call of a kernel.
 template <class T> bool IsShort(const T* x1, const T* x2) { return x2 - x1 <= 16; }
 
-/// Find() that asks for the end of the range at every fourth unit only.
+/// Find() that compares with the end of the range only at every fourth unit.
 template <class T> const T* FindByFour(const T* i1, const T* i2, T v) {
   while (i2 - i1 >= 4 && i1[0] != v && i1[1] != v && i1[2] != v && i1[3] != v)
     i1 += 4;
@@ -201,7 +203,8 @@ template <class T> const T* FindByFour(const T* i1, const T* i2, T v) {
   return i1;
 }
 
-/// FindLast() in the same way, and by index, which compilers do better than by a pointer that goes back.
+/// FindLast() that compares with the beginning of the range only at every fourth unit. It counts by an index,
+/// since compilers generate better code for that than for a pointer that goes back.
 template <class T> const T* FindLastByFour(const T* i1, const T* i2, T v) {
   ssize_t i = i2 - i1;
   while (i >= 4 && i1[i - 1] != v && i1[i - 2] != v && i1[i - 3] != v && i1[i - 4] != v)
@@ -212,7 +215,7 @@ template <class T> const T* FindLastByFour(const T* i1, const T* i2, T v) {
   return i2;
 }
 
-/// The unit at p, which the program may have written as another type (utils/Ranges.h).
+/// Reads the unit at p, which the program may have written as another type (utils/Ranges.h).
 template <class T> T CopyOf(const T* p) {
   T unit;
   std::memcpy(&unit, p, sizeof(T));
@@ -251,7 +254,7 @@ const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2
     return x1;
   if (!detail::IsShort(x1, x2)) {
     const ssize_t length = y2 - y1;
-    if (sizeof(T) == 1 && x2 - x1 >= length) // where the first byte is rare, memchr is all that it takes
+    if (sizeof(T) == 1 && x2 - x1 >= length) // if the first byte is rare, memchr does all the work
       x1 = Find(x1, x2 - (length - 1), detail::CopyOf(y1));
     return x2 - x1 < length ? x2 : detail::BestSearches(x1).findFirstSubSequence(x1, x2, y1, y2);
   }
@@ -307,13 +310,14 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 /// any type may stand for each: a literal 0 is never a pointer.
 ///
 /// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments
-/// stop the process with the text after "@pre", before anything has changed; that a source isn't reversed is
-/// checked after all offsets and counts, and last that its beginning isn't null where its end is another.
+/// stop the process with the text after "@pre", before anything has changed. A source is checked after all
+/// offsets and counts: it may not be reversed, nor its beginning be null unless its end is.
 /// @pre "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)" of each source
 ///
 /// A failed allocation throws std::bad_alloc before anything has changed. Whatever may grow the buffer may
-/// move its storage and so invalidates pointers into it; erasing keeps the storage and moves down the bytes
-/// behind. A sequence of edits costs amortised constant time per byte added, plus the bytes that it moves.
+/// move its storage, and invalidates pointers into it; erasing keeps the storage and moves down the bytes
+/// that follow. A series of edits takes amortised constant time per byte added, plus that of the bytes that
+/// move.
 /// @snippet examples/reference.cpp VectorOfByte
 class MIREL_DESCRIBED MIREL_API VectorOfByte {
 public:
@@ -324,23 +328,23 @@ public:
   /// @snippet examples/reference.cpp bytes construction
   /// @{
 
-  /// An empty buffer without storage.
+  /// Makes an empty buffer without storage.
   VectorOfByte() noexcept : m_buffer(nullptr), size_(0), m_capacity(0) {}
-  /// A copy of the bytes of [r1, r2). @pre "r1 <= r2"
+  /// Copies the bytes of [r1, r2). @pre "r1 <= r2"
   VectorOfByte(const value_type* r1, const value_type* r2);
-  /// count bytes of value x. @pre "0 <= count"
+  /// Makes count bytes of value x. @pre "0 <= count"
   explicit VectorOfByte(ssize_t count, value_type x);
-  /// The listed bytes.
+  /// Copies the listed bytes.
   VectorOfByte(std::initializer_list<uint8> r);
-  /// A copy, whose capacity is its size.
+  /// Copies a buffer; the capacity is the size.
   VectorOfByte(const VectorOfByte& r);
-  /// Gives the storage back.
+  /// Releases the storage.
   ~VectorOfByte() {
-    if (m_buffer != nullptr) // compilers leave it out where they see that it is null
+    if (m_buffer != nullptr) // compilers remove the call if they see that the pointer is null
       Release(m_buffer);
   }
 
-  /// Becomes a copy of r; keeps the storage where it is large enough.
+  /// Becomes a copy of r; the storage is kept if it is large enough.
   VectorOfByte& operator=(const VectorOfByte& r);
   /// Exchanges contents, sizes and capacities in constant time.
   void swap(VectorOfByte& r) noexcept {
@@ -354,42 +358,42 @@ public:
   /// @snippet examples/reference.cpp bytes capacity
   /// @{
 
-  ssize_t size() const { return size_; }          ///< Bytes in use.
-  ssize_t capacity() const { return m_capacity; } ///< Bytes of storage.
-  bool empty() const { return size_ == 0; }       ///< Whether the size is 0.
+  ssize_t size() const { return size_; }          ///< The number of bytes in use.
+  ssize_t capacity() const { return m_capacity; } ///< The number of bytes of storage.
+  bool empty() const { return size_ == 0; }       ///< Returns whether the size is 0.
 
-  /// Makes room for n bytes in all, exactly; does nothing where there is room, as for a negative n. It is
-  /// const so that a const string can make room for its terminator; the contents stay as they are.
+  /// Makes room for exactly n bytes in all; does nothing if there is room, or if n is negative. It is const
+  /// so that a const string can make room for its terminator; the contents stay as they are.
   void reserve(ssize_t n) const;
-  /// Makes the size n bytes; new bytes have no particular value. @pre "0 <= n"
+  /// Changes the size to n bytes; new bytes are uninitialised. @pre "0 <= n"
   void resize(ssize_t n);
-  /// Appends count bytes of no particular value. @pre "0 <= count"
+  /// Appends count uninitialised bytes. @pre "0 <= count"
   void growbytes(ssize_t count) {
     MIREL_ASSERT(0 <= count);
-    if (count <= m_capacity - size_) // what insertbytes() comes to where there is room
+    if (count <= m_capacity - size_) // all that insertbytes() does if there is room
       size_ += count;
     else
       insertbytes(size(), count);
   }
-  /// Makes the size 0 and keeps the storage.
+  /// Removes all bytes and keeps the storage.
   void clear() noexcept { size_ = 0; }
 
   /// @}
   /// @name Access
-  /// data() and begin() are null in a buffer that has no storage yet.
+  /// data() and begin() are null in a buffer without storage.
   /// @snippet examples/reference.cpp bytes access
   /// @{
 
-  value_type* begin() { return m_buffer; }                        ///< The first byte.
-  const value_type* begin() const { return m_buffer; }            ///< The first byte.
-  value_type* end() { return m_buffer + size_; }                  ///< Past the end.
-  const value_type* end() const { return m_buffer + size_; }      ///< Past the end.
-  value_type* data() { return m_buffer; }                         ///< As begin().
-  const value_type* data() const { return m_buffer; }             ///< As begin().
-  value_type* data_end() { return m_buffer + size_; }             ///< As end().
-  const value_type* data_end() const { return m_buffer + size_; } ///< As end().
+  value_type* begin() { return m_buffer; }                        ///< Points to the first byte.
+  const value_type* begin() const { return m_buffer; }            ///< Points to the first byte.
+  value_type* end() { return m_buffer + size_; }                  ///< Points past the end.
+  const value_type* end() const { return m_buffer + size_; }      ///< Points past the end.
+  value_type* data() { return m_buffer; }                         ///< Points to the first byte.
+  const value_type* data() const { return m_buffer; }             ///< Points to the first byte.
+  value_type* data_end() { return m_buffer + size_; }             ///< Points past the end.
+  const value_type* data_end() const { return m_buffer + size_; } ///< Points past the end.
 
-  /// The byte at offset i, unchecked, so that it can address a gap that has just been opened.
+  /// The byte at offset i, unchecked.
   value_type& operator[](ssize_t i) { return m_buffer[i]; }
   /// The byte at offset i. @pre "0 <= i && i < size()"
   value_type operator[](ssize_t i) const {
@@ -417,7 +421,7 @@ public:
     return m_buffer[size_ - 1];
   }
 
-  /// Whether p points into the storage, unused capacity included.
+  /// Returns whether p points into the storage, unused capacity included.
   bool owns(const void* p) const {
     return reinterpret_cast<uintptr_t>(p) - reinterpret_cast<uintptr_t>(m_buffer) <
            static_cast<uintptr_t>(m_capacity);
@@ -441,7 +445,7 @@ public:
                   "push_back appends one number: write += for a buffer, and push_back(r1, r2) for bytes");
     static_assert(!std::is_same_v<std::remove_cv_t<T>, long double>,
                   "a long double has bytes of no particular value: append it as a double");
-    const std::remove_volatile_t<T> value = x; // x may lie in the storage that reserve() is about to give up
+    const std::remove_volatile_t<T> value = x; // x may lie in the storage that is about to be released
     const std::size_t n = std::size_t(size_) + sizeof(T); // unsigned, where it can't overflow
     if (std::size_t(m_capacity) < n) {
       const ssize_t capacity = GrownCapacity(m_capacity, n);
@@ -461,11 +465,11 @@ public:
 
   /// @}
   /// @name Inserting
-  /// Before an iterator the precondition is on its distance from begin().
+  /// For an iterator, the precondition is on its distance from begin().
   /// @snippet examples/reference.cpp bytes inserting
   /// @{
 
-  /// Opens a gap of n bytes, of no particular value. @pre "0 <= i && i <= size()", then "0 <= n"
+  /// Opens a gap of n uninitialised bytes before offset i. @pre "0 <= i && i <= size()", then "0 <= n"
   void insertbytes(ssize_t i, ssize_t n);
   /// Inserts the bytes of [r1, r2) before offset i. @pre "0 <= i && i <= size()", then "r1 <= r2"
   void insert(ssize_t i, const value_type* r1, const value_type* r2);
@@ -477,7 +481,7 @@ public:
   void insert(iterator i, ssize_t count, value_type x) { insert(i - begin(), count, x); }
   /// Inserts one byte before offset i. @pre "0 <= i && i <= size()"
   void insert(ssize_t i, value_type x) { insert(i, ssize_t(1), x); }
-  /// Inserts one byte before an iterator. @pre "0 <= i && i <= size()" @return where the byte is now
+  /// Inserts one byte before an iterator. @pre "0 <= i && i <= size()" @return an iterator at that byte
   iterator insert(iterator i, value_type x);
 
   /// @}
@@ -490,7 +494,7 @@ public:
   void move(ssize_t d, ssize_t s, ssize_t n);
   /// Removes the bytes of [i1, i2). @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
   void erase(iterator i1, iterator i2);
-  /// Removes the byte at i and returns where the next one is now. @pre "begin() <= i && i < end()"
+  /// Removes the byte at i and returns an iterator at the next one. @pre "begin() <= i && i < end()"
   iterator erase(iterator i);
   /// Removes n bytes from offset i on. @pre "0 <= i && 0 <= n && i+n <= size()"
   void erase(ssize_t i, ssize_t n);
@@ -499,8 +503,8 @@ public:
 
   /// @}
   /// @name Comparison
-  /// The sign of compare() tells the order of the bytes as unsigned values. The cost is at worst linear in
-  /// the shorter length.
+  /// The sign of the result is the order of the first differing bytes, as unsigned values. The cost is at
+  /// worst linear in the shorter length.
   /// @snippet examples/reference.cpp bytes comparison
   /// @{
 
@@ -508,7 +512,7 @@ public:
   int compare(const VectorOfByte& r) const;
   /// Compares n bytes from offset i on with those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const VectorOfByte& r) const;
-  /// Compares n bytes from offset i on with rn of r from ri on.
+  /// Compares n bytes from offset i on with rn bytes of r from offset ri on.
   /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   int compare(ssize_t i, ssize_t n, const VectorOfByte& r, ssize_t ri, ssize_t rn) const;
   /// Compares n bytes from offset i on with the pn at p.
@@ -517,23 +521,27 @@ public:
 
   /// @}
   /// @name Relations
-  /// In the order of compare(); buffers of different sizes are unequal at once.
+  /// Order buffers as compare() does; no byte is read to find buffers of different sizes unequal.
   /// @snippet examples/reference.cpp bytes relations
   /// @{
 
-  bool operator==(const VectorOfByte& r) const {
-    return size_ == r.size_ && compare(r) == 0;
-  }                                                                        ///< Same bytes.
-  bool operator!=(const VectorOfByte& r) const { return !(*this == r); }   ///< Other bytes.
-  bool operator<(const VectorOfByte& r) const { return compare(r) < 0; }   ///< Before r.
-  bool operator<=(const VectorOfByte& r) const { return compare(r) <= 0; } ///< Before r or the same.
-  bool operator>(const VectorOfByte& r) const { return compare(r) > 0; }   ///< After r.
-  bool operator>=(const VectorOfByte& r) const { return compare(r) >= 0; } ///< After r or the same.
+  /// Returns whether the bytes are equal.
+  bool operator==(const VectorOfByte& r) const { return size_ == r.size_ && compare(r) == 0; }
+  /// Returns whether the bytes differ.
+  bool operator!=(const VectorOfByte& r) const { return !(*this == r); }
+  /// Returns whether this buffer orders before r.
+  bool operator<(const VectorOfByte& r) const { return compare(r) < 0; }
+  /// Returns whether this buffer orders before r or equals it.
+  bool operator<=(const VectorOfByte& r) const { return compare(r) <= 0; }
+  /// Returns whether this buffer orders after r.
+  bool operator>(const VectorOfByte& r) const { return compare(r) > 0; }
+  /// Returns whether this buffer orders after r or equals it.
+  bool operator>=(const VectorOfByte& r) const { return compare(r) >= 0; }
 
   /// @}
 
-  // Integers of any type, which match these overloads exactly and do what the declared overload of their name
-  // does; and what is refused.
+  // Overloads for integers of any type, which match an integer exactly and call the declared overload of
+  // their name; then deleted overloads.
   /// @cond
 
   template <class N, class X, detail::IfIntegers<N, X> = 0>
@@ -562,7 +570,7 @@ public:
 
   iterator erase(std::nullptr_t) = delete;
   template <class N, detail::IfIntegers<N> = 0> detail::WriteEraseElement erase(N) = delete;
-  // Where two pointers are taken, an integer is neither a null pointer nor a count.
+  // Where two pointers are expected, an integer is neither a null pointer nor a count.
   template <class P, class Q, class Hint = detail::WriteTwoPointers, detail::IfPointerAndInteger<P, Q> = 0>
   VectorOfByte(P, Q) = delete;
   template <class P, class Q, detail::IfPointerAndInteger<P, Q> = 0>
@@ -580,21 +588,22 @@ public:
   /// @endcond
 
 private:
-  /// The capacity that a buffer grows to for n bytes, which are more than it has room for. Throws
-  /// std::bad_alloc where no ssize_t can count them.
+  /// Returns the capacity to which a buffer grows for n bytes, which are more than it has room for. Throws
+  /// std::bad_alloc if an ssize_t can't count them.
   static ssize_t GrownCapacity(ssize_t capacity, std::size_t n);
   void GrowTo(std::size_t n);
-  // By value, so that a buffer whose address nobody takes can live in registers through a loop of appends.
+  // The pointer is passed by value, so that a buffer whose address nobody takes can stay in registers through
+  // a loop of appends.
   static value_type* Reallocate(value_type* buffer, ssize_t n);
   static void Release(value_type* buffer) noexcept;
-  /// Gives back the storage behind the first n bytes, at least size() and 1; keeps it where that fails.
+  /// Reduces the storage to n bytes, at least size() and 1; keeps it if that fails.
   void Shrink(ssize_t n) noexcept;
   friend struct detail::Storage;
 
 public:
   mutable value_type* m_buffer; ///< The storage, or null while there is none.
   ssize_t size_; ///< Bytes in use, 0 <= size_ <= m_capacity; the rest is unused capacity and may be written.
-  mutable ssize_t m_capacity; ///< Bytes of storage.
+  mutable ssize_t m_capacity; ///< The number of bytes of storage.
 };
 
 } // namespace mirel

@@ -2,7 +2,7 @@
 /// string8 and string16, their null-terminated interface, and the conversions between UTF-8, UTF-16 and
 /// ASCII.
 ///
-/// The string knows null termination and nothing else: it measures a null-terminated argument once and hands
+/// The string knows null termination and nothing else: it measures a null-terminated argument once and passes
 /// the range to the vector. It has no storage and no invariant of its own.
 
 #pragma once
@@ -16,11 +16,11 @@ namespace mirel {
 
 class xostream;
 
-/// The number of code units before the null at s, in linear time. s may not be a null pointer, and isn't
+/// Counts the code units before the null at s, in linear time. s may not be a null pointer, and isn't
 /// checked.
 inline ssize_t GetStringLength(const char8* s) { return static_cast<ssize_t>(std::strlen(s)); }
-/// The number of 16-bit code units before the null at s, in linear time. s may not be a null pointer, and
-/// isn't checked.
+/// Counts the 16-bit code units before the null at s, in linear time. s may not be a null pointer, and isn't
+/// checked.
 inline ssize_t GetStringLength(const char16* s) {
   const char16* end = s;
   while (*end != 0)
@@ -28,23 +28,23 @@ inline ssize_t GetStringLength(const char16* s) {
   return end - s;
 }
 
-/// The length of a null-terminated argument of a member. A macro, so that the report names the member.
+/// Measures a null-terminated argument of a member. It is a macro so that the report names the member.
 #define MIREL_LENGTH(s) (MIREL_ASSERT_AS((s) != nullptr, "s != nullptr"), GetStringLength(s))
 
-/// A string: a vector of code units that also takes and gives null-terminated strings.
+/// A string: a vector of code units that also takes and returns null-terminated strings.
 ///
 /// Any of its units may be null, and no terminator is kept: c_str() writes one past the end, where the next
-/// change may overwrite it. All that xvector offers is offered here too, and what is said there of bad
-/// arguments, ranges, memory, invalidation, aliasing and cost holds.
+/// change may overwrite it. A string has all members of xvector, and what is said there of bad arguments,
+/// ranges, memory, invalidation, aliasing and cost holds here too.
 ///
 /// A null-terminated argument (`const T*` without a count) ends before its first null. It is measured once,
-/// before anything else is checked or changed, and then treated as a pointer and count. A literal null
-/// pointer isn't taken for one.
+/// before anything else is checked or changed, and then treated as a pointer and a count. A literal null
+/// pointer doesn't compile as one.
 /// @pre "s != nullptr" of every null-terminated argument
 ///
-/// In braces two integers are a count and a unit where a string is made of them, and a list where a vector
-/// is, as for assign() or append(): string8{3, 'x'} has three units, and `s = {3, 'x'}` doesn't compile. Only
-/// `s = {}` is an assignment, and empties the string.
+/// Two integers in braces are a count and a unit if they make a string: string8{3, 'x'} has three units. They
+/// are a list if they make a vector, as for assign() or append(). `s = {3, 'x'}` doesn't compile, and `s =
+/// {}` empties the string.
 /// @snippet examples/reference.cpp basic_xstring
 template <class T> class MIREL_DESCRIBED MIREL_API basic_xstring : public xvector<T> {
   typedef xvector<T> Base;
@@ -54,27 +54,27 @@ public:
   /// @snippet examples/reference.cpp string construction
   /// @{
 
-  /// An empty string, without storage.
+  /// Makes an empty string, without storage.
   basic_xstring() {}
-  /// rn units of r from index ri on; npos isn't a count here.
+  /// Copies rn units of r from index ri on; npos isn't a count here.
   /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   basic_xstring(const basic_xstring<T>& r, ssize_t ri, ssize_t rn) : Base(r, ri, rn) {}
-  /// The rn units at r. @pre "pn == 0 || (pn > 0 && p != nullptr)", of r and rn
+  /// Copies the rn units at r. @pre "pn == 0 || (pn > 0 && p != nullptr)", of r and rn
   basic_xstring(const T* r, ssize_t rn) : Base(r, rn) {}
-  /// The units of a null-terminated string.
+  /// Copies the units of a null-terminated string.
   basic_xstring(const T* r) : Base(r, MIREL_LENGTH(r)) {}
-  /// count units x. @pre "0 <= count"
+  /// Makes count units equal to x. @pre "0 <= count"
   explicit basic_xstring(ssize_t count, T x) : Base(count, x) {}
-  /// The units of [r1, r2). @pre "r1 <= r2"
+  /// Copies the units of [r1, r2). @pre "r1 <= r2"
   basic_xstring(const T* r1, const T* r2) : Base(r1, r2) {}
-  /// The units of [r1, r2), which may be any iterators. @pre "r1 <= r2"
+  /// Copies the units of [r1, r2), which may be any iterators. @pre "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> basic_xstring(It r1, It r2) : Base(r1, r2) {}
-  /// A copy, whose capacity is its size.
+  /// Copies a string; the capacity is the size.
   basic_xstring(const basic_xstring<T>& r) : Base(r) {}
-  /// The units of a vector, as operator+ returns it. A template, so that braces are never taken for one.
+  /// Copies a vector, as operator+ returns it. It is a template so that braces never convert to a vector.
   template <class V, std::enable_if_t<std::is_same_v<V, xvector<T>>, int> = 0>
   basic_xstring(const V& r) : Base(r) {}
-  /// Gives the storage back.
+  /// Releases the storage.
   ~basic_xstring() {}
 
   /// @}
@@ -82,7 +82,7 @@ public:
   /// @snippet examples/reference.cpp string assignment
   /// @{
 
-  /// Becomes a copy of r; keeps the storage where it is large enough.
+  /// Becomes a copy of r; the storage is kept if it is large enough.
   basic_xstring<T>& operator=(const basic_xstring<T>& r) = default;
   /// Becomes a copy of a null-terminated string.
   basic_xstring<T>& operator=(const T* rhs) {
@@ -101,12 +101,12 @@ public:
   /// @snippet examples/reference.cpp null termination
   /// @{
 
-  /// The contents with a null past the end, which is not part of the string.
+  /// Returns the contents with a null past the end, which is not part of the string.
   ///
-  /// It counts as a change, though it is const: it may move the storage, and no other thread may use the
-  /// string meanwhile. It does move it where there is no unused capacity, and then makes room for more than
-  /// one, so that appends and c_str() in turn take amortised constant time. The result is valid until the
-  /// next change; a second call without one gives the same pointer.
+  /// The call counts as a change, although it is const: no other thread may use the string meanwhile. If
+  /// there is no unused capacity it moves the storage, and makes room for more than the null, so that appends
+  /// and c_str() in turn take amortised constant time. The result is valid until the next change; until then
+  /// another call returns the same pointer.
   /// @pre "p": never null after room was made
   const T* c_str() const {
     const ssize_t n = this->size();
@@ -158,37 +158,37 @@ public:
   /// @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const T* p) const { return compare(i, n, p, MIREL_LENGTH(p)); }
   using Base::_Eq;
-  /// Whether the string holds the units of a null-terminated string.
+  /// Returns whether the string has the units of a null-terminated string.
   bool _Eq(const T* rhs) const { return compare(rhs) == 0; }
   using Base::_Lt;
-  /// Whether the string orders before a null-terminated string.
+  /// Returns whether the string orders before a null-terminated string.
   bool _Lt(const T* rhs) const { return compare(rhs) < 0; }
 
   /// @}
   /// @name Search
-  /// Results, and what offset may be, are as in the vector's searches: from offset on forwards
+  /// Return an index or npos, as the vector's searches do. Forward searches begin at index offset.
   /// @pre "0 <= offset && offset <= size()"
   ///
-  /// and from offset down to 0 in reverse, npos being the last unit.
+  /// Reverse searches go from index offset down to 0; npos is the last unit.
   /// @pre "offset == npos || (0 <= offset && offset < size())"
   ///
   /// @snippet examples/reference.cpp string search
   /// @{
 
   using Base::find;
-  /// Finds the first occurrence of a null-terminated string; an empty one at offset.
+  /// Finds the first occurrence of a null-terminated string from offset on; an empty one is found at offset.
   ssize_t find(const T* p, ssize_t offset = 0) const { return find(p, offset, MIREL_LENGTH(p)); }
   using Base::rfind;
-  /// Finds the last occurrence of a null-terminated string that starts at or before offset; an empty one at
-  /// offset, for npos at size().
+  /// Finds the last occurrence of a null-terminated string that starts at or before offset; an empty one is
+  /// found at offset, or for npos at size().
   ssize_t rfind(const T* p, ssize_t offset = Base::npos) const { return rfind(p, offset, MIREL_LENGTH(p)); }
   using Base::find_first_of;
-  /// Finds the first unit that occurs in a null-terminated set.
+  /// Finds the first unit from offset on that occurs in a null-terminated set.
   ssize_t find_first_of(const T* s, ssize_t offset = 0) const {
     return find_first_of(s, offset, MIREL_LENGTH(s));
   }
   using Base::find_first_not_of;
-  /// Finds the first unit that doesn't occur in a null-terminated set.
+  /// Finds the first unit from offset on that doesn't occur in a null-terminated set.
   ssize_t find_first_not_of(const T* s, ssize_t offset = 0) const {
     return find_first_not_of(s, offset, MIREL_LENGTH(s));
   }
@@ -203,7 +203,7 @@ public:
     return find_last_not_of(s, offset, MIREL_LENGTH(s));
   }
 
-  /// A new string: count units from index offset on, npos being all that follow.
+  /// Returns a new string of count units from index offset on; npos means all that follow.
   /// @pre "0 <= offset && offset <= size()", then "count == npos || (0 <= count && offset+count <= size())"
   basic_xstring<T> substr(ssize_t offset = 0, ssize_t count = Base::npos) const {
     Base units = Base::substr(offset, count);
@@ -213,14 +213,15 @@ public:
   }
 
   /// @}
-  // Integers of any type, as in xvector, and what is refused: a literal null pointer is no string.
+  // Overloads for integers of any type, as in xvector, and deleted ones: a literal null pointer isn't a
+  // string.
   /// @cond
 
   template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
   basic_xstring(P r, N rn) : Base(static_cast<const T*>(r), detail::Count(rn)) {}
   template <class N, class X, detail::IfIntegers<N, X> = 0>
   explicit basic_xstring(N count, X x) MIREL_FITS(T, x) : Base(detail::Count(count), detail::Unit<T>(x)) {}
-  /// Takes `s = {}`, which would otherwise be a null pointer.
+  /// Takes `s = {}`, which would otherwise assign a null pointer.
   basic_xstring<T>& operator=(std::initializer_list<detail::NoUnit>) {
     this->clear();
     return *this;
@@ -267,40 +268,43 @@ extern template class xvector<char16>;
 extern template class basic_xstring<char16>;
 
 /// @name Conversions
-/// Replace the contents of the destination with the srcLen units at src, in one pass and in
-/// linear time. UTF-16 is in the machine's own byte order; a byte order mark is a code point like any other,
-/// and so is a zero. What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition
-/// D91 for UTF-16. A failed allocation throws std::bad_alloc: a UTF conversion then leaves the beginning of
-/// the result in the destination, the one from ASCII what was there before. On return the destination has the
-/// capacity that it had, or as much as the result and the terminator of c_str() need if that is more. The
-/// source may not lie in the destination; a null pointer may come with a count of 0.
+/// Replace the contents of the destination with the srcLen units at src, in one pass and in linear time.
+/// UTF-16 is in the machine's own byte order; a byte order mark is a code point like any other, and so is a
+/// null. What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for
+/// UTF-16. A failed allocation throws std::bad_alloc; a UTF conversion then leaves the beginning of the
+/// result in the destination, the conversion from ASCII leaves the destination as it was. On return the
+/// destination has its old capacity, or that of the result and the terminator of c_str() if that is more. The
+/// source may not lie in the destination. A null pointer with a count of 0 is an empty source.
 /// @snippet examples/reference.cpp conversions
 /// @{
 
-/// One unit for each byte: its value, or "?" for bytes from 0x80 on. @pre "newSize >= 0", of srcLen
+/// Converts ASCII to UTF-16, a unit for each byte; bytes from 0x80 on become "?". @pre "newSize >= 0", of
+/// srcLen
 MIREL_API void Utf16FromAscii(string16& dst, const char8* src, ssize_t srcLen);
 
-/// UTF-8 to UTF-16.
-/// @return false where the source is malformed or cut off; then what precedes the bad sequence has been
-/// converted
+/// Converts UTF-8 to UTF-16.
+/// @return false if the source is malformed or truncated; the destination then holds what precedes the
+/// malformed sequence
 /// @pre "srcLen >= 0"
 MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src, ssize_t srcLen);
-/// UTF-8 to UTF-16, from a null-terminated string.
-/// @return false where the source is malformed or cut off
+/// Converts a null-terminated string from UTF-8 to UTF-16.
+/// @return false if the source is malformed or truncated
 /// @pre "src"
 MIREL_API bool Utf16FromUtf8(string16& dst, const char8* src);
-/// UTF-16 to UTF-8.
-/// @return as the way there
+/// Converts UTF-16 to UTF-8.
+/// @return false if the source is malformed or truncated; the destination then holds what precedes the
+/// malformed sequence
 /// @pre "srcLen >= 0"
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src, ssize_t srcLen);
-/// UTF-16 to UTF-8, from a null-terminated string.
-/// @return false where the source is malformed or cut off
+/// Converts a null-terminated string from UTF-16 to UTF-8.
+/// @return false if the source is malformed or truncated
 /// @pre "src"
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src);
 
-/// What the four above do, for generic code: (char16, char8) is UTF-8 to UTF-16, (char8, char16) the way
-/// back.
-/// @return as theirs
+/// Converts between the encodings in generic code: CharOut is char16 and CharIn char8 from UTF-8 to UTF-16,
+/// and the reverse from UTF-16 to UTF-8.
+/// @return false if the source is malformed or truncated; the destination then holds what precedes the
+/// malformed sequence
 /// @pre "srcLen >= 0"
 template <class CharOut, class CharIn>
 bool UtfToUtf([[maybe_unused]] basic_xstring<CharOut>& result, const CharIn*, ssize_t) {
@@ -310,7 +314,7 @@ bool UtfToUtf([[maybe_unused]] basic_xstring<CharOut>& result, const CharIn*, ss
 /// @cond
 template <> MIREL_API bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen);
 template <> MIREL_API bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen);
-// A reverse iterator converts to a pointer, but not to one at the element that it designates.
+// A reverse iterator converts to a pointer past the element that it designates.
 template <class... N>
 detail::ReverseIteratorsOnlyStep Utf16FromUtf8(string16&, const detail::ReversePointer&, N...) = delete;
 template <class... N>
@@ -320,7 +324,7 @@ detail::ReverseIteratorsOnlyStep Utf16FromAscii(string16&, const detail::Reverse
 
 /// @}
 
-/// Writes the units of v, zeros included and unformatted, to os.
+/// Writes the units of v, nulls included, to os without formatting.
 MIREL_API xostream& operator<<(xostream& os, const string8& v);
 
 /// Does nothing; a reference to it pulls the string code of a static library into a program.

@@ -26,29 +26,30 @@ namespace mirel {
 /// and a number of elements; `r1`/`r2` a half-open range elsewhere; `x` an element; `c` an element that is
 /// looked for; `offset` where a search starts; `count` a repeat, fill or substring length. All are in
 /// elements, and signed. An integer of any type may stand for each: a literal 0 is an index, a count or an
-/// element, never a pointer. What a range may be of, and what its elements count as, utils/Ranges.h says; a
-/// single element counts by its unsigned value too. A constant that doesn't fit is refused by clang, and by
-/// g++ where it optimises, which also knows some variables to be such constants; g++ only warns where it is
-/// searched for.
+/// element, never a pointer. utils/Ranges.h says which iterators a range may have, and what its elements
+/// count as; a single element counts by its unsigned value too. A constant that doesn't fit doesn't compile
+/// with clang, nor with g++ if it optimises. G++ may take a variable for a constant if it knows the value,
+/// and only warns of a constant that is searched for.
 ///
 /// @par Bad arguments
 /// stop the process with the text given after "@pre", before anything has changed. They are never clamped. A
-/// null pointer is an empty range together with a count of 0, and a bad argument otherwise.
+/// null pointer with a count of 0 is an empty range; any other null pointer is a bad argument.
 /// @par Ranges
-/// are checked after all indices and counts: that they aren't reversed, where the iterators are random-access
-/// ones or our own, and that a pointer to their beginning isn't null where the one to their end is another.
+/// are checked after all indices and counts: a range of random-access iterators, or of our reverse iterators,
+/// may not be reversed, and the beginning of a range may not be a null pointer unless the end is one too.
 /// @pre "r1 <= r2", then, where elements are copied,
 /// "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)", and "r1 == r2 || r1 != nullptr"
 /// where they are searched for
 /// @par Memory
 /// A failed allocation throws std::bad_alloc: contents, size and capacity are as they were before the call.
 /// @par Invalidation
-/// Whatever may add elements or capacity may move the storage: pointers, references and iterators from before
-/// are invalid. Erasing keeps the storage and moves down the elements behind; swap() exchanges the storage.
+/// Whatever may add elements or capacity may move the storage, and invalidates pointers, references and
+/// iterators. Erasing keeps the storage and moves down the elements that follow; swap() exchanges the
+/// storage.
 /// @par Aliasing
 /// An argument that is, or lies in, the vector itself gives the result as if it had been copied first.
 /// @par Cost
-/// A run of edits takes amortised constant time per element added, plus that of the elements that move.
+/// A series of edits takes amortised constant time per element added, plus that of the elements that move.
 /// @par Threads
 /// Different threads may use different vectors, and may read one vector that no thread changes.
 ///
@@ -70,7 +71,7 @@ public:
   typedef ssize_t size_type;              ///< A count or index, signed.
   typedef std::ptrdiff_t difference_type; ///< The distance of two iterators.
 
-  /// As a count: up to the end. As the start of a reverse search: the last element. As a result: not found.
+  /// A count up to the end; the last element, where a reverse search starts; a result that means "not found".
   enum { npos = -1 };
 
   class const_reverse_iterator;
@@ -82,36 +83,36 @@ public:
   /// @snippet examples/reference.cpp construction
   /// @{
 
-  /// An empty vector, without storage.
+  /// Makes an empty vector, without storage.
   xvector() {}
-  /// rn elements of r from index ri on. @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
+  /// Copies rn elements of r from index ri on. @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   xvector(const xvector<T>& r, ssize_t ri, ssize_t rn) { assign(r, ri, rn); }
-  /// The pn elements at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// Copies the pn elements at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   xvector(const T* p, ssize_t pn) { assign(p, pn); }
-#if __SIZEOF_POINTER__ != 4 // where it is, ssize_t is int
-  /// count elements equal to x. @pre "0 <= count"
+#if __SIZEOF_POINTER__ != 4 // otherwise ssize_t is int
+  /// Makes count elements equal to x. @pre "0 <= count"
   explicit xvector(ssize_t count, const T& x) {
     MIREL_ASSERT(0 <= count);
     FillRange(0, 0, count, x);
   }
 #endif
-  /// count elements equal to x, implicitly. @pre "0 <= count"
+  /// Makes count elements equal to x; not explicit for an int. @pre "0 <= count"
   xvector(int count, const T& x) {
     MIREL_ASSERT(0 <= count);
     FillRange(0, 0, count, x);
   }
-  /// The elements of [r1, r2). @pre "r1 <= r2"
+  /// Copies the elements of [r1, r2). @pre "r1 <= r2"
   xvector(const T* r1, const T* r2) { assign(r1, r2); }
-  /// The elements of [r1, r2), which may be any iterators. @pre "r1 <= r2"
+  /// Copies the elements of [r1, r2), which may be any iterators. @pre "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> xvector(It r1, It r2) { assign(r1, r2); }
-  /// A copy.
+  /// Copies a vector.
   xvector(const xvector<T>& r) { assign(r); }
-  /// The listed elements.
+  /// Copies the listed elements.
   xvector(std::initializer_list<T> r) { assign(r.begin(), r.end()); }
-  /// Gives the storage back.
+  /// Releases the storage.
   ~xvector() { p_del(data(), data_end()); }
 
-  /// Becomes a copy of r; keeps the storage where it is large enough.
+  /// Becomes a copy of r; the storage is kept if it is large enough.
   xvector<T>& operator=(const xvector<T>& r) {
     if (this != &r)
       assign(r);
@@ -125,31 +126,31 @@ public:
   /// @snippet examples/reference.cpp capacity
   /// @{
 
-  /// Makes room for size elements in all, exactly; does nothing where there is room. @pre "size >= 0"
+  /// Makes room for exactly size elements in all; does nothing if there is room. @pre "size >= 0"
   void reserve(ssize_t size) const {
     MIREL_ASSERT(size >= 0);
     m_buffer.reserve(Bytes(size));
   }
-  /// How many elements there is room for in the storage.
+  /// The number of elements that the storage has room for.
   ssize_t capacity() const { return Elements(m_buffer.capacity()); }
-  /// Drops elements at the end, or adds elements equal to x there. @pre "newSize >= 0"
+  /// Removes elements at the end, or appends elements equal to x. @pre "newSize >= 0"
   void resize(ssize_t newSize, const T& x);
-  bool empty() const { return m_buffer.empty(); }            ///< Whether there are no elements.
-  ssize_t size() const { return Elements(m_buffer.size()); } ///< How many elements there are.
-  ssize_t length() const { return size(); }                  ///< As size().
+  bool empty() const { return m_buffer.empty(); }            ///< Returns whether there are no elements.
+  ssize_t size() const { return Elements(m_buffer.size()); } ///< The number of elements.
+  ssize_t length() const { return size(); }                  ///< The number of elements, as size().
 
   /// @}
   /// @name Access
-  /// data() is null in a vector that has no storage yet. The elements stand one behind the other.
+  /// data() is null in a vector without storage. The elements are contiguous.
   /// @snippet examples/reference.cpp access
   /// @{
 
-  /// The first element.
+  /// Points to the first element.
   const T* data() const { return reinterpret_cast<const T*>(m_buffer.begin()); }
-  T* data() { return reinterpret_cast<T*>(m_buffer.begin()); } ///< The first element.
-  /// Past the end.
+  T* data() { return reinterpret_cast<T*>(m_buffer.begin()); } ///< Points to the first element.
+  /// Points past the end.
   const T* data_end() const { return reinterpret_cast<const T*>(m_buffer.end()); }
-  T* data_end() { return reinterpret_cast<T*>(m_buffer.end()); } ///< Past the end.
+  T* data_end() { return reinterpret_cast<T*>(m_buffer.end()); } ///< Points past the end.
 
   /// The element at index i. @pre "0 <= i && i < size()"
   const T& operator[](ssize_t i) const {
@@ -187,20 +188,20 @@ public:
   /// @snippet examples/reference.cpp iterators
   /// @{
 
-  const_iterator begin() const { return data(); }   ///< The first element.
-  const_iterator end() const { return data_end(); } ///< Past the end.
-  iterator begin() { return data(); }               ///< The first element.
-  iterator end() { return data_end(); }             ///< Past the end.
-  /// The last element.
+  const_iterator begin() const { return data(); }   ///< Points to the first element.
+  const_iterator end() const { return data_end(); } ///< Points past the end.
+  iterator begin() { return data(); }               ///< Points to the first element.
+  iterator end() { return data_end(); }             ///< Points past the end.
+  /// Designates the last element.
   const_reverse_iterator rbegin() const { return const_reverse_iterator(end()); }
-  /// The reverse past-the-end.
+  /// The reverse past-the-end iterator.
   const_reverse_iterator rend() const { return const_reverse_iterator(begin()); }
-  reverse_iterator rbegin() { return reverse_iterator(end()); } ///< The last element.
-  reverse_iterator rend() { return reverse_iterator(begin()); } ///< The reverse past-the-end.
+  reverse_iterator rbegin() { return reverse_iterator(end()); } ///< Designates the last element.
+  reverse_iterator rend() { return reverse_iterator(begin()); } ///< The reverse past-the-end iterator.
 
   /// @}
   /// @name Assignment
-  /// Replaces the whole contents; keeps the storage where it is large enough.
+  /// Replace the whole contents; the storage is kept if it is large enough.
   /// @snippet examples/reference.cpp assignment
   /// @{
 
@@ -232,7 +233,7 @@ public:
     p_del(data(), data_end());
     m_buffer.clear();
   }
-  void clear() { erase(); } ///< As erase().
+  void clear() { erase(); } ///< Removes all elements and keeps the storage, as erase().
 
   /// @}
   /// @name Appending
@@ -251,7 +252,7 @@ public:
   template <class It, detail::IfIterator<It> = 0> void push_back(ssize_t count, It r1, It r2) {
     MIREL_ASSERT(0 <= count);
     MIREL_ASSERT_AS(detail::IsRange(r1, r2), "r1 <= r2");
-    if (count == 0) // nothing is copied, and so nothing else is wrong with the range
+    if (count == 0) // nothing is copied, so the range isn't checked any further
       return;
     MIREL_ASSERT_SOURCE(r1, r2);
     const auto source = detail::Source<T>(r1, r2);
@@ -266,7 +267,7 @@ public:
     push_back(x);
     return *this;
   }
-  /// A new vector: the elements of this one, then those of r. Allocates once.
+  /// Returns a new vector: the elements of this one, then those of r. Allocates once.
   const xvector<T> operator+(const xvector<T>& r) const {
     xvector<T> z;
     z.reserve(Sum(size(), r.size()));
@@ -274,7 +275,7 @@ public:
     z.append(r);
     return z;
   }
-  /// A new vector: the elements of this one, then x. Allocates once.
+  /// Returns a new vector: the elements of this one, then x. Allocates once.
   const xvector<T> operator+(const T& x) const {
     xvector<T> z;
     z.reserve(Sum(size(), 1));
@@ -282,7 +283,7 @@ public:
     z.push_back(x);
     return z;
   }
-  /// Makes the contents count copies of themselves, in new storage. @pre "0 <= count"
+  /// Repeats the contents count times, in new storage. @pre "0 <= count"
   xvector<T>& operator*=(ssize_t count) {
     MIREL_ASSERT(0 <= count);
     xvector<T> product;
@@ -322,7 +323,7 @@ public:
   /// Copies n elements from index s to index d, also where the two ranges overlap. The size stays.
   /// @pre "0 <= d && 0 <= n && d+n <= size()", then "0 <= s && 0 <= n && s+n <= size()"
   void move(ssize_t d, ssize_t s, ssize_t n) {
-    // What the buffer asserts, asserted before the scaling to bytes, which could overflow.
+    // The buffer asserts this too, but after the scaling to bytes, which could overflow.
     MIREL_ASSERT_SUBRANGE(d, n, size());
     MIREL_ASSERT_SUBRANGE(s, n, size());
     m_buffer.move(d * S, s * S, n * S);
@@ -330,11 +331,11 @@ public:
 
   /// @}
   /// @name Inserting
-  /// Before index or iterator i. Before an iterator the precondition is on its distance from begin().
+  /// Insert before index or iterator i. For an iterator, the precondition is on its distance from begin().
   /// @snippet examples/reference.cpp inserting
   /// @{
 
-  /// Inserts the elements of [r1, r2), which may be any iterators.
+  /// Inserts the elements of [r1, r2), which may be any iterators, before index i.
   /// @pre "0 <= i && i <= size()", then "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> void insert(ssize_t i, It r1, It r2) {
     MIREL_ASSERT(0 <= i && i <= size());
@@ -342,19 +343,20 @@ public:
     const auto source = detail::Source<T>(r1, r2);
     ReplaceRange(i, 0, source.begin(), source.size());
   }
-  /// Inserts the elements of r. @pre "0 <= i && i <= size()"
+  /// Inserts the elements of r before index i. @pre "0 <= i && i <= size()"
   void insert(ssize_t i, const xvector<T>& r) {
     MIREL_ASSERT(0 <= i && i <= size());
     ReplaceRange(i, 0, r.begin(), r.size());
   }
-  /// Inserts rn elements of r from index ri on.
+  /// Inserts rn elements of r, from index ri on, before index i.
   /// @pre "0 <= ri && 0 <= rn && ri+rn <= r.size()", then "0 <= i && i <= size()"
   void insert(ssize_t i, const xvector<T>& r, ssize_t ri, ssize_t rn) {
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
     MIREL_ASSERT(0 <= i && i <= size());
     ReplaceRange(i, 0, r.begin() + ri, rn);
   }
-  /// Inserts the pn elements at p. @pre "pn == 0 || (pn > 0 && p != nullptr)", then "0 <= i && i <= size()"
+  /// Inserts the pn elements at p before index i.
+  /// @pre "pn == 0 || (pn > 0 && p != nullptr)", then "0 <= i && i <= size()"
   void insert(ssize_t i, const T* p, ssize_t pn) {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     MIREL_ASSERT(0 <= i && i <= size());
@@ -365,7 +367,7 @@ public:
     MIREL_ASSERT(0 <= i && i <= size());
     FillRange(i, 0, 1, x);
   }
-  /// Inserts x before an iterator. @return where it is now
+  /// Inserts x before an iterator. @return an iterator at the inserted element
   iterator insert(iterator i, const T& x) {
     const ssize_t n = i - begin();
     insert(n, x);
@@ -379,39 +381,40 @@ public:
   }
   /// Inserts count elements equal to x before an iterator.
   void insert(iterator i, ssize_t count, const T& x) { insert(i - begin(), count, x); }
-#if __SIZEOF_POINTER__ != 4 // where it is, ssize_t is int
-  /// Inserts an int's count of elements equal to x before index i.
+#if __SIZEOF_POINTER__ != 4 // otherwise ssize_t is int
+  /// Inserts count elements equal to x, with an int for the count, before index i.
   void insert(ssize_t i, int count, const T& x) { insert(i, ssize_t(count), x); }
-  /// Inserts an int's count of elements equal to x before an iterator.
+  /// Inserts count elements equal to x, with an int for the count, before an iterator.
   void insert(iterator i, int count, const T& x) { insert(i, ssize_t(count), x); }
 #endif
 
   /// @}
   /// @name Replacing
-  /// Puts other elements in the place of the n from index i on, or of those of [i1, i2).
+  /// Replace the n elements from index i on, or those of [i1, i2).
   /// @snippet examples/reference.cpp replacing
   /// @{
 
-  /// Replaces the n elements by those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
+  /// Replaces n elements from index i on by those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
   void replace(ssize_t i, ssize_t n, const xvector<T>& r) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     ReplaceRange(i, n, r.begin(), r.size());
   }
-  /// Replaces the n elements by rn of r from index ri on.
+  /// Replaces n elements from index i on by rn elements of r from index ri on.
   /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   void replace(ssize_t i, ssize_t n, const xvector<T>& r, ssize_t ri, ssize_t rn) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
     ReplaceRange(i, n, r.begin() + ri, rn);
   }
-  /// Replaces the n elements by the pn at p.
+  /// Replaces n elements from index i on by the pn elements at p.
   /// @pre "0 <= i && 0 <= n && i+n <= size()", then "pn == 0 || (pn > 0 && p != nullptr)"
   void replace(ssize_t i, ssize_t n, const T* p, ssize_t pn) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     ReplaceRange(i, n, p, pn);
   }
-  /// Replaces the n elements by count equal to x. @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= count"
+  /// Replaces n elements from index i on by count elements equal to x.
+  /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= count"
   void replace(ssize_t i, ssize_t n, ssize_t count, const T& x) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT(0 <= count);
@@ -422,14 +425,14 @@ public:
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
     ReplaceRange(i1 - begin(), i2 - i1, r.begin(), r.size());
   }
-  /// Replaces the elements of [i1, i2) by the pn at p.
+  /// Replaces the elements of [i1, i2) by the pn elements at p.
   /// @pre "begin() <= i1 && i1 <= i2 && i2 <= end()", then "pn == 0 || (pn > 0 && p != nullptr)"
   void replace(iterator i1, iterator i2, const T* p, ssize_t pn) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     ReplaceRange(i1 - begin(), i2 - i1, p, pn);
   }
-  /// Replaces the elements of [i1, i2) by count equal to x.
+  /// Replaces the elements of [i1, i2) by count elements equal to x.
   /// @pre "begin() <= i1 && i1 <= i2 && i2 <= end()", then "0 <= count"
   void replace(iterator i1, iterator i2, ssize_t count, const T& x) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
@@ -439,8 +442,8 @@ public:
 
   /// @}
   /// @name Erasing
-  /// The elements behind move down in one step, which invalidates what points there; the storage stays. A
-  /// count can't be npos.
+  /// The elements that follow move down once, which invalidates pointers to them; the storage stays. A count
+  /// can't be npos.
   /// @snippet examples/reference.cpp erasing
   /// @{
 
@@ -450,7 +453,7 @@ public:
     p_del(i1, i2);
     m_buffer.erase(reinterpret_cast<uint8*>(i1), reinterpret_cast<uint8*>(i2));
   }
-  /// Removes the element at i. @pre "begin() <= i && i < end()" @return where the next element is now
+  /// Removes the element at i. @pre "begin() <= i && i < end()" @return an iterator at the next element
   iterator erase(iterator i) {
     MIREL_ASSERT(begin() <= i && i < end());
     const ssize_t n = i - begin();
@@ -490,9 +493,9 @@ public:
 
   /// @}
   /// @name Comparison
-  /// By the first differing element as an unsigned value; of a vector and its proper prefix, the prefix is
-  /// first. compare() is negative, 0 or positive: for char8 a difference is the value of memcmp, otherwise
-  /// -1, 0 or 1. The cost is at worst linear in the shorter length.
+  /// Compare the first differing elements as unsigned values; a proper prefix of a vector orders before it.
+  /// compare() returns a negative number, 0 or a positive one: for char8 a difference is the value of memcmp,
+  /// otherwise the result is -1, 0 or 1. The cost is at worst linear in the shorter length.
   /// @snippet examples/reference.cpp comparison
   /// @{
 
@@ -525,11 +528,11 @@ public:
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return LexicographicalCompareX(begin() + i, begin() + i + n, p, p + pn);
   }
-  /// Whether the two hold the same elements; vectors of different sizes are told apart without reading any.
+  /// Returns whether both have equal elements; none is read if the sizes differ.
   bool _Eq(const xvector<T>& r) const { return size() == r.size() && IsEqual(begin(), end(), r.begin()); }
-  /// Whether this one orders before r.
+  /// Returns whether this vector orders before r.
   bool _Lt(const xvector<T>& r) const { return compare(r) < 0; }
-  /// Whether [r1, r2) stands at index offset. @pre "0 <= offset && offset <= size()", then "r1 <= r2"
+  /// Returns whether [r1, r2) stands at index offset. @pre "0 <= offset && offset <= size()", then "r1 <= r2"
   template <class It, detail::IfIterator<It> = 0> bool contains(It r1, It r2, ssize_t offset) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
     MIREL_ASSERT_NEEDLE(r1, r2);
@@ -539,30 +542,30 @@ public:
 
   /// @}
   /// @name Search
-  /// The result is an index, or npos when nothing is found. What is looked for is an element, a range of any
-  /// forward iterators, a vector, or a pointer and count (with offset before the count).
+  /// Return an index, or npos if nothing is found. The needle or set is an element, a range of any forward
+  /// iterators, a vector, or a pointer and a count (which follows offset).
   ///
   /// Forward searches begin at index offset. @pre "0 <= offset && offset <= size()"
   ///
-  /// Reverse searches go from index offset, npos being that of the last element, down to 0.
+  /// Reverse searches go from index offset down to 0; npos is the last element.
   /// @pre "offset == npos || (0 <= offset && offset < size())"
   ///
-  /// A pointer and count is checked before offset, a range after it.
+  /// A pointer and its count are checked before offset, a range after it.
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   /// @pre "r1 <= r2"
   ///
-  /// Nothing is allocated. At worst the cost is linear in the length searched for one element; in the sum of
-  /// both lengths for needles and sets of code units, and for needles of integers by random-access iterators;
-  /// and their product otherwise.
+  /// Nothing is allocated. The cost is at worst linear in the searched length for one element; linear in the
+  /// sum of both lengths for needles and sets of code units, and for needles of any integers with
+  /// random-access iterators; and otherwise the product of both lengths.
   /// @snippet examples/reference.cpp search
   /// @{
 
-  /// Finds the first element that is c.
+  /// Finds the first element equal to c, from offset on.
   ssize_t find(const T& c, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
     return Index(Find(begin() + offset, end(), c), end());
   }
-  /// Finds the first occurrence of [r1, r2); an empty one at offset.
+  /// Finds the first occurrence of [r1, r2) from offset on; an empty range is found at offset.
   template <class It, detail::IfIterator<It> = 0> ssize_t find(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
     detail::RequireForward<It>();
@@ -572,21 +575,21 @@ public:
     const auto needle = detail::Needle<T>(r1, r2);
     return Index(FindFirstSubSequence(begin() + offset, end(), needle.begin(), needle.end()), end());
   }
-  /// Finds the first occurrence of r.
+  /// Finds the first occurrence of r from offset on.
   ssize_t find(const xvector<T>& r, ssize_t offset = 0) const { return find(r.begin(), r.end(), offset); }
-  /// Finds the first occurrence of the pn elements at p.
+  /// Finds the first occurrence of the pn elements at p from offset on.
   ssize_t find(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return find(p, p + pn, offset);
   }
 
-  /// Finds the last element at or before offset that is c.
+  /// Finds the last element equal to c, at or before offset.
   ssize_t rfind(const T& c, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
     return Index(FindLast(begin(), After(offset), c), After(offset));
   }
-  /// Finds the last occurrence of [r1, r2) that starts at or before offset; it may reach past it. An empty
-  /// one is found at offset, for npos at size().
+  /// Finds the last occurrence of [r1, r2) that starts at or before offset; it may end behind offset. An
+  /// empty range is found at offset, or for npos at size().
   template <class It, detail::IfIterator<It> = 0> ssize_t rfind(It r1, It r2, ssize_t offset = npos) const;
   /// Finds the last occurrence of r that starts at or before offset.
   ssize_t rfind(const xvector<T>& r, ssize_t offset = npos) const {
@@ -598,9 +601,9 @@ public:
     return rfind(p, p + pn, offset);
   }
 
-  /// Finds the first element that is c.
+  /// Finds the first element equal to c from offset on, as find().
   ssize_t find_first_of(const T& c, ssize_t offset = 0) const { return find(c, offset); }
-  /// Finds the first element that occurs in [r1, r2). An empty set matches nothing.
+  /// Finds the first element from offset on that occurs in [r1, r2). An empty set matches nothing.
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_first_of(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
@@ -609,21 +612,22 @@ public:
     const auto set = detail::Needle<T>(r1, r2);
     return Index(FindFirstOf(begin() + offset, end(), set.begin(), set.end()), end());
   }
-  /// Finds the first element that occurs in r. It isn't const: on a const vector give r's range.
+  /// Finds the first element from offset on that occurs in r. It isn't const: on a const vector, pass
+  /// r.begin() and r.end().
   ssize_t find_first_of(const xvector<T>& r, ssize_t offset = 0) {
     return find_first_of(r.begin(), r.end(), offset);
   }
-  /// Finds the first element that is one of the pn at p.
+  /// Finds the first element from offset on that is one of the pn at p.
   ssize_t find_first_of(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return find_first_of(p, p + pn, offset);
   }
 
-  /// Finds the first element that is not c.
+  /// Finds the first element from offset on that differs from c.
   ssize_t find_first_not_of(const T& c, ssize_t offset = 0) const {
     return find_first_not_of(&c, &c + 1, offset);
   }
-  /// Finds the first element that doesn't occur in [r1, r2). An empty set excludes nothing.
+  /// Finds the first element from offset on that doesn't occur in [r1, r2). An empty set excludes nothing.
   template <class It, detail::IfIterator<It> = 0>
   ssize_t find_first_not_of(It r1, It r2, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
@@ -632,17 +636,18 @@ public:
     const auto set = detail::Needle<T>(r1, r2);
     return Index(FindFirstNotOf(begin() + offset, end(), set.begin(), set.end()), end());
   }
-  /// Finds the first element that doesn't occur in r. It isn't const: on a const vector give r's range.
+  /// Finds the first element from offset on that doesn't occur in r. It isn't const: on a const vector, pass
+  /// r.begin() and r.end().
   ssize_t find_first_not_of(const xvector<T>& r, ssize_t offset = 0) {
     return find_first_not_of(r.begin(), r.end(), offset);
   }
-  /// Finds the first element that is none of the pn at p.
+  /// Finds the first element from offset on that is none of the pn at p.
   ssize_t find_first_not_of(const T* p, ssize_t offset, ssize_t pn) const {
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     return find_first_not_of(p, p + pn, offset);
   }
 
-  /// Finds the last element at or before offset that is c.
+  /// Finds the last element equal to c at or before offset, as rfind().
   ssize_t find_last_of(const T& c, ssize_t offset = npos) const { return rfind(c, offset); }
   /// Finds the last element at or before offset that occurs in [r1, r2).
   template <class It, detail::IfIterator<It> = 0>
@@ -663,7 +668,7 @@ public:
     return find_last_of(p, p + pn, offset);
   }
 
-  /// Finds the last element at or before offset that is not c.
+  /// Finds the last element at or before offset that differs from c.
   ssize_t find_last_not_of(const T& c, ssize_t offset = npos) const {
     return find_last_not_of(&c, &c + 1, offset);
   }
@@ -686,7 +691,7 @@ public:
     return find_last_not_of(p, p + pn, offset);
   }
 
-  /// A new vector: count elements from index offset on, npos being all that follow.
+  /// Returns a new vector of count elements from index offset on; npos means all that follow.
   /// @pre "0 <= offset && offset <= size()", then "count == npos || (0 <= count && offset+count <= size())"
   xvector<T> substr(ssize_t offset = 0, ssize_t count = npos) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
@@ -698,9 +703,9 @@ public:
 
   /// @}
 
-  // Integers of any type, and what is refused. An integer matches these overloads exactly, so that a literal
-  // 0 is an index, a count or an element where a null pointer could be meant too. Each does what the declared
-  // overload of its name does; an element is taken by its unsigned value.
+  // Overloads for integers of any type, then deleted overloads. An integer matches the former exactly, so
+  // that a literal 0 is an index, a count or an element, never a null pointer. Each calls the declared
+  // overload of its name, with elements by their unsigned value.
   /// @cond
 
   template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
@@ -801,13 +806,13 @@ public:
   detail::WriteNullptrOrPointerAndCount compare(N...) const = delete;
   detail::WriteRangeOfTheSet find_first_of(const xvector<T>&, ssize_t = 0) const = delete;
   detail::WriteRangeOfTheSet find_first_not_of(const xvector<T>&, ssize_t = 0) const = delete;
-  // The pointer that a reverse iterator converts to isn't at the element that it designates.
+  // A reverse iterator converts to a pointer past the element that it designates.
   template <class... A> detail::ReverseIteratorsOnlyStep erase(const detail::ReversePointer&, A...) = delete;
   template <class... A> detail::ReverseIteratorsOnlyStep insert(const detail::ReversePointer&, A...) = delete;
   template <class... A>
   detail::ReverseIteratorsOnlyStep replace(const detail::ReversePointer&, A...) = delete;
   detail::ReverseIteratorsOnlyStep operator+=(const detail::ReversePointer&) = delete;
-  // Text of other units, and other strings. What to write is the argument for Hint.
+  // Text of other units, and other strings. The compiler's message names what to write as the type of Hint.
   template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   explicit xvector(const X&, N...) = delete;
   template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
@@ -841,15 +846,15 @@ public:
 protected:
   /// The most elements whose bytes an ssize_t can count.
   static constexpr ssize_t kMaxSize = std::numeric_limits<ssize_t>::max() / ssize_t(sizeof(T));
-  /// The sum of two sizes; throws std::bad_alloc where no vector can be that large.
+  /// Adds two sizes; throws std::bad_alloc if no vector can be that large.
   static ssize_t Sum(ssize_t a, ssize_t b) {
     if (b > kMaxSize - a)
       detail::AllocationFailed();
     return a + b;
   }
-  /// Appends the pn elements at p, which have been checked: the most frequent edit, inline where there is
-  /// room. Then they may also lie in this vector, even in its unused capacity: the storage stays, and memmove
-  /// takes ranges that overlap.
+  /// Appends the pn elements at p; the arguments have been checked. It is inline for the most frequent edit,
+  /// into storage with room. That storage stays, so the elements may lie in it, even in the unused capacity:
+  /// memmove takes ranges that overlap.
   void Append(const T* p, ssize_t pn) {
     const ssize_t oldSize = size();
     if (pn > capacity() - oldSize)
@@ -863,24 +868,25 @@ private:
   /// The element size in bytes.
   static constexpr ssize_t S = sizeof(T);
 
-  /// The only place where a number of elements that may be too large becomes one of bytes.
+  /// Converts a number of elements to bytes. No other place does so with a number that may be too large.
   static ssize_t Bytes(ssize_t count) {
     if (count > kMaxSize)
       detail::AllocationFailed();
     return count * S;
   }
-  /// And back. Without a sign it is a shift, and compilers see that it is never negative.
+  /// Converts bytes to elements. An unsigned division is a shift, and compilers see that it is never
+  /// negative.
   static ssize_t Elements(ssize_t bytes) { return ssize_t(static_cast<std::size_t>(bytes) / sizeof(T)); }
-  // Whatever inserts, assigns or replaces resizes a range of elements and overwrites it. Only push_back of
-  // one element is the buffer's own.
+  // Every insertion, assignment and replacement resizes a range of elements and overwrites it. Only push_back
+  // of one element is left to the buffer.
   T* ResizeRange(ssize_t i, ssize_t n, ssize_t newN);
   void ReplaceRange(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRange(ssize_t i, ssize_t n, ssize_t count, T x);
   void AppendRepeated(ssize_t count, const T* p, ssize_t pn);
 
-  /// The end of the part that a reverse search from offset goes through.
+  /// The end of the range that a reverse search from offset goes through.
   const T* After(ssize_t offset) const { return offset == npos ? end() : begin() + offset + 1; }
-  /// A search result as an index, where notFound is what the search returns for nothing.
+  /// Converts a search result to an index; notFound is the result of a search that finds nothing.
   ssize_t Index(const T* result, const T* notFound) const {
     if (result == notFound)
       return npos;
@@ -892,29 +898,29 @@ private:
   VectorOfByte m_buffer;
 };
 
-/// Goes from the last element to the first: designates the element before the pointer that it holds. It only
-/// steps; for more use std::reverse_iterator.
-/// @pre "p" of every dereference and step: only a null pointer is caught
+/// Goes from the last element to the first. It designates the element before the pointer that it holds, and
+/// only steps; for arithmetic use std::reverse_iterator.
+/// @pre "p" of every dereference and step; only a null pointer is detected
 ///
 /// @snippet examples/reference.cpp reverse iterators
 template <class T> class xvector<T>::const_reverse_iterator : public detail::ReversePointer {
 public:
-  typedef std::bidirectional_iterator_tag iterator_category; ///< It goes both ways.
+  typedef std::bidirectional_iterator_tag iterator_category; ///< It steps both ways.
   typedef T value_type;                                      ///< An element.
   typedef std::ptrdiff_t difference_type;                    ///< The distance of two iterators.
-  typedef const T* pointer;                                  ///< What -> gives.
-  typedef const T& reference;                                ///< What * gives.
+  typedef const T* pointer;                                  ///< The result of `->`.
+  typedef const T& reference;                                ///< The result of `*`.
 
   /// Designates the element before _p.
   explicit const_reverse_iterator(const T* _p) : p(_p) {}
-  /// The pointer held, one past the element designated.
+  /// Converts to the pointer held, one past the designated element.
   operator const T*() const { return p; }
-  /// The element designated.
+  /// The designated element.
   const T& operator*() const {
     MIREL_ASSERT(p);
     return p[-1];
   }
-  /// The address of the element designated.
+  /// The address of the designated element.
   const T* operator->() const {
     MIREL_ASSERT(p);
     return p - 1;
@@ -943,27 +949,29 @@ public:
     --*this;
     return old;
   }
-  bool operator==(const const_reverse_iterator& rhs) const { return p == rhs.p; } ///< Same place.
-  bool operator!=(const const_reverse_iterator& rhs) const { return p != rhs.p; } ///< Other place.
+  /// Returns whether both stand at the same place.
+  bool operator==(const const_reverse_iterator& rhs) const { return p == rhs.p; }
+  /// Returns whether the two stand at different places.
+  bool operator!=(const const_reverse_iterator& rhs) const { return p != rhs.p; }
 
 protected:
-  const T* p; ///< One past the element designated.
+  const T* p; ///< One past the designated element.
 };
 
-/// Goes from the last element to the first, which may be changed.
+/// Goes from the last element to the first, and allows changing them.
 /// @snippet examples/reference.cpp reverse iterators
 template <class T> class xvector<T>::reverse_iterator : public xvector<T>::const_reverse_iterator {
 public:
-  typedef T* pointer;   ///< What -> gives.
-  typedef T& reference; ///< What * gives.
+  typedef T* pointer;   ///< The result of `->`.
+  typedef T& reference; ///< The result of `*`.
 
   /// Designates the element before _p.
   explicit reverse_iterator(T* _p) : const_reverse_iterator(_p) {}
-  /// The pointer held, one past the element designated.
+  /// Converts to the pointer held, one past the designated element.
   operator T*() const { return const_cast<T*>(this->p); }
-  /// The element designated.
+  /// The designated element.
   T& operator*() const { return const_cast<T&>(const_reverse_iterator::operator*()); }
-  /// The address of the element designated.
+  /// The address of the designated element.
   T* operator->() const { return const_cast<T*>(const_reverse_iterator::operator->()); }
   /// Steps towards the first element.
   reverse_iterator& operator++() {
@@ -992,8 +1000,8 @@ public:
 /// Exchanges the contents of two vectors in constant time.
 template <class T> void swap(xvector<T>& a, xvector<T>& b) noexcept { a.swap(b); }
 
-/// Makes room for newN elements in the place of the n at index i, and returns it; the caller overwrites it
-/// all.
+/// Changes the size of the range of n elements at index i to newN, and returns its beginning. The caller
+/// overwrites the whole range.
 ///
 ///     |  before  |      n      |      behind      |
 ///     |  before  |         newN         |      behind      |
@@ -1007,7 +1015,7 @@ template <class T> T* xvector<T>::ResizeRange(ssize_t i, ssize_t n, ssize_t newN
   return begin() + i;
 }
 
-/// Puts the pn elements at p in the place of the n at index i. The arguments have been checked.
+/// Replaces the n elements at index i by the pn at p. The arguments have been checked.
 template <class T> void xvector<T>::ReplaceRange(ssize_t i, ssize_t n, const T* p, ssize_t pn) {
   if (m_buffer.owns(p)) {
     xvector<T> copy;
@@ -1018,7 +1026,8 @@ template <class T> void xvector<T>::ReplaceRange(ssize_t i, ssize_t n, const T* 
   p_copy(range, p, p + pn);
 }
 
-/// Puts count elements of value x in the place of the n at index i. x comes by value: it may be one of them.
+/// Replaces the n elements at index i by count elements of value x, which is passed by value, since it may be
+/// one of them.
 template <class T> void xvector<T>::FillRange(ssize_t i, ssize_t n, ssize_t count, T x) {
   T* const range = ResizeRange(i, n, count);
   p_create(range, range + count, x);
@@ -1051,7 +1060,7 @@ template <class T> void xvector<T>::AppendRepeated(ssize_t count, const T* p, ss
 }
 
 template <class T> ssize_t xvector<T>::FindAndErase(const T& x) {
-  const T value = x; // x may be an element that is overwritten on the way
+  const T value = x; // x may be an element that the loop overwrites
   const ssize_t first = find(value);
   if (first == npos)
     return 0;
