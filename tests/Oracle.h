@@ -7,7 +7,7 @@
 #include <type_traits>
 #include <vector>
 
-#include "../utils/src/KernelTable.h"
+#include "../utils/src/Conversion.h"
 #include "Support.h"
 
 namespace oracle {
@@ -121,8 +121,13 @@ template <class CharOut, class CharIn, class F> void ForEachWay(const F& f) {
   int k = 0;
   do {
     kernels = mirel::detail::KernelsAt(k++);
-    f([=](auto&... arguments) { return mirel::detail::UtfToUtf(kernels, arguments...); },
-      kernels != nullptr ? kernels->name : "scalar");
+    f(
+        [=](auto& dst, auto* p, ssize_t n) {
+          dst.clear();
+          return mirel::detail::AppendUtf(kernels, dst, p, p + n, mirel::OnMalformed::kStop).malformed ==
+                 nullptr;
+        },
+        kernels != nullptr ? kernels->name : "scalar");
   } while (kernels != nullptr);
 #endif
 }

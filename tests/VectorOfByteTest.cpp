@@ -102,10 +102,7 @@ template <class T> std::vector<Way<T>> Ways() {
 #ifndef MIREL_SHARED // a shared library hides its kernels
   ways.push_back({"scalar", ScalarSearches<T>()});
   for (int k = 0; const Kernels* const kernels = KernelsAt(k); ++k)
-    if constexpr (sizeof(T) == 1)
-      ways.push_back({kernels->name, kernels->search8});
-    else
-      ways.push_back({kernels->name, kernels->search16});
+    ways.push_back({kernels->name, static_cast<const UnitKernels<T>*>(kernels)->searches});
 #endif
   return ways;
 }

@@ -30,4 +30,10 @@ struct MalformedText {
   MalformedReason reason; ///< What is wrong with it.
 };
 
+/// What a conversion in pieces does with malformed text.
+enum class OnMalformed {
+  kStop,   ///< Stops at the first malformed sequence and converts nothing from there on.
+  kReplace ///< Replaces each maximal subpart by U+FFFD.
+};
+
 } // namespace mirel

@@ -11,12 +11,6 @@
 
 namespace mirel {
 
-/// What a conversion in pieces does with malformed text.
-enum class OnMalformed {
-  kStop,   ///< Stops at the first malformed sequence and converts nothing from there on.
-  kReplace ///< Replaces each maximal subpart by U+FFFD.
-};
-
 /// Converts text that arrives in pieces; use it as Utf8Stream or Utf16Stream. However the text is cut, the
 /// result is that of the whole text.
 /// @snippet examples/reference.cpp streams

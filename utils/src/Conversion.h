@@ -6,7 +6,7 @@
 #include <cstring>
 
 #include <utils/CodePoints.h>
-#include <utils/UtfStream.h>
+#include <utils/Malformed.h>
 
 #include "KernelTable.h"
 
@@ -49,12 +49,6 @@ inline const char8* SkipAscii(const char8* p, const char8* end) {
   return p;
 }
 inline const char16* SkipAscii(const char16* p, const char16*) { return p; }
-
-/// The kernels for a width.
-inline const TextKernels<char8>& TextKernelsOf(const Kernels& kernels, const char8*) { return kernels.text8; }
-inline const TextKernels<char16>& TextKernelsOf(const Kernels& kernels, const char16*) {
-  return kernels.text16;
-}
 
 /// Shorter texts are decoded one code point at a time in the time that a kernel takes to copy them into a
 /// block.

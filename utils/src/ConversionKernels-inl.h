@@ -172,13 +172,14 @@ struct Replaced {
 /// - kUnits: how many units of the source it has,
 /// - kMost: the most units that its Convert() writes from out on, with those that are no part of the result.
 ///   Before out it writes again only what the block's first units gave.
-template <class Out, class In> struct Conversion {
+template <class In> struct Conversion {
+  using Out = OtherUnit<In>;
   const In* p;
   const In* end;
   Out* out;
   Out* outEnd;
 
-  HWY_INLINE Progress<Out, In> At(Stop stop) const { return {p, out, stop}; }
+  HWY_INLINE Progress<In> At(Stop stop) const { return {p, out, stop}; }
 
   /// Converts the units of a block from the from-th, where p is, to before the to-th. What is before them is
   /// converted already. kEnd: go on at p, which is before the to-th where the block's end cuts a code point
@@ -451,15 +452,15 @@ template <int kVectors, class D> struct Utf8Block {
   }
 };
 
-Progress<char16, char8> ReplaceUtf8(const char8* p, const char8* end, char16* out, char16* outEnd,
-                                    ssize_t& replacements) {
-  Conversion<char16, char8> text{p, end, out, outEnd};
+Progress<char8> ReplaceUtf8(const char8* p, const char8* end, char16* out, char16* outEnd,
+                            ssize_t& replacements) {
+  Conversion<char8> text{p, end, out, outEnd};
   text.Replace<Utf8Block<64 / kLanes<Wide>, Wide>>(replacements);
   return text.At(Stop::kMalformed);
 }
 
-Progress<char16, char8> Utf16FromUtf8(const char8* p, const char8* end, char16* out, char16* outEnd) {
-  Conversion<char16, char8> text{p, end, out, outEnd};
+Progress<char8> Utf16FromUtf8(const char8* p, const char8* end, char16* out, char16* outEnd) {
+  Conversion<char8> text{p, end, out, outEnd};
   if (end - p >= 64)
     return text.At(text.ConvertAll<Utf8Block<64 / kLanes<Wide>, Wide>>());
   if (end - p >= 32)
@@ -635,15 +636,15 @@ template <class Tag> struct Utf16Block {
   }
 };
 
-Progress<char8, char16> ReplaceUtf16(const char16* p, const char16* end, char8* out, char8* outEnd,
-                                     ssize_t& replacements) {
-  Conversion<char8, char16> text{p, end, out, outEnd};
+Progress<char16> ReplaceUtf16(const char16* p, const char16* end, char8* out, char8* outEnd,
+                              ssize_t& replacements) {
+  Conversion<char16> text{p, end, out, outEnd};
   text.Replace<Utf16Block<Wide>>(replacements);
   return text.At(Stop::kMalformed);
 }
 
-Progress<char8, char16> Utf8FromUtf16(const char16* p, const char16* end, char8* out, char8* outEnd) {
-  Conversion<char8, char16> text{p, end, out, outEnd};
+Progress<char16> Utf8FromUtf16(const char16* p, const char16* end, char8* out, char8* outEnd) {
+  Conversion<char16> text{p, end, out, outEnd};
   if (end - p >= kLanes<Wide>)
     return text.At(text.ConvertAll<Utf16Block<Wide>>());
   if (end - p >= kLanes<Narrow>)

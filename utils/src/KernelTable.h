@@ -6,7 +6,7 @@
 
 #pragma once
 
-#include <utils/xstring.h>
+#include <utils/VectorOfByte.h>
 
 namespace mirel::detail {
 
@@ -17,10 +17,12 @@ enum class Stop {
   kNoRoom     ///< what follows may not fit in the destination
 };
 
+template <class T> using OtherUnit = std::conditional_t<sizeof(T) == 1, char16, char8>;
+
 /// How far a conversion got.
-template <class CharOut, class CharIn> struct Progress {
-  const CharIn* p; ///< the first unit that isn't converted, where a code point begins
-  CharOut* out;    ///< past the end of the result
+template <class T> struct Progress {
+  const T* p;        ///< the first unit that isn't converted, where a code point begins
+  OtherUnit<T>* out; ///< past the end of the result
   Stop stop;
 };
 
@@ -36,31 +38,28 @@ template <class T> struct Measured {
   Lengths lengths;
 };
 
-/// What looks at a text. Both go on up to a place, where a sequence begins, before which the text is
-/// well-formed, and which is the end or not far before malformed text.
-template <class T> struct TextKernels {
+/// What one instruction set offers for text of one width. The conversions read nothing outside [p, end) and
+/// write nothing outside [out, outEnd), but may write more of it than they report.
+template <class T> struct UnitKernels {
+  using Out = OtherUnit<T>;
+  Progress<T> (*convert)(const T* p, const T* end, Out* out, Out* outEnd);
+  /// Goes on from malformed text by blocks, with U+FFFD for each maximal subpart, and adds how many there
+  /// were. It stops before a well-formed block, and where text or room is short of a block, which may be at
+  /// once.
+  Progress<T> (*replace)(const T* p, const T* end, Out* out, Out* outEnd, ssize_t& replacements);
+  /// Goes on up to a place, where a sequence begins, before which the text is well-formed, and which is the
+  /// end or not far before malformed text.
   const T* (*skip)(const T* p, const T* end);
+  /// Goes on as far, and measures.
   Measured<T> (*measure)(const T* p, const T* end);
+  SearchKernels<T> searches;
 };
 
-/// What one instruction set offers. The conversions read nothing outside [p, end) and write nothing outside
-/// [out, outEnd), but may write more of it than they report.
-struct Kernels {
+/// What one instruction set offers.
+struct Kernels : UnitKernels<char8>, UnitKernels<char16> {
   const char* name;
-  Progress<char16, char8> (*utf16FromUtf8)(const char8* p, const char8* end, char16* out, char16* outEnd);
-  Progress<char8, char16> (*utf8FromUtf16)(const char16* p, const char16* end, char8* out, char8* outEnd);
-  /// Go on from malformed text by blocks, with U+FFFD for each maximal subpart, and add how many there were.
-  /// They stop before a well-formed block, and where text or room is short of a block, which may be at once.
-  Progress<char16, char8> (*replaceUtf8)(const char8* p, const char8* end, char16* out, char16* outEnd,
-                                         ssize_t& replacements);
-  Progress<char8, char16> (*replaceUtf16)(const char16* p, const char16* end, char8* out, char8* outEnd,
-                                          ssize_t& replacements);
   /// As Utf16FromAscii(), for the first of n units; how many they are. It leaves less than a vector.
   ssize_t (*utf16FromAscii)(const char8* src, ssize_t n, char16* out);
-  TextKernels<char8> text8;
-  TextKernels<char16> text16;
-  SearchKernels<char8> search8;
-  SearchKernels<char16> search16;
 };
 
 // The tables of the conversions, once for all instruction sets. They are defined in a file of their own: g++
@@ -106,9 +105,5 @@ inline const Kernels* BestKernels() { return KernelsAt(0); }
 
 /// The scalar path of the searches.
 template <class T> const SearchKernels<T>& ScalarSearches();
-
-/// UtfToUtf() by the given kernels, and without any if they are null.
-template <class CharOut, class CharIn>
-bool UtfToUtf(const Kernels* kernels, basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen);
 
 } // namespace mirel::detail

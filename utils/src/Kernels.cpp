@@ -30,16 +30,10 @@ namespace mirel::detail::HWY_NAMESPACE {
 namespace {
 
 constexpr Kernels kKernels = {
+    {Utf16FromUtf8, ReplaceUtf8, SkipUtf8, MeasureUtf8, kSearchKernels<char8>},
+    {Utf8FromUtf16, ReplaceUtf16, SkipUtf16, MeasureUtf16, kSearchKernels<char16>},
     &HWY_STR(HWY_NAMESPACE)[2], // without "N_"
-    Utf16FromUtf8,
-    Utf8FromUtf16,
-    ReplaceUtf8,
-    ReplaceUtf16,
     Utf16FromAscii,
-    {SkipUtf8, MeasureUtf8},
-    {SkipUtf16, MeasureUtf16},
-    kSearchKernels<char8>,
-    kSearchKernels<char16>,
 };
 
 } // namespace
@@ -80,14 +74,12 @@ const char* KernelName() {
   return kernels != nullptr ? kernels->name : "none";
 }
 
-const detail::SearchKernels<char8>& detail::BestSearches(const char8*) {
-  const Kernels* const kernels = BestKernels();
-  return kernels != nullptr ? kernels->search8 : ScalarSearches<char8>();
+template <class T> static const detail::SearchKernels<T>& Searches() {
+  const detail::UnitKernels<T>* const kernels = detail::BestKernels();
+  return kernels != nullptr ? kernels->searches : detail::ScalarSearches<T>();
 }
-const detail::SearchKernels<char16>& detail::BestSearches(const char16*) {
-  const Kernels* const kernels = BestKernels();
-  return kernels != nullptr ? kernels->search16 : ScalarSearches<char16>();
-}
+const detail::SearchKernels<char8>& detail::BestSearches(const char8*) { return Searches<char8>(); }
+const detail::SearchKernels<char16>& detail::BestSearches(const char16*) { return Searches<char16>(); }
 
 } // namespace mirel
 

@@ -13,12 +13,11 @@ namespace {
 /// Adds the lengths of the sequences from p on, one by one: to the end, or, where there are kernels, until
 /// the text seems to be well-formed. @return where it stopped
 template <class T> const T* MeasureScalar(const T* p, const T* end, bool hasKernels, Lengths& lengths) {
-  using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
   for (const T* malformed = p; p != end && !(hasKernels && p - malformed >= kWellFormedBeforeKernels);) {
     const Sequence sequence = Decode(p, end);
     p += sequence.length;
     ++lengths.codePoints;
-    lengths.units += EncodedLength<Other>(sequence.codePoint);
+    lengths.units += EncodedLength<OtherUnit<T>>(sequence.codePoint);
     if (!sequence.isWellFormed)
       malformed = p;
   }
@@ -28,11 +27,12 @@ template <class T> const T* MeasureScalar(const T* p, const T* end, bool hasKern
 } // namespace
 
 template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* end) {
+  const UnitKernels<T>* const k = kernels;
   Lengths lengths{0, 0};
   while (p != end) {
-    const bool hasKernels = kernels != nullptr && end - p >= kLeastForKernels;
+    const bool hasKernels = k != nullptr && end - p >= kLeastForKernels;
     if (hasKernels) {
-      const Measured<T> measured = TextKernelsOf(*kernels, p).measure(p, end);
+      const Measured<T> measured = k->measure(p, end);
       lengths.codePoints += measured.lengths.codePoints;
       lengths.units += measured.lengths.units;
       p = measured.p;

@@ -56,10 +56,8 @@ ssize_t CutOffAtEnd(const char8* begin, const char8* end) {
 ssize_t CutOffAtEnd(const char16*, const char16* end) { return IsHighSurrogate(end[-1]) ? 1 : 0; }
 
 template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end) {
-  if (kernels != nullptr && end - p >= kLeastForKernels)
-    p = TextKernelsOf(*kernels, p).skip(p, end);
-  else
-    p = SkipAscii(p, end);
+  const UnitKernels<T>* const k = kernels;
+  p = k != nullptr && end - p >= kLeastForKernels ? k->skip(p, end) : SkipAscii(p, end);
   while (p != end) {
     const Sequence sequence = Decode(p, end);
     if (!sequence.isWellFormed)

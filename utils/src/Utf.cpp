@@ -44,61 +44,40 @@ namespace detail {
 
 namespace {
 
-/// Converts one code point at a time, and judges what is well-formed. Inlined, it would
-/// keep Convert() from being inlined itself: 14 units take 1.5 times as long.
+/// Converts one code point at a time, and judges what is well-formed. It isn't inlined: 14 units that the
+/// kernels convert would take 1.5 times as long.
 template <class CharOut, class CharIn>
-[[gnu::noinline]] Progress<CharOut, CharIn> ConvertScalar(const CharIn* src, const CharIn* srcEnd,
-                                                          CharOut* out, const CharOut* outEnd) {
+[[gnu::noinline]] Progress<CharIn> ConvertScalar(const CharIn* src, const CharIn* srcEnd, CharOut* out,
+                                                 const CharOut* outEnd) {
   // As unsigned units: with char the traits would convert negative values without saying so.
   using Unsigned = std::make_unsigned_t<CharIn>;
   using Encoding = utf::utf_traits<CharOut>;
   const Unsigned* p = reinterpret_cast<const Unsigned*>(src);
   const Unsigned* const end = reinterpret_cast<const Unsigned*>(srcEnd);
-  const auto stop = [&](Stop why) {
-    return Progress<CharOut, CharIn>{reinterpret_cast<const CharIn*>(p), out, why};
-  };
+  Stop stop = Stop::kEnd;
   while (p != end) {
     const Unsigned* next = p;
     const utf::code_point c =
         *p < 0x80 ? utf::code_point{*next++} : utf::utf_traits<Unsigned>::decode(next, end);
-    if (c == utf::illegal || c == utf::incomplete)
-      return stop(Stop::kMalformed);
-    if (outEnd - out < Encoding::width(c))
-      return stop(Stop::kNoRoom);
+    const bool isMalformed = c == utf::illegal || c == utf::incomplete;
+    if (isMalformed || outEnd - out < Encoding::width(c)) {
+      stop = isMalformed ? Stop::kMalformed : Stop::kNoRoom;
+      break;
+    }
     out = Encoding::encode(c, out);
     p = next;
   }
-  return stop(Stop::kEnd);
-}
-
-/// Converts as far as there is room for the result, or up to malformed text.
-template <class CharOut, class CharIn>
-Progress<CharOut, CharIn> Convert(const Kernels* k, const CharIn* p, const CharIn* end, CharOut* out,
-                                  CharOut* outEnd) {
-  Progress<CharOut, CharIn> progress{p, out, Stop::kMalformed};
-  if (k != nullptr) {
-    if constexpr (sizeof(CharIn) == 1)
-      progress = k->utf16FromUtf8(p, end, out, outEnd);
-    else
-      progress = k->utf8FromUtf16(p, end, out, outEnd);
-  }
-  return progress.stop == Stop::kMalformed ? ConvertScalar(progress.p, end, progress.out, outEnd) : progress;
+  return {reinterpret_cast<const CharIn*>(p), out, stop};
 }
 
 /// Converts from malformed text on, and replaces what is malformed, until the text seems to be well-formed:
 /// by blocks, and one code point at a time where there isn't text or room for one.
 template <class CharOut, class CharIn>
-Progress<CharOut, CharIn> Replace(const Kernels* k, const CharIn* p, const CharIn* end, CharOut* out,
-                                  CharOut* outEnd, ssize_t& replacements) {
-  if (k != nullptr) {
-    Progress<CharOut, CharIn> progress{p, out, Stop::kMalformed};
-    if constexpr (sizeof(CharIn) == 1)
-      progress = k->replaceUtf8(p, end, out, outEnd, replacements);
-    else
-      progress = k->replaceUtf16(p, end, out, outEnd, replacements);
-    if (progress.p != p)
-      return progress;
-  }
+Progress<CharIn> Replace(const UnitKernels<CharIn>* kernels, const CharIn* p, const CharIn* end, CharOut* out,
+                         CharOut* outEnd, ssize_t& replacements) {
+  if (kernels != nullptr)
+    if (const auto blocks = kernels->replace(p, end, out, outEnd, replacements); blocks.p != p)
+      return blocks;
   for (const CharIn* malformed = p; p != end && p - malformed < kWellFormedBeforeKernels;) {
     const Sequence sequence = Decode(p, end);
     if (outEnd - out < EncodedLength<CharOut>(sequence.codePoint))
@@ -161,21 +140,26 @@ private:
 template <class CharOut, class CharIn>
 Appended<CharIn> AppendUtf(const Kernels* kernels, basic_xstring<CharOut>& dst, const CharIn* src,
                            const CharIn* end, OnMalformed onMalformed) {
+  const UnitKernels<CharIn>* const k = kernels;
   Appended<CharIn> result{nullptr, 0};
   Destination<CharOut> destination(dst, end - src);
   for (const CharIn* p = src;;) {
-    auto progress = Convert(kernels, p, end, destination.Out(), destination.OutEnd());
-    if (progress.stop == Stop::kMalformed) {
+    Progress<CharIn> at{p, destination.Out(), Stop::kMalformed};
+    if (k != nullptr)
+      at = k->convert(p, end, at.out, destination.OutEnd());
+    if (at.stop == Stop::kMalformed)
+      at = ConvertScalar(at.p, end, at.out, destination.OutEnd());
+    if (at.stop == Stop::kMalformed) {
       if (result.malformed == nullptr)
-        result.malformed = progress.p;
+        result.malformed = at.p;
       if (onMalformed == OnMalformed::kReplace)
-        progress = Replace(kernels, progress.p, end, progress.out, destination.OutEnd(), result.replacements);
+        at = Replace(k, at.p, end, at.out, destination.OutEnd(), result.replacements);
     }
-    p = progress.p;
-    destination.SetEnd(progress.out);
-    if (progress.stop == Stop::kNoRoom) {
+    p = at.p;
+    destination.SetEnd(at.out);
+    if (at.stop == Stop::kNoRoom) {
       destination.GrowFor(end - p);
-    } else if (progress.stop == Stop::kEnd || onMalformed == OnMalformed::kStop) {
+    } else if (at.stop == Stop::kEnd || onMalformed == OnMalformed::kStop) {
       destination.Finish();
       return result;
     }
@@ -187,20 +171,10 @@ template Appended<char8> AppendUtf(const Kernels* kernels, string16& dst, const 
 template Appended<char16> AppendUtf(const Kernels* kernels, string8& dst, const char16* src,
                                     const char16* end, OnMalformed onMalformed);
 
-template <class CharOut, class CharIn>
-bool UtfToUtf(const Kernels* kernels, basic_xstring<CharOut>& result, const CharIn* src, ssize_t srcLen) {
-  result.clear();
-  return AppendUtf(kernels, result, src, src + srcLen, OnMalformed::kStop).malformed == nullptr;
-}
-
-template bool UtfToUtf(const Kernels* kernels, string16& result, const char8* src, ssize_t srcLen);
-template bool UtfToUtf(const Kernels* kernels, string8& result, const char16* src, ssize_t srcLen);
-
 namespace {
 
 template <class CharOut, class CharIn>
 bool AppendStrict(basic_xstring<CharOut>& dst, const CharIn* p, ssize_t pn) {
-  MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
   return AppendUtf(BestKernels(), dst, p, p + pn, OnMalformed::kStop).malformed == nullptr;
 }
 
@@ -217,12 +191,16 @@ ssize_t ConvertLossy(basic_xstring<CharOut>& dst, const CharIn* p, ssize_t pn) {
 
 template <> bool UtfToUtf<char16, char8>(string16& result, const char8* src, ssize_t srcLen) {
   MIREL_ASSERT(srcLen >= 0);
-  return detail::UtfToUtf(detail::BestKernels(), result, src, srcLen);
+  result.clear();
+  return detail::AppendUtf(detail::BestKernels(), result, src, src + srcLen, OnMalformed::kStop).malformed ==
+         nullptr;
 }
 
 template <> bool UtfToUtf<char8, char16>(string8& result, const char16* src, ssize_t srcLen) {
   MIREL_ASSERT(srcLen >= 0);
-  return detail::UtfToUtf(detail::BestKernels(), result, src, srcLen);
+  result.clear();
+  return detail::AppendUtf(detail::BestKernels(), result, src, src + srcLen, OnMalformed::kStop).malformed ==
+         nullptr;
 }
 
 bool Utf16FromUtf8(string16& dst, const char8* src, ssize_t srcLen) {
@@ -243,26 +221,33 @@ bool Utf8FromUtf16(string8& dst, const char16* src) {
   return UtfToUtf<char8, char16>(dst, src, GetStringLength(src));
 }
 
+// Its units are of another type, which the conversion may not read: they are copied part by part.
 bool Utf8FromUtf16(string8& dst, std::u16string_view text) {
   const ssize_t oldCapacity = dst.capacity();
   dst.clear();
-  Utf16Stream stream;
   bool isWellFormed = true;
-  char16 block[1024];
   while (!text.empty() && isWellFormed) {
-    const std::u16string_view part = text.substr(0, std::size(block));
-    std::memcpy(block, part.data(), part.size() * sizeof(char16));
-    isWellFormed = stream.Append(dst, block, static_cast<ssize_t>(part.size()));
-    text.remove_prefix(part.size());
+    char16 part[1024];
+    const std::size_t n = std::min(text.size(), std::size(part));
+    std::memcpy(part, text.data(), n * sizeof(char16));
+    // A pair that the part's end would cut off is left to the next one.
+    const ssize_t cutOff = n < text.size() ? detail::CutOffAtEnd(part, part + n) : 0;
+    isWellFormed = detail::AppendStrict(dst, part, static_cast<ssize_t>(n) - cutOff);
+    text.remove_prefix(n - static_cast<std::size_t>(cutOff));
   }
-  isWellFormed = stream.Finish(dst);
   detail::Storage::GiveBack(dst, std::max(oldCapacity, dst.size() + 1));
   return isWellFormed;
 }
 
-bool AppendUtf16(string16& dst, const char8* p, ssize_t pn) { return detail::AppendStrict(dst, p, pn); }
+bool AppendUtf16(string16& dst, const char8* p, ssize_t pn) {
+  MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
+  return detail::AppendStrict(dst, p, pn);
+}
 
-bool AppendUtf8(string8& dst, const char16* p, ssize_t pn) { return detail::AppendStrict(dst, p, pn); }
+bool AppendUtf8(string8& dst, const char16* p, ssize_t pn) {
+  MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
+  return detail::AppendStrict(dst, p, pn);
+}
 
 ssize_t Utf16FromUtf8Lossy(string16& dst, const char8* p, ssize_t pn) {
   return detail::ConvertLossy(dst, p, pn);
