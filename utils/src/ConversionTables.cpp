@@ -6,31 +6,18 @@ namespace mirel::detail {
 
 namespace {
 
-/// Shuffles of positions of kBytes bytes. keeps says of each byte of a position whether it is kept, by the
-/// mask shifted so that the position's bit is the lowest.
-template <std::size_t kBytes, class F> constexpr Shuffles MakeShuffles(const F& keeps) {
-  Shuffles shuffles{};
-  for (unsigned mask = 0; mask < 256; ++mask)
-    for (std::size_t k = 0, n = 0; k < 16; ++k)
-      if (keeps(mask >> k / kBytes, k % kBytes))
-        shuffles.rows[mask][n++] = static_cast<uint8_t>(k);
-  return shuffles;
-}
-
-constexpr Shuffles MakeReplacingShuffles() {
+/// Shuffles to which addBytes(mask, k, add) adds what takes the place of byte k: add() adds a byte where the
+/// lowest bit of its second argument is set.
+template <class F> constexpr Shuffles MakeShuffles(const F& addBytes) {
   Shuffles shuffles{};
   for (unsigned mask = 0; mask < 256; ++mask) {
     std::size_t n = 0;
-    const auto add = [&](unsigned from) {
-      if (n < 16)
+    const auto add = [&](unsigned from, unsigned bits) {
+      if ((bits & 1) != 0 && n < 16)
         shuffles.rows[mask][n++] = static_cast<uint8_t>(from);
     };
-    for (unsigned k = 0; k < 8; ++k) {
-      const bool isReplaced = (mask >> k & 1) != 0;
-      add(isReplaced ? 8 : k);
-      if (isReplaced)
-        add(9), add(10);
-    }
+    for (unsigned k = 0; k < 16; ++k)
+      addBytes(mask, k, add);
   }
   return shuffles;
 }
@@ -75,13 +62,18 @@ constexpr Repeats MakeRepeats() {
 
 } // namespace
 
-constexpr Shuffles kKeepUnits = MakeShuffles<2>([](unsigned bits, std::size_t) { return (bits & 1) != 0; });
+constexpr Shuffles kKeepUnits =
+    MakeShuffles([](unsigned mask, unsigned k, auto add) { add(k, mask >> k / 2); });
 constexpr Shuffles kKeepTwoBytes =
-    MakeShuffles<2>([](unsigned bits, std::size_t byte) { return byte == 0 || (bits & 1) != 0; });
-constexpr Shuffles kKeepThreeBytes = MakeShuffles<4>([](unsigned bits, std::size_t byte) {
-  return byte == 0 || (byte == 2 && (bits & 0x10) != 0) || (byte == 3 && (bits & 1) != 0);
+    MakeShuffles([](unsigned mask, unsigned k, auto add) { add(k, k % 2 == 0 ? 1 : mask >> k / 2); });
+constexpr Shuffles kKeepThreeBytes = MakeShuffles([](unsigned mask, unsigned k, auto add) {
+  const unsigned kept[] = {1, 0, mask >> k / 4 >> 4, mask >> k / 4};
+  add(k, kept[k % 4]);
 });
-constexpr Shuffles kReplaceUnits = MakeReplacingShuffles();
+constexpr Shuffles kReplaceUnits = MakeShuffles([](unsigned mask, unsigned k, auto add) {
+  for (const unsigned from : {k, 8u, 9u, 10u})
+    add(from, k < 8 && (mask >> k & 1) == (from != k));
+});
 constexpr PairFaults kPairFaults = MakePairFaults();
 constexpr Repeats kRepeats = MakeRepeats();
 
