@@ -91,14 +91,16 @@ template <int k, class D> HWY_INLINE hn::Vec<Narrow> SixteenBytes(D, hn::Vec<D> 
     return hn::UpperHalf(hn::Half<D>(), v);
 }
 
-/// The vector's bytes from the n-th on, and zeros behind them.
-template <int n, class D> HWY_INLINE hn::Vec<D> Shifted(D d, hn::Vec<D> v) {
+/// The bytes from the n-th on of a vector and the one behind it.
+template <int n, class D> HWY_INLINE hn::Vec<D> Window(D d, hn::Vec<D> v, hn::Vec<D> next) {
   if constexpr (n == 0)
     return v;
   else if constexpr (kLanes<D> == 16)
-    return hn::ShiftRightBytes<n>(d, v);
+    return hn::CombineShiftRightBytes<n>(d, next, v);
+  else if constexpr (n < 16)
+    return hn::CombineShiftRightBytes<n>(d, hn::ConcatLowerUpper(d, next, v), v);
   else
-    return hn::CombineShiftRightBytes<n>(d, hn::ConcatUpperUpper(d, hn::Zero(d), v), v);
+    return hn::CombineShiftRightBytes<n - 16>(d, next, hn::ConcatLowerUpper(d, next, v));
 }
 
 template <class Unit> HWY_INLINE const uint8_t* BytesOf(const Unit* p) {
@@ -279,6 +281,14 @@ template <class D> HWY_INLINE void StoreWidened(D d, hn::Vec<D> bytes, uint8_t* 
   hn::StoreU(hn::BitCast(d, hn::PromoteTo(du, hn::UpperHalf(hn::Half<D>(), bytes))), d, out + kLanes<D>);
 }
 
+/// How many bytes an end cuts off from their sequence, of at least three. Where the next block begins is
+/// known by these bytes alone, long before the masks are.
+HWY_INLINE ssize_t CutOff(const uint8_t* end) {
+  const uint32_t isLead =
+      uint32_t{end[-1] >= 0xC0} | uint32_t{end[-2] >= 0xE0} << 1 | uint32_t{end[-3] >= 0xF0} << 2;
+  return static_cast<ssize_t>((hwy::Num0BitsBelowLS1Bit_Nonzero32(isLead | 8) + 1) % 4);
+}
+
 /// A block of kVectors vectors of UTF-8.
 template <int kVectors, class D> struct Utf8Block {
   static constexpr ssize_t kUnits = kVectors * kLanes<D>;
@@ -294,7 +304,8 @@ template <int kVectors, class D> struct Utf8Block {
 
   /// The vector that begins at the n-th byte of the k-th one; the bytes behind the block are zeros.
   template <int n> HWY_INLINE hn::Vec<D> Get(int k) const {
-    return k + 1 < kVectors ? hn::LoadU(D(), p + k * kLanes<D> + n) : Shifted<n>(D(), lastVector);
+    return k + 1 < kVectors ? hn::LoadU(D(), p + k * kLanes<D> + n)
+                            : Window<n>(D(), lastVector, hn::Zero(D()));
   }
   /// A bit for each position, of the masks that f gives for the vectors and those one byte further on.
   template <class F> HWY_INLINE uint64_t Bits(const F& f) const {
@@ -332,14 +343,6 @@ template <int kVectors, class D> struct Utf8Block {
       const auto swap4 = hn::IfThenElseZero(IsFrom80Below(d, next, 0x90), Repeat(d, 0x04));
       return hn::Or(bad, hn::Or(IsEqual(d, hn::Xor(lead, swap4), 0xF4), IsAtLeast(d, lead, 0xF5)));
     });
-  }
-
-  /// How many bytes the block's end cuts off from their sequence. Where the next block begins is known by
-  /// these bytes alone, long before the masks are.
-  HWY_INLINE ssize_t CutOff() const {
-    const uint32_t isLead = uint32_t{p[kUnits - 1] >= 0xC0} | uint32_t{p[kUnits - 2] >= 0xE0} << 1 |
-                            uint32_t{p[kUnits - 3] >= 0xF0} << 2;
-    return static_cast<ssize_t>((hwy::Num0BitsBelowLS1Bit_Nonzero32(isLead | 8) + 1) % 4);
   }
 
   /// Stores the units of the positions whose bits are set, U+FFFD for those that are malformed; their number.
@@ -383,7 +386,7 @@ template <int kVectors, class D> struct Utf8Block {
         StoreWidened(D(), Get<0>(k), out - 2 * from + 2 * k * kLanes<D>);
       return {to - from, to - from};
     }
-    const ssize_t stop = to == kUnits ? kUnits - CutOff() : to;
+    const ssize_t stop = to == kUnits ? kUnits - CutOff(p + kUnits) : to;
     // A lead byte that is cut off is checked as well: it may stand where a continuation byte is missing.
     const uint64_t checked = FirstBits(stop + 1) & ~FirstBits(from), positions = checked & FirstBits(stop);
     const uint64_t continuations = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC2); });
@@ -431,7 +434,7 @@ template <int kVectors, class D> struct Utf8Block {
       StoreLoneBytes(out);
       return {{kUnits, kUnits}, Count(allNonAscii)};
     }
-    const ssize_t stop = kUnits - CutOff();
+    const ssize_t stop = kUnits - CutOff(p + kUnits);
     const uint64_t continuations = allContinuations & FirstBits(stop);
     const uint64_t nonAscii = allNonAscii & FirstBits(stop), highest2 = nonAscii & ~continuations;
     // The lead bytes that may stand before the byte behind them, if that is a continuation byte.
@@ -542,7 +545,7 @@ template <class Tag> struct Utf16Block {
       const auto second = hn::Or(Left<4>(d, upper, 0x30), Right<2>(d, low, 0x0F));
       middle = Select(isHigh, hn::Or(second, marker), middle);
       const auto third =
-          hn::Or(Left<4>(d, low, 0x30), hn::And(Shifted<1>(d, UpperBits(0x0F)), Repeat(d, 0x0F)));
+          hn::Or(Left<4>(d, low, 0x30), hn::And(Window<1>(d, UpperBits(0x0F), hn::Zero(d)), Repeat(d, 0x0F)));
       last = Select(isHigh, hn::Or(third, marker), last);
     }
     // Four bytes for each unit: first, first, middle, last. The masks of even and of odd groups of four units
