@@ -280,7 +280,7 @@ def main():
 
     lines = ["# Benchmarks", "",
              "Each number is a peer's time divided by ours on the same data in the same run: above 1 we are ahead.",
-             f"First what matters most, with {names[0]}: the best peer is whoever comes closest to us or is ahead.", "",
+             f"First the main results, with {names[0]}: the best peer is the one with the lowest ratio.", "",
              *table(["what we do", "of what", "best peer", "its time / ours"], ["---", "---", "---", "--:"],
                     glance(first)),
              "A ratio for several texts is their geometric mean. Units are code units: bytes of UTF-8, or 16-bit units",
@@ -306,7 +306,7 @@ def main():
         if heading not in areas:
             lines += [f"## {heading}", "", text, ""]
     lines += ["## All benchmarks", "",
-              f"A cell has the ratios of {' / '.join(names)}; – was not measured. The spread is half the",
+              f"A cell has the ratios of {' / '.join(names)}; – stands for not measured. The spread is half the",
               "interquartile range of the ratios of single repetitions, relative to their median: the median of the row.", ""]
     for area in sorted(areas):
         lines += [f"### {area}", "", *([notes[area], ""] if area in notes else []), *long_table(runs, area)]
