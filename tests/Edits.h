@@ -176,16 +176,16 @@ public:
 #undef SEARCH
     ASSERT_EQ(v.contains(r.begin(), r.end(), forward), text.compare(uf, needle.size(), needle) == 0);
     ASSERT_EQ(Std(v.substr(forward, kNpos)), text.substr(uf));
-    const auto other = std::basic_string<T>(this->Text(12));
-    const S o(other.data(), static_cast<ssize_t>(other.size()));
+    const auto second = std::basic_string<T>(this->Text(12));
+    const S o(second.data(), static_cast<ssize_t>(second.size()));
     const auto order = [](const std::basic_string<T>& a, const std::basic_string<T>& b) {
       const auto less = [](T x, T y) { return std::make_unsigned_t<T>(x) < std::make_unsigned_t<T>(y); };
       return std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end(), less) ? -1 : a != b;
     };
-    const int expected = order(text, other), expectedUpToNull = order(text, other.c_str());
-    ASSERT_EQ(sign(v.compare(other.c_str())), expectedUpToNull);
-    ASSERT_EQ(v._Eq(other.c_str()), expectedUpToNull == 0);
-    ASSERT_EQ(v._Lt(other.c_str()), expectedUpToNull < 0);
+    const int expected = order(text, second), expectedUpToNull = order(text, second.c_str());
+    ASSERT_EQ(sign(v.compare(second.c_str())), expectedUpToNull);
+    ASSERT_EQ(v._Eq(second.c_str()), expectedUpToNull == 0);
+    ASSERT_EQ(v._Lt(second.c_str()), expectedUpToNull < 0);
     ASSERT_EQ(sign(v.compare(o)), expected);
     ASSERT_EQ(sign(v.compare(0, v.size(), o, 0, o.size())), expected);
     ASSERT_EQ(sign(v.compare(o.data(), o.size())), expected);

@@ -60,15 +60,15 @@ TYPED_TEST(UtfText, SequencesAtEveryPlaceInABlock) {
   const Text<TypeParam> fault(1, static_cast<TypeParam>(sizeof(TypeParam) == 1 ? 0xFF : 0xDC00));
   for (std::size_t n = 0; n < 135; ++n)
     for (const auto& filler : {pieces[0], pieces[1], pieces[2], pieces[3]})
-      for (const auto& one : pieces) {
+      for (const auto& first : pieces) {
         Text<TypeParam> text;
         for (std::size_t k = 0; k < n; ++k)
           text += filler;
-        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + text));
-        const auto& other = pieces[n % std::size(pieces)];
-        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + one + other));
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + first + text));
+        const auto& second = pieces[n % std::size(pieces)];
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(text + first + second));
         // Kernels that replace malformed text begin a block at a fault.
-        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(fault + text + one + other + text));
+        ASSERT_NO_FATAL_FAILURE(CheckText<TypeParam>(fault + text + first + second + text));
       }
 }
 

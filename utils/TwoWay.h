@@ -87,18 +87,18 @@ private:
   /// Finds the needle's greatest suffix in the given order, and that suffix's period.
   template <class Less> Suffix MaximalSuffix(const Less& less) const {
     Suffix best = {0, 1};
-    for (ssize_t other = 1, k = 0; other + k < m_length;) {
-      const auto a = UnitValue(m_needle[other + k]), b = UnitValue(m_needle[best.begin + k]);
-      if (less(a, b)) { // the other suffix is smaller, and so are all that begin up to here
-        other += k + 1;
+    for (ssize_t candidate = 1, k = 0; candidate + k < m_length;) {
+      const auto a = UnitValue(m_needle[candidate + k]), b = UnitValue(m_needle[best.begin + k]);
+      if (less(a, b)) { // the candidate is smaller, and so are all suffixes that begin up to here
+        candidate += k + 1;
         k = 0;
-        best.period = other - best.begin;
+        best.period = candidate - best.begin;
       } else if (less(b, a)) {
-        best = {other, 1};
-        ++other;
+        best = {candidate, 1};
+        ++candidate;
         k = 0;
       } else if (++k == best.period) {
-        other += k;
+        candidate += k;
         k = 0;
       }
     }

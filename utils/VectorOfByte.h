@@ -92,7 +92,7 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 /// cost is at worst linear in the haystack for one element, and the product of both lengths for a needle or a
 /// set. But it is linear in the sum of the lengths for needles if both ranges have random-access iterators
 /// over integers, and for all searches through pointers to code units: these have overloads of the same names
-/// and results, which use wide instructions if the processor has them.
+/// and results, which use SIMD instructions if the processor has them.
 /// @snippet examples/reference.cpp searching ranges
 /// @{
 

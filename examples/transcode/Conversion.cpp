@@ -45,7 +45,7 @@ private:
   void Take(const std::string& name);
   void TakeBlock(Blocks& blocks, File& file);
   std::string GoOnBehind(const File& file, const std::string& what, const std::string& place);
-  void Tell(const File& file, int64 count, const std::string& one, const std::string& many,
+  void Tell(const File& file, int64 count, const std::string& singular, const std::string& plural,
             const std::string& first);
 
   const Options& m_options;
@@ -117,12 +117,12 @@ std::string Conversion::GoOnBehind(const File& file, const std::string& what, co
 
 /// Reports how many faults have been replaced or dropped, and where the first was: "2 malformed sequences
 /// replaced, the first at byte 3 (line 1, column 4)".
-void Conversion::Tell(const File& file, int64 count, const std::string& one, const std::string& many,
+void Conversion::Tell(const File& file, int64 count, const std::string& singular, const std::string& plural,
                       const std::string& first) {
   if (count == 0)
     return;
   m_result.messages += "transcode: " + file.name + ": " + std::to_string(count) + " " +
-                       (count == 1 ? one : many) +
+                       (count == 1 ? singular : plural) +
                        (m_options.mode == Mode::kDrop ? " dropped" : " replaced") +
                        (count == 1 ? ", at " : ", the first at ") + first + "\n";
 }
