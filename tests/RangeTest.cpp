@@ -161,16 +161,13 @@ TYPED_TEST(Range, InTheStringItselfIsTakenAsItWas) {
   EXPECT_EDIT(s, s.push_back(2, s.begin(), s.begin() + 1), "dcbdcbadd");
 }
 
-TEST(RangeTest, UnitsWrittenAsAnotherTypeAreRead) { // compilers may assume that they don't alias ours
-  const auto s = Of<char16>("abc");
-  char16_t units[2];
-  for (const int i : {0, 1}) {
-    units[0] = static_cast<char16_t>('a' + i);
-    units[1] = static_cast<char16_t>('b' + i);
-    EXPECT_TRUE(s.contains(units, units + 2, i));
-    EXPECT_EQ(s.rfind(units, units + 2), i);
-  }
+/// Writes units as another type where nothing but the search reads them. Clang leaves out such a write if it
+/// is read as the vector's type.
+[[gnu::noinline]] bool StartsWith(const string16& s, char16_t first, char16_t second) {
+  const char16_t units[] = {first, second};
+  return s.contains(units, units + 2, 0);
 }
+TEST(RangeTest, UnitsWrittenAsAnotherTypeAreRead) { EXPECT_TRUE(StartsWith(Of<char16>("abc"), u'a', u'b')); }
 
 TYPED_TEST(Range, ElementsThatDontFitAreNowhere) {
   const auto s = Of<TypeParam>("a\xFF");
