@@ -45,9 +45,16 @@ namespace {
 const volatile ssize_t kMax = std::numeric_limits<ssize_t>::max(); // unknown to the compiler
 const volatile mirel::int64 kWide = mirel::int64(1) << 62;         // its lower 32 bits are 0
 
-/// An edit of s.
-#define EDIT(...) [&](auto& s) { __VA_ARGS__; }
-template <class V> using EditsOf = std::vector<std::function<void(V&)>>;
+/// An edit, and its source text.
+template <class V> struct Edit {
+  const char* text;
+  std::function<void(V&)> make;
+};
+#define EDIT(...)                                                                                            \
+  {                                                                                                          \
+#__VA_ARGS__, [&](auto& s) { __VA_ARGS__; }                                                              \
+  }
+template <class V> using EditsOf = std::vector<Edit<V>>;
 
 template <class T> class Allocation : public testing::Test {};
 TYPED_TEST_SUITE(Allocation, CodeUnits);
@@ -63,15 +70,15 @@ TYPED_TEST(Allocation, GrowthIsGeometric) {
                             EDIT(s.append(1, 'x'), s.c_str()),
                             EDIT(s += text, s.c_str()),
                             EDIT(FillFrom(s, 10, [](auto*, ssize_t n) { return n - 3; }))};
-  const auto allocations = [](int times, const auto& edit) {
+  const auto allocations = [](int times, const Edit<S>& edit) {
     S s;
     return allocation::Count([&] {
       for (int i = 0; i < times; ++i)
-        edit(s);
+        edit.make(s);
     });
   };
   for (const auto& edit : edits)
-    EXPECT_LT(allocations(100000, edit), 40) << &edit - edits.data();
+    EXPECT_LT(allocations(100000, edit), 40) << edit.text;
   EXPECT_LT(allocations(2000, EDIT(s.insert(s.size() / 2, 'x'), s.push_front('y'))), 20);
 }
 
@@ -123,22 +130,22 @@ TYPED_TEST(Allocation, NoneIfThereIsRoomAndNothingAliases) {
   for (const auto& edit : edits) {
     S s = Of<TypeParam>("abc");
     s.reserve(6); // most edits fill it exactly
-    EXPECT_EQ(allocation::Count([&] { edit(s); }), 0) << &edit - edits.data();
-    EXPECT_EQ(s.capacity(), 6) << &edit - edits.data();
+    EXPECT_EQ(allocation::Count([&] { edit.make(s); }), 0) << edit.text;
+    EXPECT_EQ(s.capacity(), 6) << edit.text;
   }
 }
 
 /// Expects that each edit throws if one of its allocations fails, and leaves v as it was.
 template <class V> void ExpectSafe(const V& v, const EditsOf<V>& edits) {
   for (const auto& edit : edits) {
-    SCOPED_TRACE(&edit - edits.data());
+    SCOPED_TRACE(edit.text);
     int failures = 0;
     for (; failures < 4; ++failures) { // some edits never succeed
       V s(v);
       const auto* const data = s.data();
       allocation::failAfter = failures;
       try {
-        edit(s);
+        edit.make(s);
         break;
       } catch (const std::bad_alloc&) {
       }
@@ -190,10 +197,11 @@ TYPED_TEST(Allocation, SumsOfSizesDontOverflow) {
   S v(1, 'x');
   mirel::VectorOfByte& bytes = reinterpret_cast<mirel::VectorOfByte&>(v);
   const TypeParam* const data = v.data();
-  const auto expectFailure = [&](ssize_t size, const std::function<void(S&)>& edit, ssize_t requested) {
+  const auto expectFailure = [&](ssize_t size, const Edit<S>& edit, ssize_t requested) {
+    SCOPED_TRACE(edit.text);
     bytes.size_ = bytes.m_capacity = size * unit; // the storage is smaller, so nothing may be moved
     allocation::requested = 0;
-    EXPECT_THROW(edit(v), std::bad_alloc);
+    EXPECT_THROW(edit.make(v), std::bad_alloc);
     EXPECT_EQ(allocation::requested, std::size_t(requested * unit));
     EXPECT_EQ(v.size(), size);
     EXPECT_EQ(v.capacity(), size);

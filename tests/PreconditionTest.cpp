@@ -107,7 +107,7 @@ void ExpectStops(V& v, const std::string& text, const std::vector<std::tuple<A..
   for (const auto& call : calls)
     for (const auto& values : arguments)
       ExpectStop([&] { std::apply([&](A... a) { call.invoke(call.closure, v, a...); }, values); }, text,
-                 call.text + (" with arguments " + std::to_string(&values - arguments.data())));
+                 call.text + (" with arguments " + testing::PrintToString(values)));
 }
 
 template <class T> class Precondition : public testing::Test {};

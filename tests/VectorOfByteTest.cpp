@@ -125,6 +125,10 @@ TYPED_TEST(RangeAlgorithms, EmptyRangesAndSets) {
   EXPECT_EQ(FindLastSubSequence(text, x2, null, null), x2);
 }
 
+const char* const kSearches[] = {
+    "find",        "findLast",       "findFirstSubSequence", "findLastSubSequence",
+    "findFirstOf", "findFirstNotOf", "findLastOf",           "findLastNotOf"};
+
 /// Compares every way to search with the standard library. A sanitizer checks the ends of both vectors.
 template <class T> void Check(const std::vector<T>& text, const std::vector<T>& what) {
   static const std::vector<Way<T>> ways = Ways<T>();
@@ -142,8 +146,8 @@ template <class T> void Check(const std::vector<T>& text, const std::vector<T>& 
                               s.findLastNotOf(x1, x2, y1, y2)};
     for (std::size_t k = 0; k < 8; ++k) // expectations would take most of the time
       if (found[k] != expected[k])
-        FAIL() << name << ", search " << k << " of " << text.size() << " units: " << found[k] - x1 << ", not "
-               << expected[k] - x1 << "; " << testing::PrintToString(what);
+        FAIL() << name << ", " << kSearches[k] << " in " << text.size() << " units: " << found[k] - x1
+               << ", not " << expected[k] - x1 << "; " << testing::PrintToString(what);
   }
 }
 

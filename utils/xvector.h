@@ -71,7 +71,7 @@ public:
   typedef ssize_t size_type;              ///< A count or index, signed.
   typedef std::ptrdiff_t difference_type; ///< The distance of two iterators.
 
-  /// A count up to the end; the last element, where a reverse search starts; a result that means "not found".
+  /// As a count, up to the end; as the start of a reverse search, the last element; as a result, not found.
   enum { npos = -1 };
 
   class const_reverse_iterator;
