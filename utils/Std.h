@@ -209,11 +209,10 @@ std::basic_ostream<char, Traits>& operator<<(std::basic_ostream<char, Traits>& o
   return os << std::basic_string_view<char, Traits>(s.data(), static_cast<std::size_t>(s.size()));
 }
 
-/// Appends what f writes. It makes room for most units without initialising them, calls f(p, most) with p at
-/// the first of them, and keeps as many units as f returns.
+/// Appends what f writes. It makes room for `most` units without initialising them, calls f(p, most) with p
+/// at the first of them, and keeps as many units as f returns.
 ///
-///     while (FillFrom(text, 65536, [&](char* p, ssize_t n) { return std::fread(p, 1, size_t(n), file); }) >
-///     0)
+///     while (FillFrom(text, 65536, [&](char* p, ssize_t n) { return std::fread(p, 1, size_t(n), f); }) > 0)
 ///       ;
 ///
 /// Over many calls, each unit is moved a constant number of times on average. If f throws, the contents stay
