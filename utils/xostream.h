@@ -24,9 +24,9 @@ namespace detail {
 /// Named by the compiler's message for put() of a pointer to other characters.
 struct ConvertToCharsOrVoidPointer {};
 
-/// Lets a template take part only if C is one of the others.
-template <class C, class... Others>
-using IfOneOf = std::enable_if_t<(std::is_same_v<std::remove_cv_t<C>, Others> || ...), int>;
+/// Lets a template take part in overload resolution only if C is one of the types.
+template <class C, class... Types>
+using IfOneOf = std::enable_if_t<(std::is_same_v<std::remove_cv_t<C>, Types> || ...), int>;
 
 } // namespace detail
 
