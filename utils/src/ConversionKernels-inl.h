@@ -142,6 +142,19 @@ HWY_INLINE uint8_t* StoreKept(hn::Vec<Narrow> v, const Shuffles& shuffles, uint6
   return out + kLeast + kEach * Count(mask16 & 0xFF0);
 }
 
+/// Stores what shuffles keep of vectors: of the first 16 bytes of each, by its mask as StoreKept() takes it,
+/// then of the second, by the bits from the 16th on.
+template <int kLeast, int kEach, class D, std::size_t n>
+HWY_INLINE uint8_t* StoreHalves(D d, const hn::Vec<D> (&vectors)[n], const Shuffles& shuffles,
+                                const uint64_t (&masks)[n], uint8_t* out) {
+  for (std::size_t i = 0; i < n; ++i)
+    out = StoreKept<kLeast, kEach>(SixteenBytes<0>(d, vectors[i]), shuffles, masks[i], out);
+  if constexpr (16 < kLanes<D>)
+    for (std::size_t i = 0; i < n; ++i)
+      out = StoreKept<kLeast, kEach>(SixteenBytes<1>(d, vectors[i]), shuffles, masks[i] >> 16, out);
+  return out;
+}
+
 /// Stores what the mask keeps of positions of two bytes, the first one of which comes from even.
 template <int kLeast, int kEach, class D>
 HWY_INLINE uint8_t* StorePairs(D d, hn::Vec<D> even, hn::Vec<D> odd, const Shuffles& shuffles, uint64_t mask,
@@ -235,6 +248,14 @@ template <class In> struct Conversion {
     return stop == Stop::kEnd && p != end ? Stop::kMalformed : stop; // the end cuts a code point off
   }
 };
+
+template <class Block, class In>
+Progress<In> ReplaceByBlocks(const In* p, const In* end, OtherUnit<In>* out, OtherUnit<In>* outEnd,
+                             ssize_t& replacements) {
+  Conversion<In> text{p, end, out, outEnd};
+  text.template Replace<Block>(replacements);
+  return text.At(Stop::kMalformed);
+}
 
 // UTF-8 to UTF-16 ----------
 
@@ -455,17 +476,12 @@ template <int kVectors, class D> struct Utf8Block {
   }
 };
 
-Progress<char8> ReplaceUtf8(const char8* p, const char8* end, char16* out, char16* outEnd,
-                            ssize_t& replacements) {
-  Conversion<char8> text{p, end, out, outEnd};
-  text.Replace<Utf8Block<64 / kLanes<Wide>, Wide>>(replacements);
-  return text.At(Stop::kMalformed);
-}
+using WideUtf8Block = Utf8Block<64 / kLanes<Wide>, Wide>;
 
 Progress<char8> Utf16FromUtf8(const char8* p, const char8* end, char16* out, char16* outEnd) {
   Conversion<char8> text{p, end, out, outEnd};
   if (end - p >= 64)
-    return text.At(text.ConvertAll<Utf8Block<64 / kLanes<Wide>, Wide>>());
+    return text.At(text.ConvertAll<WideUtf8Block>());
   if (end - p >= 32)
     return text.At(text.ConvertAll<Utf8Block<32 / kLanes<Wide>, Wide>>());
   if (end - p >= 16)
@@ -555,23 +571,14 @@ template <class Tag> struct Utf16Block {
     const auto leads1 = hn::BitCast(du, hn::InterleaveUpper(d, first, first));
     const auto rests0 = hn::BitCast(du, hn::InterleaveLower(d, middle, last));
     const auto rests1 = hn::BitCast(du, hn::InterleaveUpper(d, middle, last));
-    const auto units0 = hn::BitCast(d, hn::InterleaveLower(du, leads0, rests0));
-    const auto units1 = hn::BitCast(d, hn::InterleaveUpper(du, leads0, rests0));
-    const auto units2 = hn::BitCast(d, hn::InterleaveLower(du, leads1, rests1));
-    const auto units3 = hn::BitCast(d, hn::InterleaveUpper(du, leads1, rests1));
     const uint64_t even = (masks.two & 0x0F0F0F0F) << 4 | (masks.three & 0x0F0F0F0F) << 8;
     const uint64_t odd = (masks.two & 0xF0F0F0F0) | (masks.three & 0xF0F0F0F0) << 4;
-    out = StoreKept<4, 1>(SixteenBytes<0>(d, units0), kKeepThreeBytes, even, out);
-    out = StoreKept<4, 1>(SixteenBytes<0>(d, units1), kKeepThreeBytes, odd, out);
-    out = StoreKept<4, 1>(SixteenBytes<0>(d, units2), kKeepThreeBytes, even >> 8, out);
-    out = StoreKept<4, 1>(SixteenBytes<0>(d, units3), kKeepThreeBytes, odd >> 8, out);
-    if constexpr (kUnits > 16) {
-      out = StoreKept<4, 1>(SixteenBytes<1>(d, units0), kKeepThreeBytes, even >> 16, out);
-      out = StoreKept<4, 1>(SixteenBytes<1>(d, units1), kKeepThreeBytes, odd >> 16, out);
-      out = StoreKept<4, 1>(SixteenBytes<1>(d, units2), kKeepThreeBytes, even >> 24, out);
-      out = StoreKept<4, 1>(SixteenBytes<1>(d, units3), kKeepThreeBytes, odd >> 24, out);
-    }
-    return out;
+    return StoreHalves<4, 1>(d,
+                             {hn::BitCast(d, hn::InterleaveLower(du, leads0, rests0)),
+                              hn::BitCast(d, hn::InterleaveUpper(du, leads0, rests0)),
+                              hn::BitCast(d, hn::InterleaveLower(du, leads1, rests1)),
+                              hn::BitCast(d, hn::InterleaveUpper(du, leads1, rests1))},
+                             kKeepThreeBytes, {even, odd, even >> 8, odd >> 8}, out);
   }
 
   HWY_INLINE Converted Convert(ssize_t from, ssize_t to, uint8_t* out) const {
@@ -596,21 +603,14 @@ template <class Tag> struct Utf16Block {
   /// Stores a block of ASCII and of unpaired surrogates, no two of them side by side: eight units then give
   /// no more than 16 bytes.
   HWY_INLINE uint8_t* StoreAscii(uint64_t unpaired, uint8_t* out) const {
-    const hn::Repartition<uint64_t, Narrow> d64;
+    const hn::Repartition<uint64_t, D> d64;
     alignas(16) static constexpr uint8_t kReplacement[16] = {0xEF, 0xBF, 0xBD, 0,    0,   0,
                                                              0,    0,    0xEF, 0xBF, 0xBD};
-    const auto replacement = hn::BitCast(d64, hn::Load(Narrow(), kReplacement));
-    const auto store = [&](auto bytes, uint64_t mask) HWY_ATTR {
-      const auto v = hn::BitCast(d64, bytes);
-      const auto first = hn::BitCast(Narrow(), hn::InterleaveLower(d64, v, replacement));
-      const auto second = hn::BitCast(Narrow(), hn::InterleaveUpper(d64, v, replacement));
-      out = StoreKept<8, 2>(first, kReplaceUnits, mask << 4, out);
-      out = StoreKept<8, 2>(second, kReplaceUnits, mask >> 4, out);
-    };
-    store(SixteenBytes<0>(d, low), unpaired);
-    if constexpr (kUnits > 16)
-      store(SixteenBytes<1>(d, low), unpaired >> 16);
-    return out;
+    const auto units = hn::BitCast(d64, low), replacement = hn::BitCast(d64, hn::LoadDup128(d, kReplacement));
+    return StoreHalves<8, 2>(d,
+                             {hn::BitCast(d, hn::InterleaveLower(d64, units, replacement)),
+                              hn::BitCast(d, hn::InterleaveUpper(d64, units, replacement))},
+                             kReplaceUnits, {unpaired << 4, unpaired >> 4}, out);
   }
 
   /// The block with U+FFFD in the lanes of the mask.
@@ -638,13 +638,6 @@ template <class Tag> struct Utf16Block {
     return {WithReplaced(MaskOf(d, unpaired)).Convert(0, kUnits, out), Count(unpaired)};
   }
 };
-
-Progress<char16> ReplaceUtf16(const char16* p, const char16* end, char8* out, char8* outEnd,
-                              ssize_t& replacements) {
-  Conversion<char16> text{p, end, out, outEnd};
-  text.Replace<Utf16Block<Wide>>(replacements);
-  return text.At(Stop::kMalformed);
-}
 
 Progress<char16> Utf8FromUtf16(const char16* p, const char16* end, char8* out, char8* outEnd) {
   Conversion<char16> text{p, end, out, outEnd};

@@ -30,8 +30,8 @@ namespace mirel::detail::HWY_NAMESPACE {
 namespace {
 
 constexpr Kernels kKernels = {
-    {Utf16FromUtf8, ReplaceUtf8, SkipUtf8, MeasureUtf8, kSearchKernels<char8>},
-    {Utf8FromUtf16, ReplaceUtf16, SkipUtf16, MeasureUtf16, kSearchKernels<char16>},
+    {Utf16FromUtf8, ReplaceByBlocks<WideUtf8Block>, SkipUtf8, MeasureUtf8, kSearchKernels<char8>},
+    {Utf8FromUtf16, ReplaceByBlocks<Utf16Block<Wide>>, SkipUtf16, MeasureUtf16, kSearchKernels<char16>},
     &HWY_STR(HWY_NAMESPACE)[2], // without "N_"
     Utf16FromAscii,
 };

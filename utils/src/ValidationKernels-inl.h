@@ -41,8 +41,7 @@ template <ssize_t n> HWY_INLINE bool IsAscii(const char8* p) {
 /// A scan of UTF-8.
 template <bool kIsCounted> struct Utf8Scan {
   using D = Wide;
-  using Block = Utf8Block<64 / kLanes<D>, D>;
-  static constexpr ssize_t kUnits = Block::kUnits;
+  static constexpr ssize_t kUnits = WideUtf8Block::kUnits;
 
   hn::Vec<D> last; ///< of the block before
   ssize_t continuations, fourBytes;
@@ -56,7 +55,7 @@ template <bool kIsCounted> struct Utf8Scan {
     const bool isAscii = IsAscii<kUnits>(p);
     if (isAscii && isBehindAscii)
       return true;
-    const Block block = Block::Load(p);
+    const WideUtf8Block block = WideUtf8Block::Load(p);
     auto before = last, faults = hn::Zero(D());
     for (int k = 0; k < kUnits / kLanes<D>; ++k) {
       const auto bytes = block.template Get<0>(k);
