@@ -315,7 +315,7 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 /// @pre "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)" of each source
 ///
 /// A failed allocation throws std::bad_alloc before anything has changed. Whatever may grow the buffer may
-/// move its storage, and invalidates pointers into it; erasing keeps the storage and moves down the bytes
+/// move its storage, which invalidates pointers into it; erasing keeps the storage and moves down the bytes
 /// that follow. A series of edits takes amortised constant time per byte added, plus that of the bytes that
 /// move.
 /// @snippet examples/reference.cpp VectorOfByte

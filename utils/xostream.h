@@ -37,7 +37,7 @@ using IfOneOf = std::enable_if_t<(std::is_same_v<std::remove_cv_t<C>, Types> || 
 /// Text that needs no indent reaches the sink in one call, indented text in one call for each 512 bytes or
 /// for each longer line.
 /// @par A sink that throws
-/// ends the member that was called, and its exception goes to the caller. The bytes of the throwing call
+/// Its exception ends the member that was called, and goes to the caller. The bytes of the throwing call
 /// count as not written, and the rest of what the member writes is dropped. The next member calls the sink
 /// again, and doesn't repeat spaces of an indent that the sink has taken.
 ///

@@ -104,16 +104,16 @@ public:
   /// Returns the contents with a null past the end, which is not part of the string.
   ///
   /// The call counts as a change, although it is const: no other thread may use the string meanwhile. If
-  /// there is no unused capacity it moves the storage, and makes room for more than the null, so that appends
-  /// and c_str() in turn take amortised constant time. The result is valid until the next change; until then
-  /// another call returns the same pointer.
-  /// @pre "p": never null after room was made
+  /// there is no unused capacity it moves the storage, which invalidates pointers, references, iterators and
+  /// views, and makes room for more than the null, so that appends and c_str() in turn take amortised
+  /// constant time. The result is valid until the next change; until then another call returns the same
+  /// pointer.
   const T* c_str() const {
     const ssize_t n = this->size();
     if (n == this->capacity())
       this->reserve(Base::Sum(n, 1 + (n / 2 < Base::kMaxSize - n ? n / 2 : 0)));
     const T* const p = this->data();
-    MIREL_ASSERT(p);
+    MIREL_ASSERT(p); // there is storage, since room was made
     const_cast<T*>(p)[n] = 0;
     return p;
   }

@@ -32,18 +32,19 @@ namespace mirel {
 /// and only warns of a constant that is searched for.
 ///
 /// @par Bad arguments
-/// stop the process with the text given after "@pre", before anything has changed. They are never clamped. A
-/// null pointer with a count of 0 is an empty range; any other null pointer is a bad argument.
+/// They stop the process with the text given after "@pre", before anything has changed. They are never
+/// clamped. A null pointer with a count of 0 is an empty range; any other null pointer is a bad argument.
 /// @par Ranges
-/// are checked after all indices and counts: a range of random-access iterators, or of our reverse iterators,
-/// may not be reversed, and the beginning of a range may not be a null pointer unless the end is one too.
+/// They are checked after all indices and counts: a range of random-access iterators, or of our reverse
+/// iterators, may not be reversed, and the beginning of a range may not be a null pointer unless the end is
+/// one too.
 /// @pre "r1 <= r2", then, where elements are copied,
 /// "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)", and "r1 == r2 || r1 != nullptr"
 /// where they are searched for
 /// @par Memory
 /// A failed allocation throws std::bad_alloc: contents, size and capacity are as they were before the call.
 /// @par Invalidation
-/// Whatever may add elements or capacity may move the storage, and invalidates pointers, references and
+/// Whatever may add elements or capacity may move the storage, which invalidates all pointers, references and
 /// iterators. Erasing keeps the storage and moves down the elements that follow; swap() exchanges the
 /// storage.
 /// @par Aliasing
@@ -71,7 +72,8 @@ public:
   typedef ssize_t size_type;              ///< A count or index, signed.
   typedef std::ptrdiff_t difference_type; ///< The distance of two iterators.
 
-  /// As a count, up to the end; as the start of a reverse search, the last element; as a result, not found.
+  /// As the count of substr(), up to the end; as the start of a reverse search, the last element; as a
+  /// result, not found.
   enum { npos = -1 };
 
   class const_reverse_iterator;
@@ -554,9 +556,9 @@ public:
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   /// @pre "r1 <= r2"
   ///
-  /// Nothing is allocated. The cost is at worst linear in the searched length for one element; linear in the
-  /// sum of both lengths for needles and sets of code units, and for needles of any integers with
-  /// random-access iterators; and otherwise the product of both lengths.
+  /// Nothing is allocated. At worst the cost is linear: for one element in the searched length, for needles
+  /// and sets of code units, and for needles of any integers with random-access iterators, in the sum of both
+  /// lengths, and otherwise in their product.
   /// @snippet examples/reference.cpp search
   /// @{
 
@@ -884,7 +886,7 @@ private:
   void FillRange(ssize_t i, ssize_t n, ssize_t count, T x);
   void AppendRepeated(ssize_t count, const T* p, ssize_t pn);
 
-  /// The end of the range that a reverse search from offset goes through.
+  /// Returns the end of the elements that a reverse search from offset goes through.
   const T* After(ssize_t offset) const { return offset == npos ? end() : begin() + offset + 1; }
   /// Converts a search result to an index; notFound is the result of a search that finds nothing.
   ssize_t Index(const T* result, const T* notFound) const {
@@ -958,7 +960,7 @@ protected:
   const T* p; ///< One past the designated element.
 };
 
-/// Goes from the last element to the first, and allows changing them.
+/// Goes from the last element to the first, as const_reverse_iterator does; the elements may be changed.
 /// @snippet examples/reference.cpp reverse iterators
 template <class T> class xvector<T>::reverse_iterator : public xvector<T>::const_reverse_iterator {
 public:
