@@ -11,6 +11,7 @@
 #include <memory>
 #include <string>
 #include <tuple>
+#include <type_traits>
 #include <unistd.h>
 #include <utility>
 #include <vector>
@@ -94,6 +95,15 @@ template <class V, class... A> struct CallOf {
 #define REVERSE(WITH, ...)                                                                                   \
   WITH(v.rfind(__VA_ARGS__)), WITH(v.find_last_of(__VA_ARGS__)), WITH(v.find_last_not_of(__VA_ARGS__))
 
+/// An argument as a message shows it: pointers, and iterators that become pointers, by their address. No null
+/// ends what they point to.
+template <class A> auto Shown(A a) {
+  if constexpr (std::is_convertible_v<A, const void*>)
+    return static_cast<const void*>(a);
+  else
+    return a;
+}
+
 /// Expects that each of the calls stops with text for each of the arguments, and that the storage of v is
 /// unchanged then.
 template <class V, class... A>
@@ -105,9 +115,11 @@ void ExpectStops(V& v, const std::string& text, const std::vector<std::tuple<A..
     return b == before && b.data() == data && b.capacity() == capacity;
   };
   for (const auto& call : calls)
-    for (const auto& values : arguments)
+    for (const auto& values : arguments) {
+      const auto shown = std::apply([](A... a) { return std::tuple(Shown(a)...); }, values);
       ExpectStop([&] { std::apply([&](A... a) { call.invoke(call.closure, v, a...); }, values); }, text,
-                 call.text + (" with arguments " + testing::PrintToString(values)));
+                 call.text + (" with arguments " + testing::PrintToString(shown)));
+    }
 }
 
 template <class T> class Precondition : public testing::Test {};
