@@ -6,6 +6,7 @@
 #include <vector>
 
 #include <utils/CodePoints.h>
+#include <utils/Utf.h>
 
 namespace {
 
@@ -136,6 +137,15 @@ TEST(Utf, CapacityIsGivenBack) {
   mirel::string16 wide;
   mirel::Utf16FromAscii(wide, bytes.data(), 100);
   EXPECT_EQ(wide.c_str(), wide.data());
+}
+
+/// A view is copied in parts of 1,024 units.
+TEST(Utf, APairMayStandWhereAPartOfAViewEnds) {
+  for (const std::size_t n : {1022u, 1023u, 1024u}) {
+    mirel::string8 dst;
+    EXPECT_TRUE(mirel::Utf8FromUtf16(dst, std::u16string(n, u'a') + u"\U0001F600b"));
+    EXPECT_EQ(std::string(dst.data(), std::size_t(dst.size())), std::string(n, 'a') + "\U0001F600b");
+  }
 }
 
 TEST(Utf, AsciiOfEveryLength) {
