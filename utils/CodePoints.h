@@ -19,7 +19,7 @@ namespace mirel {
 
 namespace detail {
 
-/// Replaces malformed text: U+FFFD.
+/// U+FFFD, the replacement character, which takes the place of malformed text.
 constexpr char32_t kReplacement = 0xFFFD;
 
 /// A decoded sequence. A well-formed one is a code point and the number of its units. A malformed one is
@@ -37,7 +37,7 @@ inline bool IsLowSurrogate(char16 unit) { return (unit & 0xFC00) == 0xDC00; }
 
 /// Decodes the UTF-8 sequence at p, by table 3-7 of the Unicode Standard. p isn't the end.
 ///
-/// It is always inlined: as a call, with its result in memory, it took five to seven times as long in a loop
+/// Always inlined: a call, which returns its result in memory, took five to seven times as long in a loop
 /// over a text.
 [[gnu::always_inline]] inline Sequence Decode(const char8* p, const char8* end) {
   const char32_t lead = UnitValue(p[0]);
@@ -88,7 +88,7 @@ inline const char16* Previous(const char16* begin, const char16* p) {
   return p - begin >= 2 && IsHighSurrogate(p[-2]) && IsLowSurrogate(p[-1]) ? p - 2 : p - 1;
 }
 
-/// Writes the units of a scalar value. @return past the end of what was written
+/// Writes the units of a scalar value. @return the end of what was written
 inline char8* Encode(char32_t c, char8* out) {
   const auto put = [&](char32_t unit) { *out++ = static_cast<char8>(unit); };
   const auto putContinuation = [&](int shift) { put(0x80 | (c >> shift & 0x3F)); };
@@ -119,7 +119,7 @@ inline char16* Encode(char32_t c, char16* out) {
   return out;
 }
 
-/// The number of units that Encode() writes.
+/// Returns the number of units that Encode() writes.
 template <class T> int EncodedLength(char32_t c) {
   if constexpr (sizeof(T) == 1)
     return 1 + (c >= 0x80) + (c >= 0x800) + (c >= 0x10000);
@@ -140,7 +140,7 @@ inline ssize_t SizeOf(std::string_view text) { return static_cast<ssize_t>(text.
 /// Walks a text by code points, forwards and backwards. Each maximal subpart of malformed text reads as
 /// U+FFFD, and both directions find the same subparts.
 ///
-/// It decodes a code point once, when it arrives there. It yields values, not references.
+/// It decodes a code point once, when it reaches it. `*` returns a value, not a reference.
 /// @snippet examples/reference.cpp code point iterators
 template <class T> class CodePointIterator {
 public:
@@ -152,7 +152,7 @@ public:
   typedef void pointer;                              ///< A code point has no address.
   typedef char32_t reference;                        ///< A value.
 
-  /// Makes an iterator that may only be assigned to.
+  /// Makes a singular iterator, which may only be assigned to.
   CodePointIterator() = default;
 
   /// The code point, or U+FFFD for malformed text. The iterator may not be past the end.

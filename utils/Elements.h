@@ -61,9 +61,9 @@ inline void p_copy(char16* dst, const char16* src1, const char16* src2) {
   memcpy_p_copy<char16>(dst, src1, src2);
 }
 
-/// Destroys a range of 8-bit code units: nothing to do.
+/// Does nothing: 8-bit code units need no destruction.
 inline void p_del(char8*, char8*) {}
-/// Destroys a range of 16-bit code units: nothing to do.
+/// Does nothing: 16-bit code units need no destruction.
 inline void p_del(char16*, char16*) {}
 
 /// @}

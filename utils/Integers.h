@@ -57,12 +57,12 @@ template <class T, class N> constexpr bool HasBitsFor(N x) {
   }
 }
 
-/// What the compiler says of a constant that doesn't fit.
+/// The compiler's message about a constant that doesn't fit.
 #define MIREL_CUT                                                                                            \
   "this constant has more bits than the code unit that it is passed as: cast it if that is meant"
 
 #ifdef __clang__
-// With clang, MIREL_FITS refuses such constants, and at any optimisation level.
+// With clang, MIREL_FITS refuses constants that don't fit, at any optimisation level.
 template <class T, bool kStored, class N> constexpr void CheckConstant(N) {}
 #else
 /// Isn't defined: the compilation fails if a call remains after optimisation.
@@ -108,8 +108,8 @@ template <class T, class X> [[gnu::always_inline]] inline T Unit(X x) {
   return static_cast<T>(UnsignedValue(x));
 }
 
-/// Converts an argument to the code unit that is searched for. kMore integers follow it in the call; two
-/// would be an offset and a needle's length, so the first was meant as a pointer: refused.
+/// Converts an argument to the code unit that is searched for. kMore integers follow it in the call. Two
+/// would be an offset and a needle's length, and the argument a null pointer: that doesn't compile.
 template <class T, int kMore, class X> [[gnu::always_inline]] inline T UnitToFind(X x) {
   static_assert(kMore <= 1,
                 "an empty needle is (nullptr, offset, 0): a literal 0 is a unit, never a pointer");

@@ -11,12 +11,12 @@ namespace mirel {
 enum class MalformedReason {
   kNone,                   ///< It is well-formed.
   kTruncated,              ///< The text ends, or goes on with another unit, before the sequence is complete.
-  kUnexpectedContinuation, ///< A byte 80 to BF that continues no sequence, as after a malformed lead.
-  kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 only begin such.
+  kUnexpectedContinuation, ///< A byte 80 to BF that continues no sequence, as after a malformed lead byte.
+  kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 begin nothing else.
   kSurrogate,              ///< A surrogate, D800 to DFFF, encoded in UTF-8.
   kBeyondUnicode,          ///< A value above U+10FFFF: F4 followed by 90 or above.
   kInvalidByte,            ///< A byte F5 to FF, which UTF-8 never has.
-  kUnpairedSurrogate,      ///< A surrogate of UTF-16 without its other half.
+  kUnpairedSurrogate,      ///< A UTF-16 surrogate that isn't part of a surrogate pair.
 };
 
 /// Returns the reason as a noun phrase for a message, "overlong sequence" for example.

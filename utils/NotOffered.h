@@ -2,8 +2,8 @@
 /// Calls that vectors and strings don't have: deleted, with a return type that names what to write instead.
 ///
 /// The operators take their arguments by user-defined conversions, so overload resolution prefers whatever
-/// operator a program or another header declares for such arguments, those of utils/Std.h included. The
-/// members are deleted where the others of their name are declared.
+/// operator a program or another header declares for such arguments, those of utils/Std.h included. Deleted
+/// members are declared with the others of their name.
 
 #pragma once
 
@@ -47,7 +47,7 @@ struct NoVector {
   NoVector(const X&);
 };
 
-/// Nothing converts to it: as a list of it, an argument can only be {}.
+/// Nothing converts to it, so only {} makes a std::initializer_list of it.
 class NoUnit {
   NoUnit();
 };
@@ -73,7 +73,8 @@ struct WriteTwoPointers {};
 
 struct ReversePointer;
 
-/// The unit of a class with the members of a string, or that a pointer to text points to; otherwise void.
+/// The unit of text: the value_type of a class with the members of a string, or the type that a pointer
+/// points to; void for other types.
 template <class X, class = void> struct TextUnit { typedef void type; };
 template <class X> struct TextUnit<X, std::void_t<decltype(X::npos), typename X::value_type>> {
   typedef std::remove_cv_t<typename X::value_type> type;

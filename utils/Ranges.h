@@ -5,8 +5,9 @@
 /// @par Units of other types
 /// A range may have any iterators over integers or enumerators, but not over types that convert to them. Each
 /// element counts by its unsigned value, on every processor: the byte E9 is the unit 00E9 of a string16,
-/// whether plain char is signed or not. A stored element must fit the vector's units, or nothing is changed.
-/// A searched element may have any value, and equals nothing if it doesn't fit.
+/// whether plain char is signed or not. A stored element must fit the vector's units, which is checked before
+/// anything changes. An element that is searched for may have any value, and equals nothing if it doesn't
+/// fit.
 /// @pre "Fits<T>(*r1)" of each element that is stored
 ///
 /// @par Cost
@@ -48,7 +49,8 @@ template <class It, class Tag>
 constexpr bool kHasCategory = std::is_base_of_v<Tag, typename std::iterator_traits<It>::iterator_category>;
 
 #if __cpp_lib_concepts >= 202002L
-// The iterators of views may satisfy the concepts alone: their `*` doesn't return a reference.
+// Iterators of C++20's views may satisfy the concepts without having the category: their `*` doesn't return a
+// reference.
 template <class It>
 constexpr bool kIsForward = std::forward_iterator<It> || kHasCategory<It, std::forward_iterator_tag>;
 template <class It>
@@ -61,8 +63,7 @@ template <class It> constexpr bool kIsRandomAccess = kHasCategory<It, std::rando
 template <class It, class C>
 constexpr bool kIsIteratorOf =
     std::is_same_v<It, typename C::iterator> || std::is_same_v<It, typename C::const_iterator>;
-/// Whether iterators are pointers, or known to stand for pointers. Those of string views are one or the
-/// other.
+/// Whether It is a pointer, or known to be a contiguous iterator. The iterators of string views are covered.
 template <class It>
 constexpr bool kIsContiguous = std::is_pointer_v<It> || kIsIteratorOf<It, std::vector<ValueType<It>>>
 #ifdef __GLIBCXX__ // libc++'s strings have the iterators of its vectors, and exist for characters only
@@ -82,8 +83,8 @@ template <class It>
 constexpr bool kIsVolatile =
     std::is_volatile_v<std::remove_reference_t<typename std::iterator_traits<It>::reference>>;
 
-/// Returns whether iterators stand for pointers to units as wide as T. It names the containers of such units
-/// only.
+/// Returns whether It is a contiguous iterator over units as wide as T. For other elements kIsContiguous
+/// isn't named, since it names their containers.
 template <class T, class It> constexpr bool StandsForPointer() { // the compiler decides
   if constexpr (!kIsUnit<T, ValueType<It>> || kIsVolatile<It>)
     return false;
@@ -124,8 +125,8 @@ template <class It> constexpr bool IsRange(const It& r1, const It& r2) {
     return true;
 }
 
-/// Returns whether an iterator is a null pointer or stands for one, as one does to which nothing was
-/// assigned.
+/// Returns whether an iterator is a null pointer or holds one, as a value-initialised contiguous iterator
+/// does.
 template <class It> constexpr bool IsNull([[maybe_unused]] const It& it) {
   if constexpr (std::is_pointer_v<It>) {
     return it == nullptr;
@@ -146,7 +147,7 @@ template <class It>
 constexpr bool IsInMemory(const std::reverse_iterator<It>&, const std::reverse_iterator<It>&);
 template <class It> constexpr bool IsInMemory(const std::move_iterator<It>&, const std::move_iterator<It>&);
 
-/// Returns false for pointers, and iterators that stand for them, of which only the first in memory is null.
+/// Returns false for a range that isn't empty and whose lower end in memory is a null pointer.
 template <class It> constexpr bool IsInMemory(const It& r1, const It& r2) {
   if constexpr (std::is_base_of_v<ReversePointer, It>)
     return IsInMemory(Held(r2), Held(r1));
@@ -176,8 +177,8 @@ template <class T, class N> constexpr bool Fits(N value) {
 }
 
 /// A contiguous range of units. The program may have written them as another type, and compilers assume that
-/// different types don't alias: so only functions of the C library or of this one, or CopyOf(), may read
-/// them, never a mere `*`.
+/// different types don't alias: so only the C library, compiled functions of this library and CopyOf() may
+/// read them, never a mere `*`.
 template <class T> class UnitSpan {
 public:
   template <class V> UnitSpan(const V* p, ssize_t n) : m_p(reinterpret_cast<const T*>(p)), m_size(n) {}
@@ -272,7 +273,7 @@ private:
   ValueIterator<It> m_begin, m_end;
 };
 
-/// Returns the units of [r1, r2), whose iterators stand for pointers. It doesn't dereference the end.
+/// Returns the units of [r1, r2), whose iterators are contiguous, without dereferencing r2.
 template <class T, class It> UnitSpan<T> Span(It r1, It r2) {
   if constexpr (std::is_pointer_v<It>)
     return {r1, r2 - r1};
@@ -280,8 +281,8 @@ template <class T, class It> UnitSpan<T> Span(It r1, It r2) {
     return {r1 == r2 ? nullptr : __builtin_addressof(*r1), static_cast<ssize_t>(r2 - r1)};
 }
 
-/// Returns the units of [r1, r2) as a contiguous range to copy from. It makes a copy if the iterators don't
-/// stand for pointers, since only a pointer reveals whether it points into the vector.
+/// Returns the units of [r1, r2) as a contiguous range to copy from. It makes a copy if the iterators aren't
+/// contiguous, since only a pointer reveals whether it points into the vector.
 template <class T, class It> auto Source(It r1, It r2) {
   if constexpr (StandsForPointer<T, It>())
     return Span<T>(r1, r2);
@@ -289,7 +290,7 @@ template <class T, class It> auto Source(It r1, It r2) {
     return UnitCopy<T>(r1, r2);
 }
 
-/// Refuses ranges that can be read only once, since a search reads its needle many times.
+/// Refuses input iterators, whose range can be read only once: a search reads its needle many times.
 template <class It> constexpr void RequireForward() {
   static_assert(kIsForward<It>, "a search reads its needle more than once: copy it into a string first");
 }

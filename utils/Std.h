@@ -71,10 +71,10 @@ template <class T> std::size_t HashText(TextRef<T> text) {
 } // namespace detail
 
 /// @name Comparison
-/// Compare strings, vectors and sums of one width with each other, or with an Operand on either side: a
-/// null-terminated string or, for 8-bit text, whatever converts to `std::string_view`. Code units compare as
-/// unsigned values; a proper prefix of a string orders before it. A literal null pointer or 0 doesn't
-/// compile. Nothing is allocated; the cost is at worst linear in the shorter length.
+/// Compare strings, vectors and results of `+` of one width with each other, or with an Operand on either
+/// side: a null-terminated string or, for 8-bit text, whatever converts to `std::string_view`. Code units
+/// compare as unsigned values; a proper prefix of a string orders before it. A literal null pointer or 0
+/// doesn't compile. Nothing is allocated; the cost is at worst linear in the shorter length.
 /// @pre "s != nullptr" of a null-terminated string
 ///
 /// @snippet examples/reference.cpp operators
@@ -203,7 +203,7 @@ string16 ToString16(std::u16string_view s);
 /// @}
 
 /// Writes the text to a standard stream, padded to the stream's width as a `std::string_view` is. It takes
-/// sums and other vectors of char8 too.
+/// results of `+` and other vectors of char8 too.
 template <class Traits>
 std::basic_ostream<char, Traits>& operator<<(std::basic_ostream<char, Traits>& os, const xvector<char8>& s) {
   return os << std::basic_string_view<char, Traits>(s.data(), static_cast<std::size_t>(s.size()));

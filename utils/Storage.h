@@ -19,7 +19,7 @@ struct Storage {
     v.m_buffer.size_ = size;
     return v.data_end();
   }
-  /// Makes the first size elements of the storage the contents. They have been written.
+  /// Makes the first size elements of the storage the contents. The caller has written them.
   template <class T> static void SetSize(xvector<T>& v, ssize_t size) {
     v.m_buffer.size_ = size * ssize_t(sizeof(T));
   }

@@ -20,15 +20,15 @@ class Credit {
 public:
   explicit Credit(ssize_t needleLength) : m_credit(needleLength / 2 + 64) {}
 
-  /// Returns whether the search may go on, after a comparison that failed after equalUnits equal units;
-  /// passed is the number of places searched so far.
+  /// Returns whether the search may go on, after a comparison that found equalUnits equal units and then a
+  /// difference; passed is the number of places searched so far.
   bool Allows(ssize_t equalUnits, ssize_t passed) {
     m_credit -= equalUnits / 4 + 8;
     return m_credit + 4 * int64(passed) >= 0;
   }
 
 private:
-  int64 m_credit; // 64 bits, since places count fourfold
+  int64 m_credit; // 64 bits, since each place counts four
 };
 
 /// Counts the equal elements before the first difference of the n at x and the n at y; n if all are equal.

@@ -55,7 +55,7 @@ public:
   /// The number of U+FFFD that have replaced malformed text so far.
   int64 replacements() const { return m_replacements; }
   /// The first malformed sequence, its offset counted from the beginning of the text. While there is none,
-  /// the reason is kNone and the offset npos.
+  /// the reason is kNone and the offset npos (-1).
   const MalformedText& malformed() const { return m_malformed; }
 
 private:

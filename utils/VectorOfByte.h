@@ -88,11 +88,11 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 
 /// @}
 /// @name Searching ranges
-/// Each search returns a position in the haystack, or its end if nothing is found. Nothing is allocated. The
-/// cost is at worst linear in the haystack for one element, and the product of both lengths for a needle or a
-/// set. But it is linear in the sum of the lengths for needles if both ranges have random-access iterators
-/// over integers, and for all searches through pointers to code units: these have overloads of the same names
-/// and results, which use SIMD instructions if the processor has them.
+/// Each search returns a position in the haystack, or its end if nothing is found. Nothing is allocated. At
+/// worst the cost is linear in the haystack for one element, and in the product of both lengths for a needle
+/// or a set. But it is linear in the sum of the lengths for needles if both ranges have random-access
+/// iterators over integers, and for all searches through pointers to code units: these have overloads of the
+/// same names and results, which use SIMD instructions if the processor has them.
 /// @snippet examples/reference.cpp searching ranges
 /// @{
 
@@ -194,7 +194,7 @@ template <class T> struct SearchKernels {
 /// Returns whether a range is so short that the loops in this file are faster than a call of a kernel.
 template <class T> bool IsShort(const T* x1, const T* x2) { return x2 - x1 <= 16; }
 
-/// Find() that compares with the end of the range only at every fourth unit.
+/// Find() that checks for the end of the range only at every fourth unit.
 template <class T> const T* FindByFour(const T* i1, const T* i2, T v) {
   while (i2 - i1 >= 4 && i1[0] != v && i1[1] != v && i1[2] != v && i1[3] != v)
     i1 += 4;
@@ -203,7 +203,7 @@ template <class T> const T* FindByFour(const T* i1, const T* i2, T v) {
   return i1;
 }
 
-/// FindLast() that compares with the beginning of the range only at every fourth unit. It counts by an index,
+/// FindLast() that checks for the beginning of the range only at every fourth unit. It counts by an index,
 /// since compilers generate better code for that than for a pointer that goes back.
 template <class T> const T* FindLastByFour(const T* i1, const T* i2, T v) {
   ssize_t i = i2 - i1;

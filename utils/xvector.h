@@ -556,9 +556,9 @@ public:
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   /// @pre "r1 <= r2"
   ///
-  /// Nothing is allocated. At worst the cost is linear: for one element in the searched length, for needles
-  /// and sets of code units, and for needles of any integers with random-access iterators, in the sum of both
-  /// lengths, and otherwise in their product.
+  /// Nothing is allocated. At worst the cost is linear in the searched length for one element; in the sum of
+  /// both lengths for needles and sets of code units, and for needles of any integers with random-access
+  /// iterators; otherwise in the product of both lengths.
   /// @snippet examples/reference.cpp search
   /// @{
 
@@ -590,8 +590,8 @@ public:
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
     return Index(FindLast(begin(), After(offset), c), After(offset));
   }
-  /// Finds the last occurrence of [r1, r2) that starts at or before offset; it may end behind offset. An
-  /// empty range is found at offset, or for npos at size().
+  /// Finds the last occurrence of [r1, r2) that starts at or before offset; it may end after offset. An empty
+  /// range is found at offset, or for npos at size().
   template <class It, detail::IfIterator<It> = 0> ssize_t rfind(It r1, It r2, ssize_t offset = npos) const;
   /// Finds the last occurrence of r that starts at or before offset.
   ssize_t rfind(const xvector<T>& r, ssize_t offset = npos) const {
@@ -614,8 +614,8 @@ public:
     const auto set = detail::Needle<T>(r1, r2);
     return Index(FindFirstOf(begin() + offset, end(), set.begin(), set.end()), end());
   }
-  /// Finds the first element from offset on that occurs in r. It isn't const: on a const vector, pass
-  /// r.begin() and r.end().
+  /// Finds the first element from offset on that occurs in r. This overload isn't const: on a const vector,
+  /// pass r.begin() and r.end().
   ssize_t find_first_of(const xvector<T>& r, ssize_t offset = 0) {
     return find_first_of(r.begin(), r.end(), offset);
   }
@@ -638,8 +638,8 @@ public:
     const auto set = detail::Needle<T>(r1, r2);
     return Index(FindFirstNotOf(begin() + offset, end(), set.begin(), set.end()), end());
   }
-  /// Finds the first element from offset on that doesn't occur in r. It isn't const: on a const vector, pass
-  /// r.begin() and r.end().
+  /// Finds the first element from offset on that doesn't occur in r. This overload isn't const: on a const
+  /// vector, pass r.begin() and r.end().
   ssize_t find_first_not_of(const xvector<T>& r, ssize_t offset = 0) {
     return find_first_not_of(r.begin(), r.end(), offset);
   }
@@ -855,8 +855,8 @@ protected:
     return a + b;
   }
   /// Appends the pn elements at p; the arguments have been checked. It is inline for the most frequent edit,
-  /// into storage with room. That storage stays, so the elements may lie in it, even in the unused capacity:
-  /// memmove takes ranges that overlap.
+  /// an append to a vector with room. The storage then stays, so the elements may lie in it, even in the
+  /// unused capacity: memmove takes ranges that overlap.
   void Append(const T* p, ssize_t pn) {
     const ssize_t oldSize = size();
     if (pn > capacity() - oldSize)
@@ -879,8 +879,8 @@ private:
   /// Converts bytes to elements. An unsigned division is a shift, and compilers see that it is never
   /// negative.
   static ssize_t Elements(ssize_t bytes) { return ssize_t(static_cast<std::size_t>(bytes) / sizeof(T)); }
-  // Every insertion, assignment and replacement resizes a range of elements and overwrites it. Only push_back
-  // of one element is left to the buffer.
+  // Every insertion, assignment and replacement resizes a range of elements and overwrites it. The exceptions
+  // are push_back of one element, and Append() to a vector with room.
   T* ResizeRange(ssize_t i, ssize_t n, ssize_t newN);
   void ReplaceRange(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRange(ssize_t i, ssize_t n, ssize_t count, T x);
@@ -1005,8 +1005,8 @@ template <class T> void swap(xvector<T>& a, xvector<T>& b) noexcept { a.swap(b);
 /// Changes the size of the range of n elements at index i to newN, and returns its beginning. The caller
 /// overwrites the whole range.
 ///
-///     |  before  |      n      |      behind      |
-///     |  before  |         newN         |      behind      |
+///     |  before  |      n      |      after       |
+///     |  before  |         newN         |      after       |
 template <class T> T* xvector<T>::ResizeRange(ssize_t i, ssize_t n, ssize_t newN) {
   if (i + n == size() && newN > n)
     m_buffer.growbytes(Bytes(newN - n));

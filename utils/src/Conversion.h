@@ -1,4 +1,4 @@
-// What the conversions share: the loop that all of them are made of, and what they know of malformed text.
+// What the conversions share: their common loop, and functions for malformed text.
 
 #pragma once
 
@@ -15,31 +15,33 @@ namespace mirel::detail {
 /// How a conversion ended.
 template <class CharIn> struct Appended {
   const CharIn* malformed; ///< the first malformed sequence, at which a strict conversion stopped; or null
-  ssize_t replacements;    ///< how many U+FFFD a lossy conversion has put in the place of such
+  ssize_t replacements;    ///< how many U+FFFD a lossy conversion wrote for malformed text
 };
 
-/// Converts [src, end) by the given kernels, and without any if they are null, behind what dst holds.
+/// Appends the conversion of [src, end) to dst, by the given kernels; by the scalar path alone if they are
+/// null.
 template <class CharOut, class CharIn>
 Appended<CharIn> AppendUtf(const Kernels* kernels, basic_xstring<CharOut>& dst, const CharIn* src,
                            const CharIn* end, OnMalformed onMalformed);
 
-/// FindMalformed() by the given kernels, and without any if they are null: the first malformed sequence of
-/// [p, end), or end.
+/// Returns the first malformed sequence of [p, end), or end, by the given kernels; by the scalar path alone
+/// if they are null.
 template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end);
 
-/// The lengths of [p, end), malformed text counted as U+FFFD, by the given kernels or without any.
+/// Returns the lengths of [p, end), malformed text counted as U+FFFD, by the given kernels; by the scalar
+/// path alone if they are null.
 template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* end);
 
-/// What is wrong with the sequence at p, which Decode() finds to have the given length.
+/// Returns what is wrong with the sequence at p, as Decode() returned it.
 MalformedReason ReasonOf(const char8* p, const char8* end, const Sequence& sequence);
 MalformedReason ReasonOf(const char16* p, const char16* end, const Sequence& sequence);
 
-/// How many units at the end of [begin, end) begin a sequence that units behind them may complete.
+/// Returns how many units at the end of [begin, end) begin a sequence that further units may complete.
 ssize_t CutOffAtEnd(const char8* begin, const char8* end);
 ssize_t CutOffAtEnd(const char16* begin, const char16* end);
 
-/// Skips ASCII at the beginning of a text that the kernels don't take, eight bytes at a time: 14 bytes are
-/// checked in half the time that single ones take.
+/// Skips ASCII at the beginning of a text that the kernels don't take, eight bytes at a time: that checks 14
+/// bytes in half the time of a loop over single bytes.
 inline const char8* SkipAscii(const char8* p, const char8* end) {
   for (uint64_t word = 0; end - p >= ssize_t(sizeof(word)); p += sizeof(word)) {
     std::memcpy(&word, p, sizeof(word));
@@ -50,12 +52,12 @@ inline const char8* SkipAscii(const char8* p, const char8* end) {
 }
 inline const char16* SkipAscii(const char16* p, const char16*) { return p; }
 
-/// Shorter texts are decoded one code point at a time in the time that a kernel takes to copy them into a
-/// block.
+/// The least units that kernels are worth: a shorter text is decoded one code point at a time in the time
+/// that a kernel takes to copy it into a block.
 constexpr ssize_t kLeastForKernels = 24;
 
-/// After malformed text, so many units must be well-formed before the kernels are tried again: where faults
-/// are dense, each trial would be in vain.
+/// After malformed text, this many units must be well-formed before the kernels are tried again: where
+/// malformed sequences are dense, each trial would be in vain.
 constexpr ssize_t kWellFormedBeforeKernels = 64;
 
 } // namespace mirel::detail

@@ -1,13 +1,13 @@
-// The conversions in wide instructions, compiled once for each instruction set by Kernels.cpp.
+// The conversions in SIMD instructions, compiled once for each instruction set by Kernels.cpp.
 //
-// A text is converted by blocks. For every position of a block it is computed what a code point beginning
-// there would give, also where none begins. A byte shuffle from a table then drops the positions where none
-// begins. No branch depends on where code points begin. Masks with one bit for each position tell whether the
-// block is well-formed; one that isn't is left to the scalar path, which finds the fault. From there a lossy
-// conversion goes on by blocks in which masks tell where a maximal subpart begins; there U+FFFD takes the
-// place of what was computed. A block ends before a code point that its end would cut off, so no state passes
-// from one block to the next. The last block ends where the text ends. It overlaps what is converted already,
-// and may store that part again.
+// A text is converted in blocks. For every position of a block the kernel computes what a code point that
+// begins there would give, even where none begins. A byte shuffle from a table then drops the positions where
+// none begins. No branch depends on where code points begin. Masks with one bit for each position tell
+// whether the block is well-formed; one that isn't is left to the scalar path, which finds the malformed
+// sequence. From there a lossy conversion goes on in blocks whose masks tell where a maximal subpart begins;
+// there U+FFFD replaces what was computed. A block ends before a code point that its end would cut off, so no
+// state passes from one block to the next. The last block ends where the text ends. It overlaps what has been
+// converted, and may store that part again.
 //
 // There is no include guard: the file is included once for each instruction set.
 
@@ -23,8 +23,8 @@ namespace {
 
 namespace hn = hwy::HWY_NAMESPACE;
 
-using Wide = hn::ScalableTag<uint8_t>;    // as wide as the instruction set has them
-using Narrow = hn::FixedTag<uint8_t, 16>; // for short texts, and for shuffles, which go by 16 bytes
+using Wide = hn::ScalableTag<uint8_t>;    // the widest of the instruction set
+using Narrow = hn::FixedTag<uint8_t, 16>; // for short texts, and for shuffles, which work on 16 bytes
 template <class D> using ToUnits = hn::Repartition<uint16_t, D>;
 template <class D> constexpr ssize_t kLanes = static_cast<ssize_t>(hn::MaxLanes(D()));
 
@@ -33,7 +33,7 @@ template <class D> constexpr ssize_t kLanes = static_cast<ssize_t>(hn::MaxLanes(
 HWY_INLINE ssize_t Count(uint64_t bits) { return static_cast<ssize_t>(hwy::PopCount(bits)); }
 constexpr uint64_t FirstBits(ssize_t n) { return n < 64 ? (uint64_t{1} << n) - 1 : ~uint64_t{0}; }
 
-/// The highest bit of each byte; that of the first byte is the lowest.
+/// Returns the highest bit of each byte; the first byte gives the lowest bit of the result.
 template <class D> HWY_INLINE uint64_t HighBits(D, hn::Vec<D> v) {
   const hn::RebindToSigned<D> di;
   uint64_t bits = 0;
@@ -50,7 +50,7 @@ template <class D> HWY_INLINE hn::Mask<D> MaskOf(D d, uint64_t bits) {
 
 template <class D> HWY_INLINE hn::Vec<D> Repeat(D d, uint8_t x) { return hn::Load(d, kRepeats.rows[x]); }
 
-// Bytes have no shifts of their own: these shift units of two bytes, and keep bits that stay in their byte.
+// There are no shifts of bytes: these shift 16-bit units, and the mask kept drops the bits of the other byte.
 template <int kBits, class D> HWY_INLINE hn::Vec<D> Left(D d, hn::Vec<D> v, uint8_t kept) {
   return hn::And(hn::BitCast(d, hn::ShiftLeft<kBits>(hn::BitCast(ToUnits<D>(), v))), Repeat(d, kept));
 }
@@ -71,8 +71,8 @@ template <class D> HWY_INLINE hn::Mask<D> IsFrom80Below(D d, hn::Vec<D> v, uint8
 }
 template <class D> HWY_INLINE hn::Mask<D> IsNonAscii(D d, hn::Vec<D> v) { return IsFrom80Below(d, v, 0); }
 
-/// yes where the mask is set, no elsewhere. Where plain char is unsigned, g++ 12 takes a blend of bytes for
-/// one that never blends, since it compares the mask with 0 as char.
+/// Returns yes where the mask is set, no elsewhere. If plain char is unsigned, g++ 12 miscompiles a blend of
+/// bytes: it compares the mask with 0 as char, and never blends.
 template <class M, class V> HWY_INLINE V Select(M mask, V yes, V no) {
 #if defined(__CHAR_UNSIGNED__) && HWY_ARCH_X86
   return hn::Or(hn::IfThenElseZero(mask, yes), hn::IfThenZeroElse(mask, no));
@@ -91,7 +91,7 @@ template <int k, class D> HWY_INLINE hn::Vec<Narrow> SixteenBytes(D, hn::Vec<D> 
     return hn::UpperHalf(hn::Half<D>(), v);
 }
 
-/// The bytes from the n-th on of a vector and the one behind it.
+/// Returns the vector that begins at the n-th byte of v, if next follows v.
 template <int n, class D> HWY_INLINE hn::Vec<D> Window(D d, hn::Vec<D> v, hn::Vec<D> next) {
   if constexpr (n == 0)
     return v;
@@ -114,7 +114,7 @@ template <class Word> HWY_INLINE uint64_t LoadWord(const uint8_t* p) {
   return word;
 }
 
-/// The n units at from, but no more than 16 bytes of them, and zeros behind them.
+/// Loads the given number of units, at most 16 bytes of them, followed by zeros.
 template <class Unit> HWY_INLINE hn::Vec<Narrow> LoadPart(const Unit* from, ssize_t units) {
   const hn::Repartition<uint64_t, Narrow> d;
   const uint8_t* const p = BytesOf(from);
@@ -133,8 +133,8 @@ template <class Unit> HWY_INLINE hn::Vec<Narrow> LoadPart(const Unit* from, ssiz
 }
 
 /// Stores what the shuffle for a mask keeps of 16 bytes: kLeast of them, and kEach for each of the mask's
-/// bits. All 16 bytes at out are written. The lowest 12 bits of mask16 are 16 times the mask, which is the
-/// offset of its row. Returns the end of what is kept.
+/// bits. All 16 bytes at out are written. The mask is in bits 4 to 11 of mask16, where it is the offset of
+/// its row. Returns the end of what is kept.
 template <int kLeast, int kEach>
 HWY_INLINE uint8_t* StoreKept(hn::Vec<Narrow> v, const Shuffles& shuffles, uint64_t mask16, uint8_t* out) {
   const Narrow d;
@@ -142,8 +142,8 @@ HWY_INLINE uint8_t* StoreKept(hn::Vec<Narrow> v, const Shuffles& shuffles, uint6
   return out + kLeast + kEach * Count(mask16 & 0xFF0);
 }
 
-/// Stores what shuffles keep of vectors: of the first 16 bytes of each, by its mask as StoreKept() takes it,
-/// then of the second, by the bits from the 16th on.
+/// Stores what the shuffles keep of vectors: first of the lower 16 bytes of each, by its mask as StoreKept()
+/// takes it, then of the upper 16 bytes, by the mask's bits from the 16th on.
 template <int kLeast, int kEach, class D, std::size_t n>
 HWY_INLINE uint8_t* StoreHalves(D d, const hn::Vec<D> (&vectors)[n], const Shuffles& shuffles,
                                 const uint64_t (&masks)[n], uint8_t* out) {
@@ -155,7 +155,7 @@ HWY_INLINE uint8_t* StoreHalves(D d, const hn::Vec<D> (&vectors)[n], const Shuff
   return out;
 }
 
-/// Stores what the mask keeps of positions of two bytes, the first one of which comes from even.
+/// Stores what the mask keeps of positions of two bytes, one of even and then one of odd.
 template <int kLeast, int kEach, class D>
 HWY_INLINE uint8_t* StorePairs(D d, hn::Vec<D> even, hn::Vec<D> odd, const Shuffles& shuffles, uint64_t mask,
                                uint8_t* out) {
@@ -185,8 +185,8 @@ struct Replaced {
 
 /// A conversion under way. A Block has, beside the functions called here:
 /// - kUnits: how many units of the source it has,
-/// - kMost: the most units that its Convert() writes from out on, with those that are no part of the result.
-///   Before out it writes again only what the block's first units gave.
+/// - kMost: the most units that its Convert() writes from out on, those past the result included. Before out
+///   it rewrites only what the block's first units gave.
 template <class In> struct Conversion {
   using Out = OtherUnit<In>;
   const In* p;
@@ -196,12 +196,12 @@ template <class In> struct Conversion {
 
   HWY_INLINE Progress<In> At(Stop stop) const { return {p, out, stop}; }
 
-  /// Converts the units of a block from the from-th, where p is, to before the to-th. What is before them is
-  /// converted already. kEnd: go on at p, which is before the to-th where the block's end cuts a code point
+  /// Converts the units [from, to) of a block. p points at the from-th; those before it have been converted.
+  /// After kEnd the conversion goes on at p, which is before the to-th if the block's end cuts a code point
   /// off.
   template <class Block> HWY_INLINE Stop Convert(const Block& block, ssize_t from, ssize_t to) {
     constexpr ssize_t kMostBytes = Block::kMost * ssize_t(sizeof(Out));
-    // ASCII that ends with the block is all that is written.
+    // ASCII up to the block's end writes nothing past the result.
     const ssize_t room = to == Block::kUnits && block.IsAscii() ? to - from : Block::kMost;
     if (outEnd - out >= room)
       return Accept(block.Convert(from, to, BytesOf(out)));
@@ -224,7 +224,7 @@ template <class In> struct Conversion {
     Stop stop = Stop::kEnd;
     while (stop == Stop::kEnd && end - p >= kUnits && outEnd - out >= Block::kMost)
       stop = Accept(Block::Load(p).Convert(0, kUnits, BytesOf(out)));
-    while (stop == Stop::kEnd && p != end) { // near an end
+    while (stop == Stop::kEnd && p != end) { // near the end of the source or of the room
       const ssize_t from = end - p < kUnits ? kUnits - (end - p) : 0;
       stop = Convert(Block::Load(p - from), from, kUnits);
     }
@@ -262,7 +262,8 @@ Progress<In> ReplaceByBlocks(const In* p, const In* end, OtherUnit<In>* out, Oth
 /// The low and the high bytes of UTF-16 units.
 template <class D> struct Planes { hn::Vec<D> low, high; };
 
-/// The units of the code points that would begin with the bytes of a, if b and c hold the ones behind them.
+/// The units of the code points that would begin with the bytes of a, if b and c hold the bytes one and two
+/// places further on.
 template <int kMaxBytes, class D>
 HWY_INLINE Planes<D> UnitsOf(D d, hn::Vec<D> a, hn::Vec<D> b, hn::Vec<D> c) {
   const auto isTwo = IsFrom80Below(d, a, 0xE0); // or a continuation byte
@@ -284,7 +285,7 @@ HWY_INLINE Planes<D> UnitsOf(D d, hn::Vec<D> a, hn::Vec<D> b, hn::Vec<D> c) {
     high = hn::Or(high, hn::IfThenZeroElse(isTwo, Left<4>(d, a, 0xF0)));
   if constexpr (kMaxBytes > 3) {
     high = Select(isContinuation, hn::Or(hn::And(high, Repeat(d, 0x03)), Repeat(d, 0xDC)), high);
-    // The bits from the 16th on, less 1 as UTF-16 has it.
+    // The bits from the 16th on, less 1, as the high surrogate has them.
     const auto upper = hn::Sub(hn::Or(Left<2>(d, a, 0x1C), Right<4>(d, b, 0x03)), Repeat(d, 1));
     const auto lower = hn::Or(Left<2>(d, b, 0x3C), Right<4>(d, c, 0x03));
     const auto isFour = IsAtLeast(d, a, 0xF0);
@@ -295,15 +296,15 @@ HWY_INLINE Planes<D> UnitsOf(D d, hn::Vec<D> a, hn::Vec<D> b, hn::Vec<D> c) {
   return {Select(isNonAscii, low, a), hn::IfThenElseZero(isNonAscii, high)};
 }
 
-/// Stores the bytes as units.
+/// Stores the bytes, widened to 16-bit units.
 template <class D> HWY_INLINE void StoreWidened(D d, hn::Vec<D> bytes, uint8_t* out) {
   const ToUnits<D> du;
   hn::StoreU(hn::BitCast(d, hn::PromoteTo(du, hn::LowerHalf(bytes))), d, out);
   hn::StoreU(hn::BitCast(d, hn::PromoteTo(du, hn::UpperHalf(hn::Half<D>(), bytes))), d, out + kLanes<D>);
 }
 
-/// How many bytes an end cuts off from their sequence, of at least three. Where the next block begins is
-/// known by these bytes alone, long before the masks are.
+/// Returns how many bytes before end begin a sequence that end cuts off; at least three bytes precede end.
+/// They alone tell where the next block begins, long before the masks do.
 HWY_INLINE ssize_t CutOff(const uint8_t* end) {
   const uint32_t isLead =
       uint32_t{end[-1] >= 0xC0} | uint32_t{end[-2] >= 0xE0} << 1 | uint32_t{end[-3] >= 0xF0} << 2;
@@ -320,15 +321,16 @@ template <int kVectors, class D> struct Utf8Block {
   static HWY_INLINE Utf8Block Load(const char8* p) {
     return {BytesOf(p), hn::LoadU(D(), BytesOf(p) + kUnits - kLanes<D>)};
   }
-  /// The n bytes at p, fewer than the one vector of the block has, and zeros behind them.
+  /// Loads the n bytes at p, fewer than the block's one vector has, followed by zeros.
   static HWY_INLINE Utf8Block Load(const char8* p, ssize_t n) { return {nullptr, LoadPart(p, n)}; }
 
-  /// The vector that begins at the n-th byte of the k-th one; the bytes behind the block are zeros.
+  /// Returns the vector that begins at the n-th byte of the k-th one; bytes past the block are zeros.
   template <int n> HWY_INLINE hn::Vec<D> Get(int k) const {
     return k + 1 < kVectors ? hn::LoadU(D(), p + k * kLanes<D> + n)
                             : Window<n>(D(), lastVector, hn::Zero(D()));
   }
-  /// A bit for each position, of the masks that f gives for the vectors and those one byte further on.
+  /// Returns a bit for each position, from the masks that f gives for each vector and the one a byte further
+  /// on.
   template <class F> HWY_INLINE uint64_t Bits(const F& f) const {
     uint64_t bits = 0;
     for (int k = 0; k < kVectors; ++k)
@@ -336,7 +338,7 @@ template <int kVectors, class D> struct Utf8Block {
     return bits;
   }
 
-  /// The n-th highest bit of each byte, n counted from 0.
+  /// Returns the n-th highest bit of each byte, n counted from 0.
   template <int n> HWY_INLINE uint64_t BitsAt() const {
     uint64_t bits = 0;
     for (int k = 0; k < kVectors; ++k) {
@@ -350,8 +352,8 @@ template <int kVectors, class D> struct Utf8Block {
 
   HWY_INLINE bool IsAscii() const { return BitsAt<0>() == 0; }
 
-  /// The positions of lead bytes that may not stand before the byte behind them: the sequence would be
-  /// overlong, a surrogate, or beyond U+10FFFF.
+  /// Returns the positions of lead bytes that the next byte may not follow: the sequence would be overlong, a
+  /// surrogate, or above U+10FFFF.
   template <bool kHasFourBytes> HWY_INLINE uint64_t BadLeads() const {
     return Bits([](auto lead, auto next) HWY_ATTR {
       const D d;
@@ -366,7 +368,8 @@ template <int kVectors, class D> struct Utf8Block {
     });
   }
 
-  /// Stores the units of the positions whose bits are set, U+FFFD for those that are malformed; their number.
+  /// Stores the units of the positions whose bits are set, U+FFFD for malformed ones. Returns how many they
+  /// are.
   template <int kMaxBytes, bool kReplaces = false>
   HWY_INLINE ssize_t Store(uint64_t keep, uint8_t* const out, uint64_t malformed = 0) const {
     uint8_t* end = out;
@@ -438,7 +441,7 @@ template <int kVectors, class D> struct Utf8Block {
     const hn::Half<hn::RebindToSigned<D>> half;
     for (int k = 0; k < kVectors; ++k) {
       const auto bytes = Get<0>(k), replaced = Select(IsNonAscii(d, bytes), Repeat(d, 0xFD), bytes);
-      // With its sign, FD is widened to FFFD.
+      // Sign extension widens FD to FFFD.
       const auto v = hn::BitCast(hn::RebindToSigned<D>(), replaced);
       hn::StoreU(hn::BitCast(d, hn::PromoteTo(di, hn::LowerHalf(half, v))), d, out + 2 * k * kLanes<D>);
       hn::StoreU(hn::BitCast(d, hn::PromoteTo(di, hn::UpperHalf(half, v))), d, out + (2 * k + 1) * kLanes<D>);
@@ -458,7 +461,7 @@ template <int kVectors, class D> struct Utf8Block {
     const ssize_t stop = kUnits - CutOff(p + kUnits);
     const uint64_t continuations = allContinuations & FirstBits(stop);
     const uint64_t nonAscii = allNonAscii & FirstBits(stop), highest2 = nonAscii & ~continuations;
-    // The lead bytes that may stand before the byte behind them, if that is a continuation byte.
+    // The lead bytes that the next byte may follow, if it is a continuation byte.
     const uint64_t belowC2 = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC2); });
     const uint64_t leads = highest2 & ~belowC2 & ~BadLeads<true>();
     const uint64_t leads3 = leads & BitsAt<2>(), leads4 = leads3 & BitsAt<3>();
@@ -491,10 +494,10 @@ Progress<char8> Utf16FromUtf8(const char8* p, const char8* end, char16* out, cha
 
 // UTF-16 to UTF-8 ----------
 
-/// Units that take at least two, at least three bytes, a bit for each.
+/// A bit for each unit that takes at least two bytes of UTF-8, and for each that takes at least three.
 struct UnitMasks {
   uint64_t two, three;
-  /// The bytes of the first n units.
+  /// Returns how many bytes the first n units take.
   HWY_INLINE ssize_t Bytes(ssize_t n) const {
     return n + Count(two & FirstBits(n)) + Count(three & FirstBits(n));
   }
@@ -507,12 +510,12 @@ template <class Tag> struct Utf16Block {
   static constexpr ssize_t kMost = 3 * kUnits + 4; // the last store is 16 bytes, of which 12 count at most
   static constexpr D d{};
   hn::Vec<D> low, high; ///< the bytes of the units
-  hn::Vec<D> any;       ///< the bits that any of them has, at the same place in two bytes
+  hn::Vec<D> any;       ///< the bitwise or of the block's two vectors of units
 
   static HWY_INLINE Utf16Block Load(const char16* p) {
     return Of(hn::LoadU(d, BytesOf(p)), hn::LoadU(d, BytesOf(p) + kUnits));
   }
-  /// The n units at p, fewer than the block has, and zeros behind them.
+  /// Loads the n units at p, fewer than the block has, followed by zeros.
   static HWY_INLINE Utf16Block Load(const char16* p, ssize_t n) {
     return Of(LoadPart(p, n), n > 8 ? LoadPart(p + 8, n - 8) : hn::Zero(d));
   }
@@ -520,24 +523,24 @@ template <class Tag> struct Utf16Block {
     return {hn::ConcatEven(d, second, first), hn::ConcatOdd(d, second, first), hn::Or(first, second)};
   }
 
-  /// Bytes from 80 on where the unit isn't ASCII, and where it takes three bytes.
+  /// Returns bytes whose highest bit tells that the unit isn't ASCII.
   HWY_INLINE hn::Vec<D> NonAscii() const { return hn::Or(hn::SaturatedAdd(high, Repeat(d, 0x7F)), low); }
-  /// Without the bytes apart, which a block of ASCII then doesn't need.
+  /// Returns whether the block is ASCII, from the units as loaded: ASCII then needs no high bytes.
   HWY_INLINE bool IsAscii() const {
     const ToUnits<D> du;
     return hn::AllTrue(du, hn::Eq(hn::And(hn::BitCast(du, any), hn::Set(du, 0xFF80)), hn::Zero(du)));
   }
   HWY_INLINE hn::Vec<D> ThreeBytes() const { return hn::SaturatedAdd(high, Repeat(d, 0x78)); }
-  /// The units whose high byte is kind in the bits of mask.
+  /// Returns the units whose high byte has the value kind in the bits of mask.
   HWY_INLINE hn::Mask<D> Is(uint8_t kind, uint8_t mask) const {
     return IsEqual(d, hn::And(high, Repeat(d, mask)), kind);
   }
-  /// The bits of the units from the sixth on, as many as are kept.
+  /// Returns the bits of each unit from the sixth on, masked by kept.
   HWY_INLINE hn::Vec<D> UpperBits(uint8_t kept) const {
     return hn::Or(Left<2>(d, high, kept & 0xFC), Right<6>(d, low, 0x03));
   }
 
-  /// Stores a block without units from 800 on; past the end of the bytes.
+  /// Stores a block without units from 800 on. Returns the end of its bytes.
   HWY_INLINE uint8_t* StoreTwo(uint64_t two, uint8_t* out) const {
     const auto lead = hn::Or(UpperBits(0x1F), Repeat(d, 0xC0));
     const auto first = Select(IsNonAscii(d, NonAscii()), lead, low);
@@ -545,14 +548,14 @@ template <class Tag> struct Utf16Block {
     return StorePairs<8, 1>(d, first, last, kKeepTwoBytes, two, out);
   }
 
-  /// Stores any block; past the end of the bytes.
+  /// Stores any block. Returns the end of its bytes.
   template <bool kHasSurrogates> HWY_INLINE uint8_t* StoreThree(const UnitMasks& masks, uint8_t* out) const {
     const auto marker = Repeat(d, 0x80), lead3 = hn::Or(Right<4>(d, high, 0x0F), Repeat(d, 0xE0));
     auto first = Select(IsNonAscii(d, ThreeBytes()), lead3, hn::Or(UpperBits(0x1F), Repeat(d, 0xC0)));
     first = Select(IsNonAscii(d, NonAscii()), first, low);
     auto middle = hn::Or(UpperBits(0x3F), marker), last = hn::Or(hn::And(low, Repeat(d, 0x3F)), marker);
     if constexpr (kHasSurrogates) {
-      // A high surrogate gives three bytes, the third with bits of the low one, and the low one the last
+      // A high surrogate gives three bytes, the third with bits of the low surrogate; that gives the last
       // byte.
       const auto isHigh = Is(0xD8, 0xFC), isLow = Is(0xDC, 0xFC);
       const auto upper = hn::Add(UpperBits(0x0F), Repeat(d, 1)); // the bits from the 16th on
@@ -613,7 +616,7 @@ template <class Tag> struct Utf16Block {
                              kReplaceUnits, {unpaired << 4, unpaired >> 4}, out);
   }
 
-  /// The block with U+FFFD in the lanes of the mask.
+  /// Returns the block with U+FFFD in the lanes of the mask.
   HWY_INLINE Utf16Block WithReplaced(hn::Mask<D> mask) const {
     return {Select(mask, Repeat(d, 0xFD), low), Select(mask, Repeat(d, 0xFF), high), any};
   }
@@ -650,7 +653,7 @@ Progress<char16> Utf8FromUtf16(const char16* p, const char16* end, char8* out, c
 
 // ASCII to UTF-16 ----------
 
-/// Goes on from the i-th of n bytes by whole vectors; where it ends.
+/// Converts whole vectors from the i-th of n bytes on. Returns where it stopped.
 template <class D> HWY_INLINE ssize_t WidenAscii(D d, const char8* src, ssize_t i, ssize_t n, char16* dst) {
   for (; n - i >= kLanes<D>; i += kLanes<D>) {
     const auto bytes = hn::LoadU(d, BytesOf(src + i));

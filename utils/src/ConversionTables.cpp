@@ -6,8 +6,8 @@ namespace mirel::detail {
 
 namespace {
 
-/// Shuffles to which addBytes(mask, k, add) adds what takes the place of byte k: add() adds a byte where the
-/// lowest bit of its second argument is set.
+/// Makes a shuffle for each mask. addBytes(mask, k, add) adds the bytes that take the place of byte k:
+/// add(from, bits) adds byte from if the lowest bit of bits is set.
 template <class F> constexpr Shuffles MakeShuffles(const F& addBytes) {
   Shuffles shuffles{};
   for (unsigned mask = 0; mask < 256; ++mask) {
@@ -22,15 +22,15 @@ template <class F> constexpr Shuffles MakeShuffles(const F& addBytes) {
   return shuffles;
 }
 
-/// Two bytes that may not follow each other: the ranges of the first and of the second, and the bit for them.
+/// A fault of two adjacent bytes: the range of the first, the range of the second, and the bit of the fault.
 struct PairFault {
   int first, firstLast, second, secondLast, bit;
 };
-/// From table 3-7 of the Unicode Standard. The two ranges that share a bit have the second byte in common, or
-/// the first, so that no nibbles of the one go with those of the other.
+/// From table 3-7 of the Unicode Standard. Two faults that share a bit have the same range for one of the
+/// bytes, so that the nibbles of the one never combine with those of the other to a third.
 constexpr PairFault kFaults[] = {
     {0xC0, 0xFF, 0x00, 0x7F, 0}, {0xC0, 0xFF, 0xC0, 0xFF, 0}, // a continuation byte is missing
-    {0x00, 0x7F, 0x80, 0xBF, 1},                              // one that continues nothing
+    {0x00, 0x7F, 0x80, 0xBF, 1},                              // an unexpected continuation byte
     {0xE0, 0xE0, 0x80, 0x9F, 2},                              // overlong
     {0xED, 0xED, 0xA0, 0xBF, 3},                              // a surrogate
     {0xC0, 0xC1, 0x80, 0xBF, 4},                              // overlong

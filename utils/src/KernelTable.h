@@ -1,4 +1,4 @@
-// The conversions and searches in wide instructions: a table of functions for each instruction set.
+// The conversions and searches in SIMD instructions: a table of functions for each instruction set.
 //
 // They are written once, in the vocabulary of Google Highway, and compiled once for each instruction set
 // (Kernels.cpp). Everything has a scalar path with the same results, for processors that have none of these
@@ -29,10 +29,10 @@ template <class T> struct Progress {
 /// The lengths of a text.
 struct Lengths {
   ssize_t codePoints;
-  int64 units; ///< in the other encoding, which in 32 bits may be more than fit in memory
+  int64 units; ///< in the other encoding; in a 32-bit program they may not fit in memory
 };
 
-/// How far a text was measured, and what that part comes to.
+/// How far a text was measured, and the lengths of that part.
 template <class T> struct Measured {
   const T* p;
   Lengths lengths;
@@ -43,30 +43,31 @@ template <class T> struct Measured {
 template <class T> struct UnitKernels {
   using Out = OtherUnit<T>;
   Progress<T> (*convert)(const T* p, const T* end, Out* out, Out* outEnd);
-  /// Goes on from malformed text by blocks, with U+FFFD for each maximal subpart, and adds how many there
-  /// were. It stops before a well-formed block, and where text or room is short of a block, which may be at
-  /// once.
+  /// Converts blocks from malformed text on, with U+FFFD for each maximal subpart, and adds how many there
+  /// were to replacements. It stops before a well-formed block, or when less than a block of text or room is
+  /// left; either may be the case at once.
   Progress<T> (*replace)(const T* p, const T* end, Out* out, Out* outEnd, ssize_t& replacements);
-  /// Goes on up to a place, where a sequence begins, before which the text is well-formed, and which is the
-  /// end or not far before malformed text.
+  /// Returns the end of a well-formed prefix that cuts no sequence off: the end of the text, or a place not
+  /// far before malformed text.
   const T* (*skip)(const T* p, const T* end);
-  /// Goes on as far, and measures.
+  /// Measures the prefix that skip() returns the end of.
   Measured<T> (*measure)(const T* p, const T* end);
   SearchKernels<T> searches;
 };
 
-/// What one instruction set offers.
+/// What one instruction set offers for text of both widths.
 struct Kernels : UnitKernels<char8>, UnitKernels<char16> {
   const char* name;
-  /// As Utf16FromAscii(), for the first of n units; how many they are. It leaves less than a vector.
+  /// Converts the first of n units as Utf16FromAscii() does. Returns how many; fewer than a vector has are
+  /// left.
   ssize_t (*utf16FromAscii)(const char8* src, ssize_t n, char16* out);
 };
 
-// The tables of the conversions, once for all instruction sets. They are defined in a file of their own: g++
-// builds a vector whose value it sees anew each time it is used, with three instructions in the loop, where a
-// load is part of the instruction that uses it.
+// The tables of the conversions, once for all instruction sets. They are defined in a file of their own: a
+// vector whose value g++ sees is built anew at each use, with three instructions in the loop. A load is part
+// of the instruction that uses it.
 
-/// A byte shuffle for each mask of positions: it drops positions, and moves together what it keeps.
+/// A byte shuffle for each mask of positions, which drops or replaces positions and leaves no gaps.
 struct alignas(64) Shuffles {
   uint8_t rows[256][16];
 };
@@ -77,33 +78,33 @@ extern const Shuffles kKeepTwoBytes;
 /// For 4 positions of four bytes, the second of them unused: keeps the first byte of each, the last of those
 /// whose bit is set in the lower half of the mask, and the third of those whose bit is set in the upper half.
 extern const Shuffles kKeepThreeBytes;
-/// For 8 bytes, and the 3 bytes of U+FFFD behind them, which take the place of those whose bit is set. The
-/// rows of more than four bits are cut off.
+/// For 8 bytes followed by the 3 bytes of U+FFFD: replaces those whose bit is set by U+FFFD. Rows of masks
+/// with more than four bits are cut off.
 extern const Shuffles kReplaceUnits;
 
-/// What can be wrong with two bytes that follow each other, a bit for each fault: those that the nibbles of
-/// the first and the high nibble of the second have in common. The highest bit stands for two continuation
-/// bytes, which are a fault where nothing asks for them.
+/// What can be wrong with two adjacent bytes, a bit for each fault. Two bytes have a fault if both nibbles of
+/// the first and the high nibble of the second have its bit. The highest bit stands for two continuation
+/// bytes, which are a fault unless a lead byte requires them.
 struct alignas(16) PairFaults {
   uint8_t firstHigh[16], firstLow[16], secondHigh[16];
 };
 extern const PairFaults kPairFaults;
 
-/// Each byte, as often as the widest vector has bytes.
+/// Each value of a byte, repeated to fill the widest vector.
 struct alignas(64) Repeats {
   uint8_t rows[256][32];
 };
 extern const Repeats kRepeats;
 
-/// The k-th best kernels that this processor has, counted from 0; null if there are fewer. It asks the
-/// processor each time: there is no state to initialise, so that it also works before main() and from any
+/// Returns the k-th best kernels that this processor has, counted from 0; null if there are fewer. It asks
+/// the processor each time: there is no state to initialise, so that it also works before main() and from any
 /// thread.
 const Kernels* KernelsAt(int k);
 
-/// The best kernels that this processor has, or null. About 1 ns.
+/// Returns the best kernels that this processor has, or null, in about 1 ns.
 inline const Kernels* BestKernels() { return KernelsAt(0); }
 
-/// The scalar path of the searches.
+/// Returns the scalar path of the searches.
 template <class T> const SearchKernels<T>& ScalarSearches();
 
 } // namespace mirel::detail

@@ -22,7 +22,7 @@ private:
 };
 
 /// Returns the first of [p, end) that is in a set or, if !isMember, isn't; end if there is none. The bits are
-/// made only after enough units to be worth it.
+/// set up only after enough units without a hit to be worth it.
 template <class It, class T> It FindInSet(It p, It end, const T* y1, const T* y2, bool isMember) {
   const ssize_t near = 8 + ssize_t(sizeof(UnitBits<T>) / 8 / (std::size_t(y2 - y1) + 1));
   for (const It stop = end - p < near ? end : p + near; p != stop; ++p)

@@ -1,8 +1,8 @@
-// The searches in wide instructions, compiled once for each instruction set by Kernels.cpp.
+// The searches in SIMD instructions, compiled once for each instruction set by Kernels.cpp.
 //
-// A search is a scan with a predicate, which tells the lanes of a vector that are hits. A scan goes by
-// vectors; the last one ends with the range, and so may begin with units that are known to be no hits. A
-// range shorter than a vector goes by smaller ones.
+// A search is a scan with a predicate, which gives the mask of the lanes that are hits. A scan reads whole
+// vectors. The last one ends with the range, and so may overlap units that are known to be no hits. A range
+// shorter than a vector is read in smaller ones.
 //
 // There is no include guard: the file is included once for each instruction set.
 
@@ -29,8 +29,8 @@ template <class D, class T> HWY_INLINE hn::Mask<D> EqualTo(D d, hn::Vec<D> v, T 
   return hn::Eq(v, hn::Set(d, static_cast<Lane<T>>(x)));
 }
 
-// Predicates: At() for one unit, Lanes() for the units of a vector. Those that are cheap look at four vectors
-// between branches.
+// Predicates: At() for one unit, Lanes() for the units of a vector. With a cheap predicate, a scan tests four
+// vectors between branches.
 
 /// Whether a unit is v.
 template <class T> struct Equal {
@@ -54,12 +54,12 @@ template <class T> struct Different {
   }
 };
 
-// Scans: the first hit, in reverse the last one; null if there is none.
+// Scans return the first hit, in reverse the last one; null if there is none.
 
-/// In the vector at p.
+/// Scans the vector at p.
 template <bool kReverse, class D, class T, class Is>
 HWY_INLINE const T* HitIn(D d, const T* p, const Is& is) {
-  const hn::Repartition<uint8_t, D> d8; // masks of wider lanes take longer to become bits
+  const hn::Repartition<uint8_t, D> d8; // converting masks of wider lanes to bits takes longer
   uint64_t bits = 0;
   hn::StoreMaskBits(d8, hn::MaskFromVec(hn::BitCast(d8, hn::VecFromMask(d, is.Lanes(d, p)))),
                     reinterpret_cast<uint8_t*>(&bits));
@@ -76,11 +76,11 @@ HWY_INLINE bool HasHit(D d, const T* p, const T* q, const T* r, const T* s, cons
       d, hn::Or(hn::Or(is.Lanes(d, p), is.Lanes(d, q)), hn::Or(is.Lanes(d, r), is.Lanes(d, s))));
 }
 
-/// In one vector or more.
+/// Scans a range of one vector or more.
 template <bool kReverse, class D, class T, class Is>
 HWY_INLINE const T* ScanVectors(D d, const T* x1, const T* x2, const Is& is) {
   constexpr std::size_t n = hn::MaxLanes(D());
-  // Without a sign: i passes the length, which in 32 bits may be the most that an ssize_t can count.
+  // Unsigned: i may exceed the length, which in a 32-bit program may be the largest ssize_t.
   const std::size_t length = static_cast<std::size_t>(x2 - x1), last = length - n;
   const auto at = [=](std::size_t i) { return kReverse ? x2 - n - i : x1 + i; };
   const auto clamped = [=](std::size_t i) { return at(i < last ? i : last); };
@@ -100,7 +100,7 @@ HWY_INLINE const T* ScanVectors(D d, const T* x1, const T* x2, const Is& is) {
   return nullptr;
 }
 
-/// In one or two vectors.
+/// Scans a range of one to two vectors.
 template <bool kReverse, class D, class T, class Is>
 HWY_INLINE const T* ScanEnds(D d, const T* x1, const T* x2, const Is& is) {
   const T* const last = x2 - hn::MaxLanes(d);
@@ -108,7 +108,7 @@ HWY_INLINE const T* ScanEnds(D d, const T* x1, const T* x2, const Is& is) {
   return hit != nullptr ? hit : HitIn<kReverse>(d, kReverse ? x1 : last, is);
 }
 
-/// Unit by unit.
+/// Scans unit by unit.
 template <bool kReverse, class T, class Is>
 HWY_INLINE const T* ScanUnits(const T* x1, const T* x2, const Is& is) {
   for (ssize_t i = 0, n = x2 - x1; i < n; ++i)
@@ -142,7 +142,7 @@ template <class T> ssize_t EqualUnits(const T* x, const T* y, ssize_t n) {
   return HitOrEnd(Scan<false>(x, x + n, Different<T>{x, y}), x + n) - x;
 }
 
-/// Takes from [p, end) what a scan has passed with a hit.
+/// Removes from [p, end) a hit and the units that the scan passed before it. Returns how many units that is.
 template <bool kReverse, class T> HWY_INLINE ssize_t PassHit(const T*& p, const T*& end, const T* hit) {
   const ssize_t length = end - p;
   (kReverse ? end : p) = kReverse ? hit : hit + 1;
@@ -165,7 +165,7 @@ public:
     return hn::And(isEnd, EqualTo(d, LoadUnits(d, p + m_last / 2), m_middle));
   }
 
-  /// As a scan of [p, end). The first unit alone is found faster, unless it is too frequent.
+  /// Scans [p, end). The first unit alone is found faster, unless it is too frequent.
   template <bool kReverse> const T* Next(const T* p, const T* end) {
     while (end - p >= kRare && m_credit > 0) {
       const T* const hit = FindUnit<kReverse>(p, end, m_first);
@@ -182,7 +182,7 @@ private:
   static constexpr ssize_t kRare = 256;
   ssize_t m_last; ///< the index of the last unit
   T m_first, m_middle, m_final;
-  int64 m_credit = 2 * kRare; // may pass the length searched
+  int64 m_credit = 2 * kRare; // 64 bits, since it may exceed the length
 };
 
 template <bool kReverse, class T>
@@ -193,7 +193,7 @@ const T* FindSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
   NeedleStart<T> start(y1, y2);
   Credit credit(length);
   const T* p = x1;
-  const T* end = x2 - (length - 1); // past the places where the needle has room
+  const T* end = x2 - (length - 1); // past the last place where the needle fits
   ssize_t equal = 0;
   for (ssize_t passed = 0; credit.Allows(equal, passed);) {
     const T* const hit = start.template Next<kReverse>(p, end);
@@ -204,15 +204,15 @@ const T* FindSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
       return hit;
     passed += PassHit<kReverse>(p, end, hit);
   }
-  const auto& scalar = ScalarSearches<T>(); // goes over to Two-Way
+  const auto& scalar = ScalarSearches<T>(); // changes to Two-Way
   end += length - 1;
   const T* const q = (kReverse ? scalar.findLastSubSequence : scalar.findFirstSubSequence)(p, end, y1, y2);
   return q == end ? x2 : q;
 }
 
-// Sets: Lanes() tells the lanes of a vector that are members.
+// Sets: Lanes() gives the mask of the lanes that are members.
 
-/// A set as it is given.
+/// A set as it is given: Lanes() compares with every member.
 template <class T> struct Members {
   static constexpr bool kIsCheap = false;
   const T *y1, *y2;
@@ -225,7 +225,7 @@ template <class T> struct Members {
   }
 };
 
-/// For each nibble its bit in a byte, which it shares with one other.
+/// For each nibble its bit in a byte, which nibbles 8 apart share.
 alignas(16) constexpr uint8_t kNibbleBits[16] = {1, 2, 4, 8, 16, 32, 64, 128, 1, 2, 4, 8, 16, 32, 64, 128};
 
 template <class D> HWY_INLINE hn::Vec<D> Lookup(D d, const uint8_t (&table)[16], hn::Vec<D> indices) {
@@ -236,14 +236,14 @@ template <class D> HWY_INLINE hn::Vec<D> HighNibbles(D d, hn::Vec<D> v) {
   return hn::And(hn::BitCast(d, hn::ShiftRight<4>(hn::BitCast(d16, v))), hn::Set(d, 0xF));
 }
 
-/// A set of bytes: for each low nibble the bits of the high nibbles with which it is a member, those below 8
-/// in one table and the others in another.
+/// A set of bytes, in two tables by the low nibble. A bit is set for each high nibble that makes a member:
+/// below 8 in low, from 8 on in high.
 struct ByteTable {
-  static constexpr bool kIsCheap = true, isExact = true; ///< a table is that of the set only where isExact
+  static constexpr bool kIsCheap = true, isExact = true; ///< isExact: the table has no other members
   alignas(16) uint8_t low[16], high[16];
 
   ByteTable(const char8* y1, const char8* y2) {
-    alignas(16) uint8_t isMember[256] = {}; // all bits where it is
+    alignas(16) uint8_t isMember[256] = {}; // 0xFF for a member
     for (; y1 != y2; ++y1)
       isMember[UnitValue(*y1)] = 0xFF;
     const TagOf<char8, 16> d;
@@ -257,28 +257,28 @@ struct ByteTable {
     hn::Store(highs, d, high);
   }
   template <class D> HWY_INLINE hn::Mask<D> Lanes(D d, hn::Vec<D> v) const {
-    const auto inLow = hn::And(v, hn::Set(d, 0x8F)); // an index with the highest bit looks up a zero
+    const auto inLow = hn::And(v, hn::Set(d, 0x8F)); // an index with its highest bit set gives 0
     const auto inHigh = hn::Xor(inLow, hn::Set(d, 0x80));
     const auto bits = hn::Or(Lookup(d, low, inLow), Lookup(d, high, inHigh));
     return hn::TestBit(bits, Lookup(d, kNibbleBits, HighNibbles(d, v)));
   }
 };
 
-/// A set of 16-bit units by rows, which are the units that differ in the lowest nibble only. Each row has one
-/// of eight bits. The table of each nibble has it for the values that a member of the row has there, and a
-/// unit for which all four tables have a common bit is a member, if no two rows share one.
+/// A set of 16-bit units by rows; the units of a row differ in the lowest nibble only. Each row has one of
+/// eight bits. Each of the four nibbles has a table, which holds that bit for the values that members of the
+/// row have there. If no two rows share a bit, a unit is a member where all four tables have a bit in common.
 struct RowTables {
   static constexpr bool kIsCheap = true;
   bool isExact = true;
   alignas(16) uint8_t tables[4][16] = {};
 
   RowTables(const char16* y1, const char16* y2) {
-    uint16_t rows[256]; // by their lowest byte
+    uint16_t rows[256]; // by their low byte
     uint8_t bits[256] = {};
     for (int count = 0; y1 != y2; ++y1) {
       const unsigned row = *y1 >> 4u, k = row & 0xFF;
       if (bits[k] == 0 || rows[k] != row) {
-        isExact = count < 8; // a row whose place another has taken meanwhile counts again
+        isExact = count < 8; // a row that another has displaced counts again
         rows[k] = static_cast<uint16_t>(row);
         bits[k] = kNibbleBits[count++ % 8];
         for (unsigned nibble = 1; nibble < 4; ++nibble)
@@ -322,7 +322,7 @@ const T* FindInSetByTable(const T* x1, const T* x2, const T* y1, const T* y2) {
   return search(x1, x2, y1, y2);
 }
 
-/// Most hits are near, and many texts short: a table is made only after units that are no hits.
+/// Most hits are near, and many texts are short: a table is made only after some units without a hit.
 template <bool kReverse, bool kIsMember, class T>
 const T* FindInSet(const T* x1, const T* x2, const T* y1, const T* y2) {
   const ssize_t length = x2 - x1, size = y2 - y1;

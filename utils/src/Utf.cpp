@@ -1,7 +1,8 @@
 // The conversions between UTF-8, UTF-16 and ASCII.
 //
-// Kernels convert what is well-formed, straight into the destination's storage. What they don't take, and all
-// text on processors without kernels, goes through the traits of Boost, one code point at a time.
+// Kernels convert blocks of text, straight into the destination's storage. What they leave, and all text on
+// processors without kernels, is converted one code point at a time: by the traits of Boost.Locale, and from
+// malformed text on, in lossy conversions, by utils/CodePoints.h.
 
 #include <utils/Storage.h>
 #include <utils/Utf.h>
@@ -44,12 +45,12 @@ namespace detail {
 
 namespace {
 
-/// Converts one code point at a time, and judges what is well-formed. It isn't inlined: 14 units that the
-/// kernels convert would take 1.5 times as long.
+/// Converts one code point at a time, and decides what is well-formed. Never inlined: otherwise 14 units that
+/// the kernels convert take 1.5 times as long.
 template <class CharOut, class CharIn>
 [[gnu::noinline]] Progress<CharIn> ConvertScalar(const CharIn* src, const CharIn* srcEnd, CharOut* out,
                                                  const CharOut* outEnd) {
-  // As unsigned units: with char the traits would convert negative values without saying so.
+  // As unsigned units: from signed ones the traits would silently convert negative values.
   using Unsigned = std::make_unsigned_t<CharIn>;
   using Encoding = utf::utf_traits<CharOut>;
   const Unsigned* p = reinterpret_cast<const Unsigned*>(src);
@@ -71,7 +72,7 @@ template <class CharOut, class CharIn>
 }
 
 /// Converts from malformed text on, and replaces what is malformed, until the text seems to be well-formed:
-/// by blocks, and one code point at a time where there isn't text or room for one.
+/// in blocks, or one code point at a time where less than a block of text or room is left.
 template <class CharOut, class CharIn>
 Progress<CharIn> Replace(const UnitKernels<CharIn>* kernels, const CharIn* p, const CharIn* end, CharOut* out,
                          CharOut* outEnd, ssize_t& replacements) {
@@ -96,14 +97,14 @@ Progress<CharIn> Replace(const UnitKernels<CharIn>* kernels, const CharIn* p, co
 template <class CharOut> constexpr ssize_t kMostOut = sizeof(CharOut) == 1 ? 3 : 1;
 template <class CharOut> constexpr ssize_t kMostIn = sizeof(CharOut) == 1 ? 1 : 3;
 
-/// a + b, and kMax where that is more.
+/// Returns a + b, or kMax if the sum is larger.
 ssize_t Sum(ssize_t a, ssize_t b) { return a < kMax - b ? a + b : kMax; }
 
-/// A conversion into a string: makes room, and tells in the end how much of it was needed.
+/// The string that a conversion appends to: makes room, and gives back in the end what wasn't needed.
 template <class CharOut> class Destination {
 public:
-  /// Where the result may fit in the capacity that there is, it is tried: a string that holds one result
-  /// after the other would otherwise grow and shrink each time.
+  /// Makes no room yet if the result may fit: a string that is used for one result after the other would
+  /// otherwise grow and shrink each time.
   Destination(basic_xstring<CharOut>& s, ssize_t srcLen)
       : m_string(s), m_oldSize(s.size()), m_oldCapacity(s.capacity()), m_srcLen(srcLen) {
     if (srcLen > 0 && m_oldCapacity - m_oldSize <= srcLen / kMostIn<CharOut>)
@@ -115,13 +116,13 @@ public:
   CharOut* OutEnd() { return m_string.data() + std::max(m_string.capacity() - 1, ssize_t(0)); }
   void SetEnd(const CharOut* out) { Storage::SetSize(m_string, out - m_string.data()); }
 
-  /// Makes room for the result of as many units of the source as are left.
+  /// Makes room for the result of the last rest units of the source.
   void GrowFor(ssize_t rest) {
     const ssize_t size = m_string.size(), tried = Sum(m_oldSize, m_srcLen);
     const ssize_t most = size + kMostOut<CharOut> * std::min(rest, (kMax - size) / kMostOut<CharOut>);
     Grow(m_string.capacity() <= tried ? tried : most);
   }
-  /// Gives back what isn't needed. A string that was appended to keeps twice what it had.
+  /// Gives back what isn't needed. A string that was appended to keeps twice its old capacity.
   void Finish() {
     if (m_string.capacity() != m_oldCapacity)
       Storage::GiveBack(m_string, std::max(Least(), m_string.size() + 1));
@@ -221,7 +222,7 @@ bool Utf8FromUtf16(string8& dst, const char16* src) {
   return UtfToUtf<char8, char16>(dst, src, GetStringLength(src));
 }
 
-// Its units are of another type, which the conversion may not read: they are copied part by part.
+// A char16_t may not be read as a char16: the text is copied part by part.
 bool Utf8FromUtf16(string8& dst, std::u16string_view text) {
   const ssize_t oldCapacity = dst.capacity();
   dst.clear();
@@ -230,7 +231,7 @@ bool Utf8FromUtf16(string8& dst, std::u16string_view text) {
     char16 part[1024];
     const std::size_t n = std::min(text.size(), std::size(part));
     std::memcpy(part, text.data(), n * sizeof(char16));
-    // A pair that the part's end would cut off is left to the next one.
+    // A surrogate pair that the part's end would cut off is left to the next part.
     const ssize_t cutOff = n < text.size() ? detail::CutOffAtEnd(part, part + n) : 0;
     isWellFormed = detail::AppendStrict(dst, part, static_cast<ssize_t>(n) - cutOff);
     text.remove_prefix(n - static_cast<std::size_t>(cutOff));

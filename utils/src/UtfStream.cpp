@@ -13,8 +13,8 @@ template <class CharOut, class CharIn> bool UtfStream<CharOut, CharIn>::HasStopp
   return m_onMalformed == OnMalformed::kStop && m_malformed.reason != MalformedReason::kNone;
 }
 
-/// Converts pn units, which begin at the beginning of a sequence, and notes the first malformed sequence. Its
-/// reason may depend on units behind them, up to end.
+/// Converts the pn units at p, where a sequence begins, and records the first malformed sequence. Its reason
+/// may depend on the units that follow, up to end.
 template <class CharOut, class CharIn>
 void UtfStream<CharOut, CharIn>::Convert(basic_xstring<CharOut>& dst, const CharIn* p, ssize_t pn,
                                          const CharIn* end) {
@@ -28,8 +28,8 @@ void UtfStream<CharOut, CharIn>::Convert(basic_xstring<CharOut>& dst, const Char
   m_converted = HasStopped() ? m_malformed.offset : m_converted + pn;
 }
 
-/// Adds units to those that were kept, until they are a sequence or can't become one, and converts them. A
-/// unit that doesn't continue the sequence isn't part of the malformed one either.
+/// Adds units to the pending ones until they are a sequence or can't become one, and converts them. A unit
+/// that doesn't continue the sequence isn't taken.
 /// @return how many of the pn units were taken
 template <class CharOut, class CharIn>
 ssize_t UtfStream<CharOut, CharIn>::CompletePending(basic_xstring<CharOut>& dst, const CharIn* p,
@@ -55,7 +55,7 @@ bool UtfStream<CharOut, CharIn>::Append(basic_xstring<CharOut>& dst, const CharI
   if (m_isFinished)
     *this = UtfStream(m_onMalformed);
   const CharIn* const end = p + pn;
-  while (m_pending != 0 && p != end) // none is pending once it has stopped
+  while (m_pending != 0 && p != end) // none is pending once the stream has stopped
     p += CompletePending(dst, p, end - p);
   if (p != end && !HasStopped()) {
     const ssize_t cutOff = detail::CutOffAtEnd(p, end);

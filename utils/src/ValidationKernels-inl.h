@@ -1,9 +1,9 @@
-// Checking and counting in wide instructions, compiled once for each instruction set by Kernels.cpp.
+// Checking and counting in SIMD instructions, compiled once for each instruction set by Kernels.cpp.
 //
-// A text goes by blocks. One that is well-formed is counted; the first that isn't ends the scan, and the
-// scalar path finds the sequence.
+// A text is scanned in blocks. One that is well-formed is counted; the first that isn't ends the scan, and
+// the scalar path finds the malformed sequence.
 //
-// There is no include guard: the file is included once for each instruction set, behind
+// There is no include guard: the file is included once for each instruction set, after
 // ConversionKernels-inl.h, whose names it uses.
 
 HWY_BEFORE_NAMESPACE();
@@ -12,9 +12,9 @@ namespace {
 
 // UTF-8 ----------
 
-/// Where bytes don't go with those before them. Each pair of adjacent bytes is looked up by its nibbles for
-/// what can be wrong with the two (kPairFaults), and must be two continuation bytes where a lead byte two or
-/// three places before asks for that.
+/// Returns nonzero bytes where a byte may not follow those before it. The nibbles of each two adjacent bytes
+/// are looked up in kPairFaults. Both must be continuation bytes exactly where a lead byte two or three
+/// places before the second requires it.
 template <class D, class V = hn::Vec<D>> HWY_INLINE V Faults(D d, V bytes, V before) {
   constexpr int n = int(kLanes<D>);
   const V first = Window<n - 1>(d, before, bytes);
@@ -30,7 +30,7 @@ template <class D, class V = hn::Vec<D>> HWY_INLINE V Faults(D d, V bytes, V bef
   return hn::Xor(hn::And(hn::And(byHigh, byLow), bySecond), isContinued);
 }
 
-/// Whether n bytes are ASCII, of whole vectors.
+/// Returns whether the n bytes at p, whole vectors, are ASCII.
 template <ssize_t n> HWY_INLINE bool IsAscii(const char8* p) {
   auto all = hn::Zero(Wide());
   for (ssize_t i = 0; i < n; i += kLanes<Wide>)
@@ -43,14 +43,16 @@ template <bool kIsCounted> struct Utf8Scan {
   using D = Wide;
   static constexpr ssize_t kUnits = WideUtf8Block::kUnits;
 
-  hn::Vec<D> last; ///< of the block before
+  hn::Vec<D> last; ///< the last vector of the block before
   ssize_t continuations, fourBytes;
   bool isBehindAscii;
 
-  // Not a constructor: g++ compiles those that it makes for the processor that the library is built for.
+  // Not a constructor: g++ compiles the constructors that it generates for the library's own target, not for
+  // the kernels'.
   static HWY_INLINE Utf8Scan Begin() { return {hn::Zero(D()), 0, 0, true}; }
 
-  /// Whether the block at p goes on well-formed, but for a sequence that its end cuts off; counts it then.
+  /// Returns whether the block at p goes on well-formed, except for a sequence that its end cuts off, and
+  /// counts it if it does.
   HWY_INLINE bool Take(const char8* p) {
     const bool isAscii = IsAscii<kUnits>(p);
     if (isAscii && isBehindAscii)
@@ -61,7 +63,7 @@ template <bool kIsCounted> struct Utf8Scan {
       const auto bytes = block.template Get<0>(k);
       faults = hn::Or(faults, Faults(D(), bytes, before));
       before = bytes;
-      if (isAscii) // no fault is behind its first bytes
+      if (isAscii) // only its first bytes can be at fault
         break;
     }
     if (!hn::AllTrue(D(), hn::Eq(faults, hn::Zero(D()))))
@@ -76,7 +78,7 @@ template <bool kIsCounted> struct Utf8Scan {
   }
 };
 
-/// Scans UTF-8 as far as it is well-formed by blocks: p is a boundary of sequences.
+/// Scans UTF-8 in blocks as far as it is well-formed. Where it stops, a sequence begins.
 template <bool kIsCounted> HWY_INLINE Measured<char8> ScanUtf8(const char8* const begin, const char8* end) {
   using Scan = Utf8Scan<kIsCounted>;
   Scan scan = Scan::Begin();
@@ -92,10 +94,10 @@ template <bool kIsCounted> HWY_INLINE Measured<char8> ScanUtf8(const char8* cons
     std::memcpy(rest, p, std::size_t(end - p));
     if (scan.Take(rest)) {
       p = end;
-      scan.isBehindAscii = true; // the zeros
+      scan.isBehindAscii = true; // zeros follow the text
     }
   }
-  const ssize_t cutOff = scan.isBehindAscii ? 0 : CutOff(BytesOf(p)); // the scalar path's
+  const ssize_t cutOff = scan.isBehindAscii ? 0 : CutOff(BytesOf(p)); // left to the scalar path
   const ssize_t codePoints = p - begin - scan.continuations - (cutOff > 0);
   p -= cutOff;
   return {p, {codePoints, codePoints + scan.fourBytes - (cutOff > 0 && UnitValue(*p) >= 0xF0)}};
@@ -103,21 +105,21 @@ template <bool kIsCounted> HWY_INLINE Measured<char8> ScanUtf8(const char8* cons
 
 // UTF-16 ----------
 
-/// A scan of UTF-16. Whether a block ends with a high surrogate goes into the next one as a bit: a block that
-/// began before that surrogate would have to wait for the masks of the block before.
+/// A scan of UTF-16. A bit tells the next block whether this one ends with a high surrogate: a block that
+/// began at that surrogate would have to wait for the masks of this one.
 template <bool kIsCounted, class D> struct Utf16Scan {
   using Block = Utf16Block<D>;
   static constexpr ssize_t kUnits = Block::kUnits;
 
-  /// How many units are below 80, and how many below 800: the bytes that they lack of three.
+  /// How many bytes the units lack of three: one for each unit below 800, another for each below 80.
   hn::Vec<hn::Repartition<uint64_t, D>> lacking;
   ssize_t surrogates, zeros;
   uint64_t isCutOff; ///< 1 if the block before ends with a high surrogate
 
   static HWY_INLINE Utf16Scan Begin() { return {hn::Zero(hn::Repartition<uint64_t, D>()), 0, 0, 0}; }
 
-  /// Whether the block at p goes on well-formed from its unit from on; counts it then, with zeros before
-  /// that.
+  /// Returns whether the block at p goes on well-formed from unit `from` on, and counts it if it does. The
+  /// units before that count as zeros.
   HWY_INLINE bool Take(const char16* p, ssize_t from) {
     const ToUnits<D> du;
     auto first = hn::LoadU(du, p), second = hn::LoadU(du, p + kUnits / 2);
@@ -148,8 +150,8 @@ template <bool kIsCounted, class D> struct Utf16Scan {
   }
 };
 
-/// Scans UTF-16 as far as it is well-formed by blocks: p is a boundary of sequences. The last block ends with
-/// the text.
+/// Scans UTF-16 in blocks as far as it is well-formed. Where it stops, a sequence begins. The last block ends
+/// with the text.
 template <bool kIsCounted, class D>
 HWY_INLINE Measured<char16> ScanUtf16(const char16* const begin, const char16* end) {
   auto scan = Utf16Scan<kIsCounted, D>::Begin();
@@ -159,7 +161,7 @@ HWY_INLINE Measured<char16> ScanUtf16(const char16* const begin, const char16* e
     p += kUnits;
   if (end - p < kUnits && p != end && scan.Take(end - kUnits, kUnits - (end - p)))
     p = end;
-  if (scan.isCutOff != 0) { // the scalar path's
+  if (scan.isCutOff != 0) { // left to the scalar path
     --p;
     --scan.surrogates;
   }

@@ -21,7 +21,7 @@ class IndentingBuffer : public std::streambuf {
 public:
   explicit IndentingBuffer(IOutputStream& os) : sink(&os) {}
 
-  /// Writes the block to the sink. Every member that writes ends with it.
+  /// Writes the block to the sink. Every member of xostream that writes ends with this call.
   void Deliver() { HandOver(block, filled); }
 
   IOutputStream* sink; ///< null once closed
@@ -94,8 +94,8 @@ private:
 
   static ssize_t After(const char* p, ssize_t n) { return p[n - 1] == '\n' ? 0 : kInLine; }
 
-  /// If the sink throws, its bytes count as not written: the next ones get the part of the indent that is
-  /// still missing. The bytes themselves are dropped, because the exception tells the caller of them.
+  /// Writes bytes to the sink. If it throws, they count as not written and are dropped, because the exception
+  /// tells the caller of them. The next bytes get the part of the indent that is still missing.
   void HandOver(const char* p, ssize_t n) {
     const ssize_t after = std::exchange(gathered, written);
     filled = 0;
@@ -107,7 +107,7 @@ private:
   char block[kBlockSize];
   ssize_t filled = 0;
   ssize_t written = kInLine;  ///< how much of the line's indent the sink has; kInLine after the indent
-  ssize_t gathered = kInLine; ///< how much of it there is once the block is written
+  ssize_t gathered = kInLine; ///< how much of the indent it has once the block is written
 };
 
 } // namespace detail
@@ -153,8 +153,8 @@ public:
     buffer.Deliver();
   }
 
-  /// Writes a number or an address. It clears the state first: a sink that threw in the middle of the last
-  /// one has left badbit.
+  /// Writes a number or an address. It clears the state first: a sink that threw during an earlier one has
+  /// left badbit.
   template <class X> void Put(X x) {
     clear();
     *this << x;
