@@ -34,8 +34,8 @@ using IfOneOf = std::enable_if_t<(std::is_same_v<std::remove_cv_t<C>, Types> || 
 /// after "@pre", before anything is written. One thread at a time may use a stream.
 ///
 /// @par Calls of the sink
-/// Text that needs no indent reaches the sink in one call, indented text in one call for each 512 bytes or
-/// for each longer line.
+/// Text that needs neither indent nor padding reaches the sink in one call, other text in one call for each
+/// 512 bytes or for each longer line.
 /// @par A sink that throws
 /// Its exception ends the member that was called, and goes to the caller. The bytes of the throwing call
 /// count as not written, and the rest of what the member writes is dropped. The next member calls the sink
