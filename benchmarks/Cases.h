@@ -1,4 +1,5 @@
-// A case is one benchmark: the same work of this library and of others, on the same data in the same run.
+// A case is one benchmark: one operation, done by this library and by other libraries, on the same data in
+// the same run.
 
 #pragma once
 

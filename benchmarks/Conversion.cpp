@@ -163,7 +163,7 @@ void RegisterFresh(const Language& language, std::size_t size) {
 }
 
 /// Registers conversions of text in which a byte that never occurs in UTF-8 follows about every so many
-/// bytes. Each party is called again behind every such byte, so that it reports all of them.
+/// bytes. Each party is called again after every such byte, so that it reports all of them.
 void RegisterMalformed(const Language& language, const char* data, std::size_t every) {
   auto& malformed = *new Malformed{TextsIn<char>(language, std::size_t(1) << 16)[0], {0}};
   std::string& text = malformed.text;

@@ -166,7 +166,7 @@ void RegisterWalks(const Language& language, std::size_t size) {
 #pragma GCC diagnostic pop
 }
 
-/// Calls the strict conversion again behind each FF. @return how many units it gives, with one for each FF
+/// Calls the strict conversion again after each FF. @return how many units it gives, with one for each FF
 ssize_t StrictAgain(mirel::string16& dst, const char* p, const char* end) {
   ssize_t units = 0;
   while (!mirel::Utf16FromUtf8(dst, p, end - p)) {
@@ -186,7 +186,7 @@ template <class Unit> ssize_t Spoil(std::basic_string<Unit>& text, Unit malforme
 
 /// Registers lossy conversions of well-formed text, or of the same text with an FF at about every tenth byte.
 /// Beside the latter, our strict conversion takes part on the well-formed text, and on the malformed one,
-/// called again behind each fault.
+/// called again after each fault.
 void RegisterLossy(const Language& language, std::size_t size, bool isMalformed) {
   const auto& wellFormed = *new std::vector<std::string>(TextsIn<char>(language, size));
   auto& texts = *new std::vector<std::string>(wellFormed);

@@ -295,7 +295,7 @@ def main():
              "- conversions of up to 64 units go through eight texts in turn; texts of 12 to 16 units end at a code point",
              "- absolute times on a shared machine mean little, so the tables have none", "",
              "## Goals", "",
-             "A goal is for the geometric mean over the texts, beside the peer with the lowest ratio. In brackets is the",
+             "A goal applies to the geometric mean over the texts, against the peer with the lowest ratio. In brackets is the",
              f"worst text, which may not be below {WORST_OF_GOAL} of the goal. A row that is below its goal in any column",
              f"gives the reason. Of {len(goals)} goals {reached} are reached in all columns. The goals beside the earlier",
              "version keep short inputs from getting slower.", "",

@@ -66,8 +66,8 @@ def main():
     size = int(sys.argv[2] if len(sys.argv) > 2 else 40) * 1000 * 1000
     repetitions = int(sys.argv[3] if len(sys.argv) > 3 else 9)
     print("# transcode beside iconv\n")
-    print(f"The C library's iconv command's time divided by ours, on {size // 10**6} MB of each text, {repetitions} "
-          "repetitions of each in\nturn; in brackets the spread. `./dev bench` repeats it.\n")
+    print(f"The time of the C library's `iconv` command divided by ours, on {size // 10**6} MB of each text; {repetitions} "
+          "repetitions of\neach, in turn. The spread is in brackets. `./dev bench` repeats it.\n")
     print("| text | " + " | ".join(f"{source} to {target}" for source, target in WORK) + " |")
     print("|---|" + "--:|" * len(WORK))
     for language, sentences in read_sentences().items():

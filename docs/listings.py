@@ -29,7 +29,10 @@ def differing(page, write):
     updated = LISTING.sub(listing, text)
     if write and names:
         page.write_text(updated)
-    return [] if write else names
+        names = []
+    if re.search(r"^```\w+\n```$", updated, re.MULTILINE):
+        names.append("a file for its empty listing")
+    return names
 
 
 def calls(page):

@@ -220,12 +220,12 @@ TYPED_TEST(RangeAlgorithms, NeedlesThatDifferInOneUnit) {
     for (std::size_t k = 0; k < size; ++k)
       needle.push_back(static_cast<TypeParam>('a' + k * k % 23));
     for (std::size_t at = 0; at < size; ++at) {
-      Units before = needle, behind = needle;
-      before[at] = behind[at] = '!';
+      Units before = needle, after = needle;
+      before[at] = after[at] = '!';
       before.insert(before.end(), needle.begin(), needle.end());
-      behind.insert(behind.begin(), needle.begin(), needle.end());
+      after.insert(after.begin(), needle.begin(), needle.end());
       ASSERT_NO_FATAL_FAILURE(Check(before, needle)) << at;
-      ASSERT_NO_FATAL_FAILURE(Check(behind, needle)) << at;
+      ASSERT_NO_FATAL_FAILURE(Check(after, needle)) << at;
     }
   }
 }
@@ -248,7 +248,7 @@ TYPED_TEST(RangeAlgorithms, RandomTextsNeedlesAndSets) {
 }
 
 /// Needles that are found late or never and resemble the text before: parts of the Fibonacci word, a repeated
-/// unit with another one in it, and a period that fails behind its 40th unit.
+/// unit with another one in it, and a period that fails after its 40th unit.
 TYPED_TEST(RangeAlgorithms, PeriodicNeedles) {
   using T = TypeParam;
   std::string fibonacci = "ab", before = "a", period;

@@ -38,7 +38,7 @@ UTF-8 code units 500028 UTF-16 code units 250014 code points 200012 lines 2 long
 ASCII code points 25 % round trip same bytes "
 done
 
-# Faults before, at and behind the end of a block: the text before a fault is printed, and the fault and its place are
+# Faults before, at and past the end of a block: the text before a fault is printed, and the fault and its place are
 # named. One more run checks all files, and one writes them with replacements (R).
 while read -r encoding width fault replaced reason; do
   bad=() messages=

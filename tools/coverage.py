@@ -7,7 +7,7 @@ The tests are built there with clang's -fprofile-instr-generate -fcoverage-mappi
 -runtime-counter-relocation. The last option keeps the counters in a file that child processes write too, so a violated
 precondition, which ends its process, is counted. The tests of threads are left out: a branch not taken is a difference of
 counters, and concurrent threads lose some counts. The instances of a template count together. A violated precondition
-also counts for those behind it in the function, since their counts are differences; the tables of
+also counts for those after it in the function, since their counts are differences; the tables of
 tests/PreconditionTest.cpp check that each is reported. Exits with 1 if anything is missed.
 """
 
@@ -22,7 +22,7 @@ ROOT = pathlib.Path(__file__).resolve().parent.parent
 # This processor, and emulated ones with other kernels and without any.
 PROCESSORS = {"this": [], "sse4": ["qemu-x86_64", "-cpu", "Nehalem"], "none": ["qemu-x86_64", "-cpu", "core2duo"]}
 COMPILE_TIME = {"ConversionTables.cpp"}  # code that only the compiler runs
-BY_THE_COMPILER = "// the compiler decides"  # ends a line that generates no code
+BY_THE_COMPILER = "// decided at compile time"  # ends a line that generates no code
 
 
 def run_suite(build):

@@ -9,7 +9,7 @@ import codecs
 MIREL_TYPES = r"^mirel::(VectorOfByte|(xvector|basic_xstring|MovableString)<(char|unsigned short|short unsigned int)>)$"
 
 # The most elements that are shown, whatever limit is set: a corrupt size must not keep the debugger busy.
-MIREL_MOST = 1 << 20
+MIREL_MAX_ELEMENTS = 1 << 20
 
 MIREL_ESCAPES = {'"': '\\"', "\\": "\\\\", "\n": "\\n", "\r": "\\r", "\t": "\\t"}
 
@@ -79,7 +79,7 @@ class MirelObject:
         """The text, up to limit elements unless that is None or 0; or what is wrong with the object."""
         try:
             address, size, capacity = self.check()
-            shown = min(size // self.width, limit or MIREL_MOST, MIREL_MOST) * self.width
+            shown = min(size // self.width, limit or MIREL_MAX_ELEMENTS, MIREL_MAX_ELEMENTS) * self.width
             units = self.read(address, shown) if shown else b""
         except MirelFault as fault:
             return f"<{fault.kind}: {fault}>"
@@ -139,7 +139,7 @@ class MirelWithElements(MirelInGdb):
             _, size, _ = self.check()
         except MirelFault:
             return
-        for i in range(min(size // self.width, MIREL_MOST)):
+        for i in range(min(size // self.width, MIREL_MAX_ELEMENTS)):
             yield f"[{i}]", (self.elements + i).dereference()
 
     def display_hint(self):
@@ -189,7 +189,7 @@ class MirelElementsInLldb:
             self.address, size, _ = self.object.check()
         except MirelFault:
             size = 0
-        self.count = min(size // self.object.width, MIREL_MOST)
+        self.count = min(size // self.object.width, MIREL_MAX_ELEMENTS)
 
     def num_children(self):
         return self.count

@@ -52,8 +52,8 @@ template <class T, class N> constexpr bool HasBitsFor(N x) {
     return true;
   } else {
     constexpr Unsigned kLeastNegative = static_cast<Unsigned>(~static_cast<Unsigned>(Max::max() / 2));
-    return UnsignedValue(x) <= Max::max() ||                // the compiler decides
-           (x < N{} && UnsignedValue(x) >= kLeastNegative); // the compiler decides
+    return UnsignedValue(x) <= Max::max() ||                // decided at compile time
+           (x < N{} && UnsignedValue(x) >= kLeastNegative); // decided at compile time
   }
 }
 
@@ -76,15 +76,15 @@ __attribute__((noipa, warning(MIREL_CUT))) inline void ConstantIsCut() {}
 template <class T, bool kStored, class N>
 [[gnu::always_inline]] inline void CheckConstant([[maybe_unused]] N x) {
 #ifdef __OPTIMIZE__
-  if (__builtin_constant_p(x) && !HasBitsFor<T>(x))   // the compiler decides
-    kStored ? ConstantDoesNotFit() : ConstantIsCut(); // the compiler decides
+  if (__builtin_constant_p(x) && !HasBitsFor<T>(x))   // decided at compile time
+    kStored ? ConstantDoesNotFit() : ConstantIsCut(); // decided at compile time
 #endif
 }
 #endif
 
 /// Converts a difference or a count to ssize_t, clamped to the limits of ssize_t where that has fewer bits.
 template <class N> constexpr ssize_t Saturated(N n) {
-  if constexpr (sizeof(N) > sizeof(ssize_t)) { // the compiler decides
+  if constexpr (sizeof(N) > sizeof(ssize_t)) { // decided at compile time
     using Limits = std::numeric_limits<ssize_t>;
     return n < Limits::min() ? Limits::min() : n > Limits::max() ? Limits::max() : static_cast<ssize_t>(n);
   } else {
@@ -122,7 +122,8 @@ template <class T, int kMore, class X> [[gnu::always_inline]] inline T UnitToFin
 } // namespace mirel
 
 /// Stands after the parameters of an overload that takes a code unit x. With clang it refuses a constant x
-/// that has too many bits, at any optimisation level; with g++, CheckConstant() does so.
+/// that has too many bits, at any optimisation level. With g++, CheckConstant() refuses it, or warns if it
+/// is searched for, but only where the compiler optimises.
 #ifdef __clang__
 #define MIREL_FITS(T, x)                                                                                     \
   _Pragma("clang diagnostic push") _Pragma("clang diagnostic ignored \"-Wgcc-compat\"")                      \

@@ -40,8 +40,8 @@ constexpr bool IsSubrange(ssize_t i, ssize_t n, ssize_t size) {
 /// Stops the process with the expression's own text unless the expression, evaluated once, is true.
 #define MIREL_ASSERT(expression) MIREL_ASSERT_AS(expression, #expression)
 
-/// Asserts that n elements from index i on lie within size elements, for every pair of values.
-/// For (ri, rn, r.size()) the text is "0 <= ri && 0 <= rn && ri+rn <= r.size()".
+/// Asserts that n elements from index i on lie within size elements; i + n isn't computed, so it can't
+/// overflow. For (ri, rn, r.size()) the text is "0 <= ri && 0 <= rn && ri+rn <= r.size()".
 #define MIREL_ASSERT_SUBRANGE(i, n, size)                                                                    \
   MIREL_ASSERT_AS(::mirel::detail::IsSubrange(i, n, size),                                                   \
                   "0 <= " #i " && 0 <= " #n " && " #i "+" #n " <= " #size)

@@ -11,10 +11,10 @@
 /// @pre "Fits<T>(*r1)" of each element that is stored
 ///
 /// @par Cost
-/// Pointers to elements of the vector's width, and the iterators of standard strings, string views and
-/// vectors of them, are as fast as `const T*`; from C++20 on so is every contiguous iterator. An edit with
-/// other iterators copies the elements first, with one allocation if they are at least forward iterators; it
-/// walks the range twice unless they are random-access iterators. A search allocates nothing.
+/// Pointers to elements of the vector's width, and the iterators of string views and of standard strings and
+/// vectors of such elements, are as fast as `const T*`; from C++20 on so is every contiguous iterator. An
+/// edit with other iterators copies the elements first. Forward iterators then need only one allocation, but
+/// walk the range twice unless they are random-access iterators. A search allocates nothing.
 ///
 /// This header knows iterators and the byte buffer, but no containers.
 
@@ -85,7 +85,7 @@ constexpr bool kIsVolatile =
 
 /// Returns whether It is a contiguous iterator over units as wide as T. For other elements kIsContiguous
 /// isn't named, since it names their containers.
-template <class T, class It> constexpr bool StandsForPointer() { // the compiler decides
+template <class T, class It> constexpr bool StandsForPointer() { // decided at compile time
   if constexpr (!kIsUnit<T, ValueType<It>> || kIsVolatile<It>)
     return false;
   else
@@ -130,13 +130,13 @@ template <class It> constexpr bool IsRange(const It& r1, const It& r2) {
 template <class It> constexpr bool IsNull([[maybe_unused]] const It& it) {
   if constexpr (std::is_pointer_v<It>) {
     return it == nullptr;
-  } else if constexpr (kIsNumber<ValueType<It>>) { // the compiler decides
+  } else if constexpr (kIsNumber<ValueType<It>>) { // decided at compile time
 #if __cpp_lib_to_address >= 201711L
-    if constexpr (kIsContiguous<It>) // the compiler decides
+    if constexpr (kIsContiguous<It>) // decided at compile time
       return std::to_address(it) == nullptr;
 #elif !defined _GLIBCXX_DEBUG
     // In debug mode iterators without a container can't be compared; the standard library reports them.
-    if constexpr (kIsContiguous<It>) // the compiler decides
+    if constexpr (kIsContiguous<It>) // decided at compile time
       return it == It();
 #endif
   }
@@ -166,7 +166,7 @@ constexpr bool IsInMemory(const std::move_iterator<It>& r1, const std::move_iter
 /// Returns the unsigned value of an element of a range.
 template <class V, class X> constexpr auto SourceValue(const X& x) {
   static_assert(kIsNumber<V>, "code units are integers or enumerators: convert the elements first");
-  if constexpr (kIsNumber<V>) // the compiler decides
+  if constexpr (kIsNumber<V>) // decided at compile time
     return UnsignedValue(static_cast<V>(x));
   else
     return 0u;
@@ -228,7 +228,7 @@ private:
   VectorOfByte m_units;
 };
 
-/// An iterator over the unsigned values of a range, of the same category up to random access.
+/// An iterator over the unsigned values of a range: random-access or forward as the range's, otherwise input.
 template <class It> class ValueIterator {
 public:
   typedef std::conditional_t<

@@ -129,7 +129,7 @@ template <class T> bool operator>=(detail::Operand<T> a, const xvector<T>& b) { 
 /// @name Keys
 /// Comparators and a hash for maps that are searched without copying the key, with whatever the operators
 /// compare: a `std::map` from C++17 on, an unordered map from C++20 on. A pointer is always a null-terminated
-/// string, never an address, also where both operands are pointers.
+/// string, never an address, even where both operands are pointers.
 /// @snippet examples/reference.cpp keys
 /// @{
 

@@ -12,7 +12,7 @@ namespace mirel::detail {
 
 struct Storage {
   /// Makes room for count more elements, with the capacity growing as in every edit, and returns the address
-  /// of the first. The contents stay as they are, also if it throws.
+  /// of the first. The contents stay as they are, even if it throws.
   template <class T> static T* Grow(xvector<T>& v, ssize_t count) {
     const ssize_t size = v.m_buffer.size_;
     v.m_buffer.growbytes(xvector<T>::Bytes(count));

@@ -40,9 +40,9 @@ template <class It1, class It2> ssize_t EqualElements(It1 x, It2 y, ssize_t n) {
 }
 
 /// Two-way string matching, by Crochemore and Perrin (1991). The needle is cut in two. Its right part is
-/// compared forwards; a mismatch there moves the needle past it. Then the left part is compared backwards; a
-/// mismatch there moves the needle by its period if it is periodic, otherwise by one more than the longer
-/// part.
+/// compared forwards; a mismatch there moves the needle until its right part begins past it. Then the left
+/// part is compared backwards; a mismatch there moves the needle by its period if it is periodic, otherwise
+/// by one more than the longer part.
 template <class It> class TwoWay {
 public:
   /// Prepares a needle of at least one element.

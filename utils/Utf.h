@@ -86,19 +86,19 @@ MalformedText ExplainMalformed(std::nullptr_t, ssize_t) = delete;
 /// @snippet examples/reference.cpp counting
 /// @{
 
-/// Counts the UTF-16 units of a UTF-8 text. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Counts the units that a UTF-8 text takes in UTF-16. @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf16Length(const char8* p, ssize_t pn);
-/// Counts the UTF-16 units of a UTF-8 string.
+/// Counts the units that a UTF-8 string takes in UTF-16.
 inline ssize_t Utf16Length(const xvector<char8>& text) { return Utf16Length(text.data(), text.size()); }
-/// Counts the UTF-16 units of a view's UTF-8 text.
+/// Counts the units that a view's UTF-8 text takes in UTF-16.
 inline ssize_t Utf16Length(std::string_view text) { return Utf16Length(text.data(), detail::SizeOf(text)); }
 ssize_t Utf16Length(std::nullptr_t) = delete;
 
-/// Counts the UTF-8 units of a UTF-16 text. In a 32-bit program they can be more than an ssize_t holds; the
-/// result is then PTRDIFF_MAX.
+/// Counts the units that a UTF-16 text takes in UTF-8. In a 32-bit program they can be more than an ssize_t
+/// holds; the result is then PTRDIFF_MAX.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf8Length(const char16* p, ssize_t pn);
-/// Counts the UTF-8 units of a UTF-16 string, PTRDIFF_MAX if an ssize_t can't hold the number.
+/// Counts the units that a UTF-16 string takes in UTF-8, PTRDIFF_MAX if an ssize_t can't hold the number.
 inline ssize_t Utf8Length(const xvector<char16>& text) { return Utf8Length(text.data(), text.size()); }
 
 /// Counts the code points of a UTF-8 text, and one for each maximal subpart of malformed text.
@@ -150,9 +150,9 @@ MIREL_API bool Utf8FromUtf16(string8& dst, std::u16string_view text);
 /// @name Appending conversions
 /// Append the result to what the destination holds. They return false where the source is malformed, after
 /// appending what precedes the malformed sequence. A failed allocation throws std::bad_alloc and leaves what
-/// the destination held and the beginning of the result. Where storage grows, it at least doubles, so that
-/// many small texts take amortised linear time. The source may not lie in the destination. To append and
-/// replace malformed text, use a UtfStream.
+/// the destination held and the beginning of the result. Where the storage of a destination that isn't empty
+/// grows, it at least doubles, so that many small texts take amortised linear time. The source may not lie in
+/// the destination. To append and replace malformed text, use a UtfStream.
 /// @snippet examples/reference.cpp appending conversions
 /// @{
 
@@ -184,20 +184,24 @@ inline bool AppendUtf8(string8& dst, const xvector<char16>& text) {
 /// @snippet examples/reference.cpp lossy conversions
 /// @{
 
-/// Converts UTF-8 to UTF-16 and replaces malformed text. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Converts UTF-8 to UTF-16 and replaces malformed text. @return how many U+FFFD replace it @pre "pn == 0 ||
+/// (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf16FromUtf8Lossy(string16& dst, const char8* p, ssize_t pn);
-/// Converts a string from UTF-8 to UTF-16 and replaces malformed text.
+/// Converts a string from UTF-8 to UTF-16 and replaces malformed text. @return how many U+FFFD replace it
 inline ssize_t Utf16FromUtf8Lossy(string16& dst, const xvector<char8>& text) {
   return Utf16FromUtf8Lossy(dst, text.data(), text.size());
 }
-/// Converts a view's text from UTF-8 to UTF-16 and replaces malformed text.
+/// Converts a view's text from UTF-8 to UTF-16 and replaces malformed text. @return how many U+FFFD replace
+/// it
 inline ssize_t Utf16FromUtf8Lossy(string16& dst, std::string_view text) {
   return Utf16FromUtf8Lossy(dst, text.data(), detail::SizeOf(text));
 }
 ssize_t Utf16FromUtf8Lossy(string16&, std::nullptr_t) = delete;
-/// Converts UTF-16 to UTF-8 and replaces unpaired surrogates. @pre "pn == 0 || (pn > 0 && p != nullptr)"
+/// Converts UTF-16 to UTF-8 and replaces unpaired surrogates. @return how many U+FFFD replace them @pre "pn
+/// == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf8FromUtf16Lossy(string8& dst, const char16* p, ssize_t pn);
-/// Converts a string from UTF-16 to UTF-8 and replaces unpaired surrogates.
+/// Converts a string from UTF-16 to UTF-8 and replaces unpaired surrogates. @return how many U+FFFD replace
+/// them
 inline ssize_t Utf8FromUtf16Lossy(string8& dst, const xvector<char16>& text) {
   return Utf8FromUtf16Lossy(dst, text.data(), text.size());
 }

@@ -90,9 +90,10 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 /// @name Searching ranges
 /// Each search returns a position in the haystack, or its end if nothing is found. Nothing is allocated. At
 /// worst the cost is linear in the haystack for one element, and in the product of both lengths for a needle
-/// or a set. But it is linear in the sum of the lengths for needles if both ranges have random-access
-/// iterators over integers, and for all searches through pointers to code units: these have overloads of the
-/// same names and results, which use SIMD instructions if the processor has them.
+/// or a set. It is linear in the sum of the lengths for needles if both ranges have random-access iterators
+/// over integers, and for all searches if every pointer is a `const char8*` or every one a `const char16*`.
+/// These have overloads of the same names and results, which use SIMD instructions if the processor has them;
+/// a pointer to units that aren't const doesn't select them.
 /// @snippet examples/reference.cpp searching ranges
 /// @{
 
@@ -307,7 +308,7 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 ///
 /// Parameters: `i` is an offset or an iterator, `n` a number of bytes from there, `i1`/`i2` and `r1`/`r2` the
 /// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a repeat count. An integer of
-/// any type may stand for each: a literal 0 is never a pointer.
+/// any type may stand for an offset, a count or a byte: a literal 0 is one of these, never a pointer.
 ///
 /// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments
 /// stop the process with the text after "@pre", before anything has changed. A source is checked after all
@@ -489,7 +490,7 @@ public:
   /// @snippet examples/reference.cpp bytes moving
   /// @{
 
-  /// Moves n bytes from offset s to offset d, also where the two ranges overlap.
+  /// Moves n bytes from offset s to offset d, even where the two ranges overlap.
   /// @pre "0 <= d && 0 <= n && d+n <= size()", then "0 <= s && 0 <= n && s+n <= size()"
   void move(ssize_t d, ssize_t s, ssize_t n);
   /// Removes the bytes of [i1, i2). @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"

@@ -96,7 +96,9 @@ public:
   void put(float x);              ///< Writes a number of precision() significant digits.
   void put(double x);             ///< Writes a number of precision() significant digits.
   void put(long double x);        ///< Writes a number of precision() significant digits.
-  void put(const void* x);        ///< Writes an address in hexadecimal; that of characters doesn't compile.
+  /// Writes an address in hexadecimal. A pointer to char or char8_t is text instead; one to other characters
+  /// doesn't compile.
+  void put(const void* x);
   /// Writes a null-terminated string. @pre "x"
   void put(ConstString8Z x);
 #ifdef __cpp_char8_t

@@ -103,11 +103,10 @@ public:
 
   /// Returns the contents with a null past the end, which is not part of the string.
   ///
-  /// The call counts as a change, although it is const: no other thread may use the string meanwhile. If
-  /// there is no unused capacity it moves the storage, which invalidates pointers, references, iterators and
-  /// views, and makes room for more than the null, so that appends and c_str() in turn take amortised
-  /// constant time. The result is valid until the next change; until then another call returns the same
-  /// pointer.
+  /// The call counts as a change, although it is const: no other thread may use the string meanwhile. Without
+  /// unused capacity it makes room, for more than the null so that appends and c_str() in turn take amortised
+  /// constant time; that may move the storage, which invalidates pointers, references, iterators and views.
+  /// The result is valid until the next change other than c_str(), which returns the same pointer again.
   const T* c_str() const {
     const ssize_t n = this->size();
     if (n == this->capacity())

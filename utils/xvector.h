@@ -24,12 +24,12 @@ namespace mirel {
 /// Parameters, throughout: `i` an index or iterator, `n` a number of elements from there; `i1`/`i2` the ends
 /// of a half-open range of this vector; `r` another vector, `ri`/`rn` a sub-range of it; `p`/`pn` a pointer
 /// and a number of elements; `r1`/`r2` a half-open range elsewhere; `x` an element; `c` an element that is
-/// looked for; `offset` where a search starts; `count` a repeat, fill or substring length. All are in
-/// elements, and signed. An integer of any type may stand for each: a literal 0 is an index, a count or an
-/// element, never a pointer. utils/Ranges.h says which iterators a range may have, and what its elements
-/// count as; a single element counts by its unsigned value too. A constant that doesn't fit doesn't compile
-/// with clang, nor with g++ if it optimises. G++ may take a variable for a constant if it knows the value,
-/// and only warns of a constant that is searched for.
+/// looked for; `offset` where a search starts; `count` a repeat, fill or substring length. Indices
+/// and counts are in elements, and signed. An integer of any type may stand for an index, a count or an
+/// element: a literal 0 is one of these, never a pointer. utils/Ranges.h says which iterators a range may
+/// have, and what its elements count as; a single element counts by its unsigned value too. A constant that
+/// doesn't fit doesn't compile with clang, nor with g++ if it optimises. G++ may take a variable for a
+/// constant if it knows the value, and only warns of a constant that is searched for.
 ///
 /// @par Bad arguments
 /// They stop the process with the text given after "@pre", before anything has changed. They are never
@@ -322,7 +322,7 @@ public:
   /// @snippet examples/reference.cpp moving
   /// @{
 
-  /// Copies n elements from index s to index d, also where the two ranges overlap. The size stays.
+  /// Copies n elements from index s to index d, even where the two ranges overlap. The size stays.
   /// @pre "0 <= d && 0 <= n && d+n <= size()", then "0 <= s && 0 <= n && s+n <= size()"
   void move(ssize_t d, ssize_t s, ssize_t n) {
     // The buffer asserts this too, but after the scaling to bytes, which could overflow.

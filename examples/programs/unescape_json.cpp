@@ -13,7 +13,7 @@ using mirel::ssize_t;
 using mirel::string16;
 using mirel::string8;
 
-/// Appends the unit of an escape. rest begins behind the backslash; the escape is removed from it.
+/// Appends the unit of an escape. rest begins after the backslash; the escape is removed from it.
 bool AppendEscape(string16& text, std::string_view& rest) {
   constexpr std::string_view kLetters = "\"\\/bfnrt", kUnits = "\"\\/\b\f\n\r\t";
   const char letter = rest.empty() ? '\0' : rest.front();

@@ -44,7 +44,7 @@ private:
 
   void Take(const std::string& name);
   void TakeBlock(Blocks& blocks, File& file);
-  std::string GoOnBehind(const File& file, const std::string& what, const std::string& place);
+  std::string ContinueAfter(const File& file, const std::string& what, const std::string& place);
   void Tell(const File& file, int64 count, const std::string& singular, const std::string& plural,
             const std::string& first);
 
@@ -94,11 +94,11 @@ void Conversion::TakeBlock(Blocks& blocks, File& file) {
   if (m_output) {
     m_output->Write(m_outgoing.Encode(blocks));
     if (const auto& lack = m_outgoing.FirstLack())
-      file.firstLack = GoOnBehind(file, Describe(*lack, *m_options.to),
-                                  file.statistics.PlaceIn(blocks, blocks.OffsetOf(lack->index)));
+      file.firstLack = ContinueAfter(file, Describe(*lack, *m_options.to),
+                                     file.statistics.PlaceIn(blocks, blocks.OffsetOf(lack->index)));
   }
   if (const auto& fault = blocks.FirstFault())
-    file.firstFault = GoOnBehind(file, fault->reason, file.statistics.PlaceIn(blocks, fault->offset));
+    file.firstFault = ContinueAfter(file, fault->reason, file.statistics.PlaceIn(blocks, fault->offset));
   const ssize_t size = static_cast<ssize_t>(blocks.Bytes().size());
   file.statistics.Advance(blocks, size);
   if (m_options.report)
@@ -107,7 +107,7 @@ void Conversion::TakeBlock(Blocks& blocks, File& file) {
 }
 
 /// Returns the place of a fault that is replaced or dropped; any other fault ends the program there.
-std::string Conversion::GoOnBehind(const File& file, const std::string& what, const std::string& place) {
+std::string Conversion::ContinueAfter(const File& file, const std::string& what, const std::string& place) {
   if (m_options.mode == Mode::kReplace || m_options.mode == Mode::kDrop)
     return place;
   if (m_output)

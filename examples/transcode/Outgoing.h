@@ -22,7 +22,7 @@ struct Lack {
 /// Gives the text of one file after another the mark, the line ends and the encoding of the output.
 ///
 /// Text that doesn't change isn't copied: the result may refer to the block. The mark that a file begins with
-/// isn't part of its text, so it is dropped behind the text of another file.
+/// isn't part of its text, so it is dropped when it follows the text of another file.
 class Outgoing {
 public:
   Outgoing(const Encoding& to, Mark mark, LineEnds lineEnds, Mode mode)

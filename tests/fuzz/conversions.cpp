@@ -20,7 +20,7 @@ extern "C" int LLVMFuzzerTestOneInput(const unsigned char* data, std::size_t siz
   if (size == 0 || size > 128)
     return 0;
   // Enough ASCII to reach each path of a conversion: single units, SWAR, blocks, the end of a block and,
-  // seldom, since it takes long, the end of a chunk.
+  // seldom because it takes long, a text of many blocks.
   static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 1, 2, 5, 20, 31, 34, 1000};
   const std::size_t before = kBefore[data[0] % std::size(kBefore)];
   ++data, --size;

@@ -52,7 +52,7 @@ inline const char8* SkipAscii(const char8* p, const char8* end) {
 }
 inline const char16* SkipAscii(const char16* p, const char16*) { return p; }
 
-/// The least units that kernels are worth: a shorter text is decoded one code point at a time in the time
+/// The fewest units for which a kernel pays: a shorter text is decoded one code point at a time in the time
 /// that a kernel takes to copy it into a block.
 constexpr ssize_t kLeastForKernels = 24;
 

@@ -2,12 +2,12 @@
 //
 // A text is converted in blocks. For every position of a block the kernel computes what a code point that
 // begins there would give, even where none begins. A byte shuffle from a table then drops the positions where
-// none begins. No branch depends on where code points begin. Masks with one bit for each position tell
-// whether the block is well-formed; one that isn't is left to the scalar path, which finds the malformed
-// sequence. From there a lossy conversion goes on in blocks whose masks tell where a maximal subpart begins;
-// there U+FFFD replaces what was computed. A block ends before a code point that its end would cut off, so no
-// state passes from one block to the next. The last block ends where the text ends. It overlaps what has been
-// converted, and may store that part again.
+// none begins. The only branch that depends on where code points begin takes blocks of three-byte
+// sequences alone. Masks with one bit for each position tell whether the block is well-formed; one that isn't
+// is left to the scalar path, which finds the malformed sequence. From there a lossy conversion goes on in
+// blocks whose masks tell where a maximal subpart begins; there U+FFFD replaces what was computed. A block
+// ends before a code point that its end would cut off, so no state passes from one block to the next. The
+// last block ends where the text ends. It overlaps what has been converted, and may store that part again.
 //
 // There is no include guard: the file is included once for each instruction set.
 
@@ -155,7 +155,7 @@ HWY_INLINE uint8_t* StoreHalves(D d, const hn::Vec<D> (&vectors)[n], const Shuff
   return out;
 }
 
-/// Stores what the mask keeps of positions of two bytes, one of even and then one of odd.
+/// Stores what the mask keeps of positions of two bytes each, the first from even, the second from odd.
 template <int kLeast, int kEach, class D>
 HWY_INLINE uint8_t* StorePairs(D d, hn::Vec<D> even, hn::Vec<D> odd, const Shuffles& shuffles, uint64_t mask,
                                uint8_t* out) {
@@ -185,8 +185,8 @@ struct Replaced {
 
 /// A conversion under way. A Block has, beside the functions called here:
 /// - kUnits: how many units of the source it has,
-/// - kMost: the most units that its Convert() writes from out on, those past the result included. Before out
-///   it rewrites only what the block's first units gave.
+/// - kMaxStored: the most units that its Convert() writes from out on, those past the result included.
+///   Before out it rewrites only what the block's first units gave.
 template <class In> struct Conversion {
   using Out = OtherUnit<In>;
   const In* p;
@@ -200,16 +200,16 @@ template <class In> struct Conversion {
   /// After kEnd the conversion goes on at p, which is before the to-th if the block's end cuts a code point
   /// off.
   template <class Block> HWY_INLINE Stop Convert(const Block& block, ssize_t from, ssize_t to) {
-    constexpr ssize_t kMostBytes = Block::kMost * ssize_t(sizeof(Out));
+    constexpr ssize_t kMaxStoredBytes = Block::kMaxStored * ssize_t(sizeof(Out));
     // ASCII up to the block's end writes nothing past the result.
-    const ssize_t room = to == Block::kUnits && block.IsAscii() ? to - from : Block::kMost;
+    const ssize_t room = to == Block::kUnits && block.IsAscii() ? to - from : Block::kMaxStored;
     if (outEnd - out >= room)
       return Accept(block.Convert(from, to, BytesOf(out)));
-    uint8_t copy[std::size_t(2 * kMostBytes)];
-    const Converted n = block.Convert(from, to, copy + kMostBytes);
+    uint8_t copy[std::size_t(2 * kMaxStoredBytes)];
+    const Converted n = block.Convert(from, to, copy + kMaxStoredBytes);
     if (n.out > outEnd - out)
       return Stop::kNoRoom;
-    std::memcpy(out, copy + kMostBytes, std::size_t(n.out) * sizeof(Out));
+    std::memcpy(out, copy + kMaxStoredBytes, std::size_t(n.out) * sizeof(Out));
     return Accept(n);
   }
 
@@ -222,7 +222,7 @@ template <class In> struct Conversion {
   template <class Block> HWY_INLINE Stop ConvertAll() {
     constexpr ssize_t kUnits = Block::kUnits;
     Stop stop = Stop::kEnd;
-    while (stop == Stop::kEnd && end - p >= kUnits && outEnd - out >= Block::kMost)
+    while (stop == Stop::kEnd && end - p >= kUnits && outEnd - out >= Block::kMaxStored)
       stop = Accept(Block::Load(p).Convert(0, kUnits, BytesOf(out)));
     while (stop == Stop::kEnd && p != end) { // near the end of the source or of the room
       const ssize_t from = end - p < kUnits ? kUnits - (end - p) : 0;
@@ -233,7 +233,7 @@ template <class In> struct Conversion {
 
   /// Converts blocks, with U+FFFD where they are malformed, up to one that is well-formed.
   template <class Block> HWY_INLINE void Replace(ssize_t& replacements) {
-    while (end - p >= Block::kUnits && outEnd - out >= Block::kMost) {
+    while (end - p >= Block::kUnits && outEnd - out >= Block::kMaxStored) {
       const Replaced n = Block::Load(p).Replace(BytesOf(out));
       if (n.replacements == 0)
         return;
@@ -314,7 +314,7 @@ HWY_INLINE ssize_t CutOff(const uint8_t* end) {
 /// A block of kVectors vectors of UTF-8.
 template <int kVectors, class D> struct Utf8Block {
   static constexpr ssize_t kUnits = kVectors * kLanes<D>;
-  static constexpr ssize_t kMost = kUnits;
+  static constexpr ssize_t kMaxStored = kUnits;
   const uint8_t* p;
   hn::Vec<D> lastVector;
 
@@ -507,7 +507,8 @@ struct UnitMasks {
 template <class Tag> struct Utf16Block {
   using D = Tag;
   static constexpr ssize_t kUnits = kLanes<D>;
-  static constexpr ssize_t kMost = 3 * kUnits + 4; // the last store is 16 bytes, of which 12 count at most
+  // The last store is 16 bytes, of which at most 12 count.
+  static constexpr ssize_t kMaxStored = 3 * kUnits + 4;
   static constexpr D d{};
   hn::Vec<D> low, high; ///< the bytes of the units
   hn::Vec<D> any;       ///< the bitwise or of the block's two vectors of units
@@ -585,22 +586,22 @@ template <class Tag> struct Utf16Block {
   }
 
   HWY_INLINE Converted Convert(ssize_t from, ssize_t to, uint8_t* out) const {
-    const ssize_t n = to - from, behind = kUnits - to;
+    const ssize_t n = to - from, unitsAfter = kUnits - to;
     if (IsAscii()) {
       hn::StoreU(low, d, out - from);
       return {n, n};
     }
     UnitMasks masks = {HighBits(d, NonAscii()), HighBits(d, ThreeBytes())};
     if (masks.three == 0)
-      return {n, StoreTwo(masks.two, out - masks.Bytes(from)) - out - behind};
+      return {n, StoreTwo(masks.two, out - masks.Bytes(from)) - out - unitsAfter};
     if (BitsOf(d, Is(0xD8, 0xF8)) == 0)
-      return {n, StoreThree<false>(masks, out - masks.Bytes(from)) - out - behind};
+      return {n, StoreThree<false>(masks, out - masks.Bytes(from)) - out - unitsAfter};
     const uint64_t highs = BitsOf(d, Is(0xD8, 0xFC)), lows = BitsOf(d, Is(0xDC, 0xFC));
     if (((highs << 1 ^ lows) & FirstBits(kUnits) & ~FirstBits(from)) != 0)
       return {0, 0};
     const ssize_t cutOff = static_cast<ssize_t>(highs >> (kUnits - 1));
     masks = {masks.two & ~lows, masks.three & ~lows}; // a low surrogate gives one byte, a high one three
-    return {n - cutOff, StoreThree<true>(masks, out - masks.Bytes(from)) - out - behind - 3 * cutOff};
+    return {n - cutOff, StoreThree<true>(masks, out - masks.Bytes(from)) - out - unitsAfter - 3 * cutOff};
   }
 
   /// Stores a block of ASCII and of unpaired surrogates, no two of them side by side: eight units then give

@@ -45,7 +45,7 @@ template <class T> struct UnitKernels {
   Progress<T> (*convert)(const T* p, const T* end, Out* out, Out* outEnd);
   /// Converts blocks from malformed text on, with U+FFFD for each maximal subpart, and adds how many there
   /// were to replacements. It stops before a well-formed block, or when less than a block of text or room is
-  /// left; either may be the case at once.
+  /// left, so it may convert nothing.
   Progress<T> (*replace)(const T* p, const T* end, Out* out, Out* outEnd, ssize_t& replacements);
   /// Returns the end of a well-formed prefix that cuts no sequence off: the end of the text, or a place not
   /// far before malformed text.
@@ -58,8 +58,8 @@ template <class T> struct UnitKernels {
 /// What one instruction set offers for text of both widths.
 struct Kernels : UnitKernels<char8>, UnitKernels<char16> {
   const char* name;
-  /// Converts the first of n units as Utf16FromAscii() does. Returns how many; fewer than a vector has are
-  /// left.
+  /// Converts units from the first of n on, as Utf16FromAscii() does. Returns how many; what is left is less
+  /// than a vector.
   ssize_t (*utf16FromAscii)(const char8* src, ssize_t n, char16* out);
 };
 
@@ -96,9 +96,9 @@ struct alignas(64) Repeats {
 };
 extern const Repeats kRepeats;
 
-/// Returns the k-th best kernels that this processor has, counted from 0; null if there are fewer. It asks
-/// the processor each time: there is no state to initialise, so that it also works before main() and from any
-/// thread.
+/// Returns the k-th best kernels that this processor has, counted from 0; null if there are fewer. Each
+/// call reads what the compiler's runtime has found out about the processor before the program's constructors
+/// run. The library has no state to initialise, so this also works before main() and from any thread.
 const Kernels* KernelsAt(int k);
 
 /// Returns the best kernels that this processor has, or null, in about 1 ns.

@@ -10,7 +10,7 @@
 #if defined(MIREL_KERNELS) && __BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__
 
 // The kernels use neither AES nor conversions of floating-point numbers, so no processor has to have them.
-// No other target was found to gain a third over these.
+// Other targets are left out: none was found to be a third faster than the best of these.
 #define HWY_DISABLE_PCLMUL_AES
 #define HWY_DISABLE_F16C
 #define HWY_DISABLED_TARGETS                                                                                 \

@@ -182,7 +182,7 @@ private:
   static constexpr ssize_t kRare = 256;
   ssize_t m_last; ///< the index of the last unit
   T m_first, m_middle, m_final;
-  int64 m_credit = 2 * kRare; // 64 bits, since it may exceed the length
+  int64 m_credit = 2 * kRare; // 64 bits: it may exceed the largest ssize_t
 };
 
 template <bool kReverse, class T>

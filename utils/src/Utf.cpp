@@ -94,8 +94,8 @@ Progress<CharIn> Replace(const UnitKernels<CharIn>* kernels, const CharIn* p, co
 }
 
 /// The most units of the result for one of the source, and the most of the source for one of the result.
-template <class CharOut> constexpr ssize_t kMostOut = sizeof(CharOut) == 1 ? 3 : 1;
-template <class CharOut> constexpr ssize_t kMostIn = sizeof(CharOut) == 1 ? 1 : 3;
+template <class CharOut> constexpr ssize_t kMaxOutPerIn = sizeof(CharOut) == 1 ? 3 : 1;
+template <class CharOut> constexpr ssize_t kMaxInPerOut = sizeof(CharOut) == 1 ? 1 : 3;
 
 /// Returns a + b, or kMax if the sum is larger.
 ssize_t Sum(ssize_t a, ssize_t b) { return a < kMax - b ? a + b : kMax; }
@@ -107,7 +107,7 @@ public:
   /// otherwise grow and shrink each time.
   Destination(basic_xstring<CharOut>& s, ssize_t srcLen)
       : m_string(s), m_oldSize(s.size()), m_oldCapacity(s.capacity()), m_srcLen(srcLen) {
-    if (srcLen > 0 && m_oldCapacity - m_oldSize <= srcLen / kMostIn<CharOut>)
+    if (srcLen > 0 && m_oldCapacity - m_oldSize <= srcLen / kMaxInPerOut<CharOut>)
       Grow(Sum(m_oldSize, srcLen));
   }
 
@@ -119,8 +119,9 @@ public:
   /// Makes room for the result of the last rest units of the source.
   void GrowFor(ssize_t rest) {
     const ssize_t size = m_string.size(), tried = Sum(m_oldSize, m_srcLen);
-    const ssize_t most = size + kMostOut<CharOut> * std::min(rest, (kMax - size) / kMostOut<CharOut>);
-    Grow(m_string.capacity() <= tried ? tried : most);
+    const ssize_t maxSize =
+        size + kMaxOutPerIn<CharOut> * std::min(rest, (kMax - size) / kMaxOutPerIn<CharOut>);
+    Grow(m_string.capacity() <= tried ? tried : maxSize);
   }
   /// Gives back what isn't needed. A string that was appended to keeps twice its old capacity.
   void Finish() {

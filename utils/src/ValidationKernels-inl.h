@@ -45,7 +45,7 @@ template <bool kIsCounted> struct Utf8Scan {
 
   hn::Vec<D> last; ///< the last vector of the block before
   ssize_t continuations, fourBytes;
-  bool isBehindAscii;
+  bool followsAscii;
 
   // Not a constructor: g++ compiles the constructors that it generates for the library's own target, not for
   // the kernels'.
@@ -55,7 +55,7 @@ template <bool kIsCounted> struct Utf8Scan {
   /// counts it if it does.
   HWY_INLINE bool Take(const char8* p) {
     const bool isAscii = IsAscii<kUnits>(p);
-    if (isAscii && isBehindAscii)
+    if (isAscii && followsAscii)
       return true;
     const WideUtf8Block block = WideUtf8Block::Load(p);
     auto before = last, faults = hn::Zero(D());
@@ -72,7 +72,7 @@ template <bool kIsCounted> struct Utf8Scan {
       continuations += Count(block.Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC0); }));
       fourBytes += Count(block.Bits([](auto v, auto) HWY_ATTR { return IsAtLeast(D(), v, 0xF0); }));
     }
-    isBehindAscii = isAscii;
+    followsAscii = isAscii;
     last = before;
     return true;
   }
@@ -86,7 +86,7 @@ template <bool kIsCounted> HWY_INLINE Measured<char8> ScanUtf8(const char8* cons
   while (end - p >= Scan::kUnits && scan.Take(p)) {
     p += Scan::kUnits;
     // A loop of its own for ASCII takes half the time: it has no state.
-    while (scan.isBehindAscii && end - p >= 2 * Scan::kUnits && IsAscii<2 * Scan::kUnits>(p))
+    while (scan.followsAscii && end - p >= 2 * Scan::kUnits && IsAscii<2 * Scan::kUnits>(p))
       p += 2 * Scan::kUnits;
   }
   if (end - p < Scan::kUnits && p != end) {
@@ -94,10 +94,10 @@ template <bool kIsCounted> HWY_INLINE Measured<char8> ScanUtf8(const char8* cons
     std::memcpy(rest, p, std::size_t(end - p));
     if (scan.Take(rest)) {
       p = end;
-      scan.isBehindAscii = true; // zeros follow the text
+      scan.followsAscii = true; // zeros follow the text
     }
   }
-  const ssize_t cutOff = scan.isBehindAscii ? 0 : CutOff(BytesOf(p)); // left to the scalar path
+  const ssize_t cutOff = scan.followsAscii ? 0 : CutOff(BytesOf(p)); // left to the scalar path
   const ssize_t codePoints = p - begin - scan.continuations - (cutOff > 0);
   p -= cutOff;
   return {p, {codePoints, codePoints + scan.fourBytes - (cutOff > 0 && UnitValue(*p) >= 0xF0)}};
