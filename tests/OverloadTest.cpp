@@ -55,6 +55,8 @@ template <class T, class N> void CallWithIntegers() {
   EXPECT_EQ(s.find(x, zero), 1);
   EXPECT_EQ(s.compare(zero, n, s), -1);
   EXPECT_EQ(s[i], x);
+  EXPECT_EQ(std::as_const(s).front(), 'a');
+  EXPECT_EQ(s.length(), 11);
 }
 
 template <class T, class... N> void CallWithEach() { (CallWithIntegers<T, N>(), ...); }

@@ -45,7 +45,7 @@ template <class N> constexpr auto UnsignedValue(N x) {
 }
 
 /// Returns whether x fits in a T, as a signed or as an unsigned number.
-template <class T, class N> constexpr bool HasBitsFor(N x) {
+template <class T, class N> constexpr bool HasBitsFor(N x) { // decided at compile time
   using Unsigned = decltype(UnsignedValue(x));
   using Max = std::numeric_limits<std::make_unsigned_t<T>>;
   if constexpr (std::numeric_limits<Unsigned>::digits <= Max::digits) {

@@ -140,7 +140,7 @@ template <class It> constexpr bool IsNull([[maybe_unused]] const It& it) {
       return it == It();
 #endif
   }
-  return false;
+  return false; // decided at compile time
 }
 
 template <class It>
