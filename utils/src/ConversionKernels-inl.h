@@ -241,11 +241,11 @@ template <class In> struct Conversion {
     }
   }
 
-  /// Converts a text that is shorter than a block.
+  /// Converts a text that is shorter than a block. A code point that its end cuts off is malformed, since
+  /// zeros follow it.
   template <class Block> HWY_INLINE Stop ConvertShort() {
     const ssize_t n = end - p;
-    const Stop stop = n == 0 ? Stop::kEnd : Convert(Block::Load(p, n), 0, n);
-    return stop == Stop::kEnd && p != end ? Stop::kMalformed : stop; // the end cuts a code point off
+    return n == 0 ? Stop::kEnd : Convert(Block::Load(p, n), 0, n);
   }
 };
 
@@ -460,7 +460,7 @@ template <int kVectors, class D> struct Utf8Block {
     }
     const ssize_t stop = kUnits - CutOff(p + kUnits);
     const uint64_t continuations = allContinuations & FirstBits(stop);
-    const uint64_t nonAscii = allNonAscii & FirstBits(stop), highest2 = nonAscii & ~continuations;
+    const uint64_t highest2 = allNonAscii & ~continuations;
     // The lead bytes that the next byte may follow, if it is a continuation byte.
     const uint64_t belowC2 = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC2); });
     const uint64_t leads = highest2 & ~belowC2 & ~BadLeads<true>();
@@ -471,7 +471,7 @@ template <int kVectors, class D> struct Utf8Block {
     const uint64_t fourth = leads4 << 3 & third << 1 & continuations;
     const uint64_t begins = FirstBits(stop) & ~(second | third | fourth);
     const uint64_t whole = (second >> 1 & ~leads3) | (third >> 2 & ~leads4) | fourth >> 3;
-    const uint64_t malformed = begins & nonAscii & ~whole;
+    const uint64_t malformed = begins & allNonAscii & ~whole;
     const ssize_t units = third == 0    ? Store<2, true>(begins, out, malformed)
                           : fourth == 0 ? Store<3, true>(begins, out, malformed)
                                         : Store<4, true>(begins | fourth >> 2, out, malformed);
