@@ -14,7 +14,7 @@ enum class MalformedReason {
   kUnexpectedContinuation, ///< A byte 80 to BF that continues no sequence, as after a malformed lead byte.
   kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 begin nothing else.
   kSurrogate,              ///< A surrogate, D800 to DFFF, encoded in UTF-8.
-  kBeyondUnicode,          ///< A value above U+10FFFF: F4 followed by 90 or above.
+  kBeyondUnicode,          ///< A value above U+10FFFF: F4 followed by 90 to BF.
   kInvalidByte,            ///< A byte F5 to FF, which UTF-8 never has.
   kUnpairedSurrogate,      ///< A UTF-16 surrogate that isn't part of a surrogate pair.
 };

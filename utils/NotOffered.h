@@ -3,7 +3,7 @@
 ///
 /// The operators take their arguments by user-defined conversions, so overload resolution prefers whatever
 /// operator a program or another header declares for such arguments, those of utils/Std.h included. Deleted
-/// members are declared with the others of their name.
+/// members are declared in their classes, after the other public members.
 
 #pragma once
 

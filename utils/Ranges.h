@@ -16,7 +16,7 @@
 /// edit with other iterators copies the elements first. Forward iterators then need only one allocation, but
 /// walk the range twice unless they are random-access iterators. A search allocates nothing.
 ///
-/// This header knows iterators and the byte buffer, but no containers.
+/// This header knows iterators and the byte buffer, but none of the library's vectors and strings.
 
 #pragma once
 
@@ -115,7 +115,8 @@ template <class X> ReverseIteratorsOnlyStep operator>=(X*, const ReversePointer&
 /// Returns the pointer that one of our reverse iterators holds.
 template <class It> const ValueType<It>* Held(It it) { return it; }
 
-/// Returns false for a reversed range of random-access iterators or of our own; others can't be checked.
+/// Returns false for a reversed range of random-access iterators or of our reverse iterators; others can't be
+/// checked.
 template <class It> constexpr bool IsRange(const It& r1, const It& r2) {
   if constexpr (std::is_base_of_v<ReversePointer, It>)
     return Held(r2) <= Held(r1);

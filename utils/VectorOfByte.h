@@ -21,7 +21,7 @@ namespace mirel {
 
 namespace detail {
 
-struct Storage; // gives the conversions access to a vector's storage
+struct Storage; // gives the conversions and FillFrom() access to a vector's storage
 
 /// Throws std::bad_alloc. A throw in a header doesn't compile in a program without exceptions.
 [[noreturn, gnu::cold]] MIREL_API void AllocationFailed();

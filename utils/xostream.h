@@ -132,7 +132,7 @@ public:
 
   /// @}
   /// @name Format
-  /// The setters return the old value.
+  /// precision() and width() return the old value when they set a new one.
   /// @snippet examples/reference.cpp format
   /// @{
 

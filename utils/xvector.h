@@ -50,7 +50,8 @@ namespace mirel {
 /// @par Aliasing
 /// An argument that is, or lies in, the vector itself gives the result as if it had been copied first.
 /// @par Cost
-/// A series of edits takes amortised constant time per element added, plus that of the elements that move.
+/// A series of edits takes amortised constant time per element added, plus time linear in the number of
+/// elements moved.
 /// @par Threads
 /// Different threads may use different vectors, and may read one vector that no thread changes.
 ///

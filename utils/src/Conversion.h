@@ -52,8 +52,8 @@ inline const char8* SkipAscii(const char8* p, const char8* end) {
 }
 inline const char16* SkipAscii(const char16* p, const char16*) { return p; }
 
-/// The fewest units for which a kernel pays: a shorter text is decoded one code point at a time in the time
-/// that a kernel takes to copy it into a block.
+/// The fewest units for which a kernel that checks or counts pays: a shorter text is decoded one code point
+/// at a time in the time that a kernel takes to copy it into a block.
 constexpr ssize_t kLeastForKernels = 24;
 
 /// After malformed text, this many units must be well-formed before the kernels are tried again: where

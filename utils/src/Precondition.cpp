@@ -13,8 +13,8 @@ namespace mirel {
 
 namespace {
 
-/// Cuts off what precedes the last folder utils/. For inline code, __FILE__ is the path by which the program
-/// found the header.
+/// Cuts off what precedes the last directory utils/. For inline code, __FILE__ is the path by which the
+/// program found the header.
 const char* IncludeName(const char* file) {
   while (const char* const folder = std::strstr(file, "/utils/"))
     file = folder + 1;
