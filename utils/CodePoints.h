@@ -139,7 +139,7 @@ inline ssize_t SizeOf(std::string_view text) { return static_cast<ssize_t>(text.
 /// Walks a text by code points, forwards and backwards. Each maximal subpart of malformed text reads as
 /// U+FFFD, and both directions find the same subparts.
 ///
-/// It decodes a code point once, when it reaches it. `*` returns a value, not a reference.
+/// It decodes a code point when it reaches it, not at each `*`. `*` returns a value, not a reference.
 /// @snippet examples/reference.cpp code point iterators
 template <class T> class CodePointIterator {
 public:

@@ -102,8 +102,9 @@ public:
   /// Writes a null-terminated string. @pre "x"
   void put(ConstString8Z x);
 #ifdef __cpp_char8_t
-  void put(char8_t x) { put(static_cast<char>(x)); }                     ///< Writes one byte.
-  void put(const char8_t* x) { put(reinterpret_cast<const char8*>(x)); } ///< Writes a null-terminated string.
+  void put(char8_t x) { put(static_cast<char>(x)); } ///< Writes one byte.
+  /// Writes a null-terminated string of UTF-8. @pre "x"
+  void put(const char8_t* x) { put(reinterpret_cast<const char8*>(x)); }
 #endif
   /// Writes the pn bytes at p. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void put(const char8* p, ssize_t pn);

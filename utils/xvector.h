@@ -558,8 +558,8 @@ public:
   /// @pre "r1 <= r2"
   ///
   /// Nothing is allocated. At worst the cost is linear in the searched length for one element; in the sum of
-  /// both lengths for needles and sets of code units, and for needles of any integers with random-access
-  /// iterators; otherwise in the product of both lengths.
+  /// both lengths for needles and sets that are contiguous units of the vector's width, and for needles of
+  /// any integers with random-access iterators; otherwise in the product of both lengths.
   /// @snippet examples/reference.cpp search
   /// @{
 
