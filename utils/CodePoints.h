@@ -1,8 +1,8 @@
 /// @file
 /// Code points: a range that decodes UTF-8 or UTF-16 while a loop walks it, and a function that appends one.
 ///
-/// Lossy conversions, counts, lengths and the description of malformed text decode single sequences by the
-/// functions here. The strict conversions don't: they have kernels and a scalar path of their own. Nothing
+/// Checks, counts, lengths, lossy conversions and the description of malformed text decode by the functions
+/// here what the kernels leave. The strict conversions don't: they have a scalar path of their own. Nothing
 /// here has global state, and only AppendCodePoint() allocates.
 
 #pragma once

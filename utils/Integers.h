@@ -108,8 +108,9 @@ template <class T, class X> [[gnu::always_inline]] inline T Unit(X x) {
   return static_cast<T>(UnsignedValue(x));
 }
 
-/// Converts an argument to the code unit that is searched for. kMore integers follow it in the call. Two
-/// would be an offset and a needle's length, and the argument a null pointer: that doesn't compile.
+/// Converts an argument to the code unit that is searched for. kMore integers follow it in the call. If there
+/// are two, they are an offset and a needle's length, and the argument was meant as a null pointer: such a
+/// call doesn't compile.
 template <class T, int kMore, class X> [[gnu::always_inline]] inline T UnitToFind(X x) {
   static_assert(kMore <= 1,
                 "an empty needle is (nullptr, offset, 0): a literal 0 is a unit, never a pointer");

@@ -72,7 +72,7 @@ constexpr bool kIsContiguous = std::is_pointer_v<It> || kIsIteratorOf<It, std::v
     ;
 #endif
 
-/// Whether elements of type V are numbers, which have unsigned values.
+/// Whether V is an integer or enumeration type, so that its values have unsigned counterparts.
 template <class V> constexpr bool kIsNumber = std::is_integral_v<V> || std::is_enum_v<V>;
 /// Whether elements of type V are units of the width of T, and so can be copied as bytes.
 template <class T, class V>
@@ -83,8 +83,8 @@ template <class It>
 constexpr bool kIsVolatile =
     std::is_volatile_v<std::remove_reference_t<typename std::iterator_traits<It>::reference>>;
 
-/// Returns whether It is a contiguous iterator over units as wide as T. For other elements kIsContiguous
-/// isn't named, since it names their containers.
+/// Returns whether It is a contiguous iterator over units as wide as T. kIsContiguous isn't instantiated for
+/// other elements, since it would instantiate the standard containers of those.
 template <class T, class It> constexpr bool StandsForPointer() { // decided at compile time
   if constexpr (!kIsUnit<T, ValueType<It>> || kIsVolatile<It>)
     return false;
@@ -178,8 +178,8 @@ template <class T, class N> constexpr bool Fits(N value) {
 }
 
 /// A contiguous range of units. The program may have written them as another type, and compilers assume that
-/// different types don't alias: so only the C library, compiled functions of this library and CopyOf() may
-/// read them, never a mere `*`.
+/// different types don't alias: so only the C library, non-inline functions of this library and CopyOf()
+/// may read them, never a mere `*`.
 template <class T> class UnitSpan {
 public:
   template <class V> UnitSpan(const V* p, ssize_t n) : m_p(reinterpret_cast<const T*>(p)), m_size(n) {}

@@ -317,8 +317,8 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 ///
 /// A failed allocation throws std::bad_alloc before anything has changed. Whatever may grow the buffer may
 /// move its storage, which invalidates pointers into it; erasing keeps the storage and moves down the bytes
-/// that follow. A series of edits takes amortised constant time per byte added, plus that of the bytes that
-/// move.
+/// that follow. A series of edits takes amortised constant time per byte added, plus time linear in the
+/// number of bytes moved.
 /// @snippet examples/reference.cpp VectorOfByte
 class MIREL_DESCRIBED MIREL_API VectorOfByte {
 public:

@@ -42,9 +42,9 @@ inline ssize_t GetStringLength(const char16* s) {
 /// pointer doesn't compile as one.
 /// @pre "s != nullptr" of every null-terminated argument
 ///
-/// Two integers in braces are a count and a unit if they make a string: string8{3, 'x'} has three units. They
-/// are a list if they make a vector, as for assign() or append(). `s = {3, 'x'}` doesn't compile, and `s =
-/// {}` empties the string.
+/// Two integers in braces that initialise a string are a count and a unit: string8{3, 'x'} has three units.
+/// Two that initialise a vector, as in s.append({3, 'x'}), are a list of two units. `s = {3, 'x'}` doesn't
+/// compile, and `s = {}` empties the string.
 /// @snippet examples/reference.cpp basic_xstring
 template <class T> class MIREL_DESCRIBED MIREL_API basic_xstring : public xvector<T> {
   typedef xvector<T> Base;
@@ -323,7 +323,7 @@ detail::ReverseIteratorsOnlyStep Utf16FromAscii(string16&, const detail::Reverse
 
 /// @}
 
-/// Writes the units of v, nulls included, to os without formatting.
+/// Writes the units of v, nulls included, to os as write() does: of the format only the indent applies.
 MIREL_API xostream& operator<<(xostream& os, const string8& v);
 
 /// Does nothing; a reference to it pulls the string code of a static library into a program.

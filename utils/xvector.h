@@ -33,7 +33,8 @@ namespace mirel {
 ///
 /// @par Bad arguments
 /// They stop the process with the text given after "@pre", before anything has changed. They are never
-/// clamped. A null pointer with a count of 0 is an empty range; any other null pointer is a bad argument.
+/// clamped. A null pointer with a count of 0, or a pair of null pointers, is an empty range; any other null
+/// pointer is a bad argument.
 /// @par Ranges
 /// They are checked after all indices and counts: a range of random-access iterators, or of our reverse
 /// iterators, may not be reversed, and the beginning of a range may not be a null pointer unless the end is

@@ -53,11 +53,11 @@ inline const char8* SkipAscii(const char8* p, const char8* end) {
 inline const char16* SkipAscii(const char16* p, const char16*) { return p; }
 
 /// The fewest units for which a kernel that checks or counts pays: a shorter text is decoded one code point
-/// at a time in the time that a kernel takes to copy it into a block.
+/// at a time in the time that a kernel takes to copy it into a block. Conversions have no such limit.
 constexpr ssize_t kLeastForKernels = 24;
 
-/// After malformed text, this many units must be well-formed before the kernels are tried again: where
-/// malformed sequences are dense, each trial would be in vain.
+/// Once the scalar path decodes malformed text, it goes on until this many units in a row are well-formed:
+/// where malformed sequences are dense, the kernels would be tried in vain.
 constexpr ssize_t kWellFormedBeforeKernels = 64;
 
 } // namespace mirel::detail

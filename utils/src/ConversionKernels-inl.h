@@ -2,12 +2,13 @@
 //
 // A text is converted in blocks. For every position of a block the kernel computes what a code point that
 // begins there would give, even where none begins. A byte shuffle from a table then drops the positions where
-// none begins. The only branch that depends on where code points begin takes blocks of three-byte
-// sequences alone. Masks with one bit for each position tell whether the block is well-formed; one that isn't
-// is left to the scalar path, which finds the malformed sequence. From there a lossy conversion goes on in
-// blocks whose masks tell where a maximal subpart begins; there U+FFFD replaces what was computed. A block
-// ends before a code point that its end would cut off, so no state passes from one block to the next. The
-// last block ends where the text ends. It overlaps what has been converted, and may store that part again.
+// none begins. The only branch that depends on where code points begin is the one for blocks that consist of
+// three-byte sequences only. Masks with one bit for each position tell whether the block is well-formed; one
+// that isn't is left to the scalar path, which finds the malformed sequence. From there a lossy conversion
+// goes on in blocks whose masks tell where a maximal subpart begins; there U+FFFD replaces what was computed.
+// A block ends before a code point that its end would cut off, so no state passes from one block to the next.
+// The last block ends where the text ends. It overlaps what has been converted, and may store that part
+// again.
 //
 // There is no include guard: the file is included once for each instruction set.
 
@@ -48,26 +49,28 @@ template <class D> HWY_INLINE hn::Mask<D> MaskOf(D d, uint64_t bits) {
   return hn::LoadMaskBits(d, reinterpret_cast<const uint8_t*>(&bits));
 }
 
-template <class D> HWY_INLINE hn::Vec<D> Repeat(D d, uint8_t x) { return hn::Load(d, kRepeats.rows[x]); }
+template <class D> HWY_INLINE hn::Vec<D> Broadcast(D d, uint8_t x) {
+  return hn::Load(d, kBroadcastBytes.rows[x]);
+}
 
-// There are no shifts of bytes: these shift 16-bit units, and the mask kept drops the bits of the other byte.
+// There are no shifts of bytes: these shift 16-bit units. `kept` is the mask of the bits that stay.
 template <int kBits, class D> HWY_INLINE hn::Vec<D> Left(D d, hn::Vec<D> v, uint8_t kept) {
-  return hn::And(hn::BitCast(d, hn::ShiftLeft<kBits>(hn::BitCast(ToUnits<D>(), v))), Repeat(d, kept));
+  return hn::And(hn::BitCast(d, hn::ShiftLeft<kBits>(hn::BitCast(ToUnits<D>(), v))), Broadcast(d, kept));
 }
 template <int kBits, class D> HWY_INLINE hn::Vec<D> Right(D d, hn::Vec<D> v, uint8_t kept) {
-  return hn::And(hn::BitCast(d, hn::ShiftRight<kBits>(hn::BitCast(ToUnits<D>(), v))), Repeat(d, kept));
+  return hn::And(hn::BitCast(d, hn::ShiftRight<kBits>(hn::BitCast(ToUnits<D>(), v))), Broadcast(d, kept));
 }
 
 template <class D> HWY_INLINE hn::Mask<D> IsEqual(D d, hn::Vec<D> v, uint8_t x) {
-  return hn::Eq(v, Repeat(d, x));
+  return hn::Eq(v, Broadcast(d, x));
 }
 template <class D> HWY_INLINE hn::Mask<D> IsAtLeast(D d, hn::Vec<D> v, uint8_t x) {
-  return hn::Eq(hn::Max(v, Repeat(d, x)), v);
+  return hn::Eq(hn::Max(v, Broadcast(d, x)), v);
 }
 /// Which bytes are in [80, x), in hexadecimal; 0 stands for 100.
 template <class D> HWY_INLINE hn::Mask<D> IsFrom80Below(D d, hn::Vec<D> v, uint8_t x) {
   const hn::RebindToSigned<D> di;
-  return hn::RebindMask(d, hn::Lt(hn::BitCast(di, v), hn::BitCast(di, Repeat(d, x))));
+  return hn::RebindMask(d, hn::Lt(hn::BitCast(di, v), hn::BitCast(di, Broadcast(d, x))));
 }
 template <class D> HWY_INLINE hn::Mask<D> IsNonAscii(D d, hn::Vec<D> v) { return IsFrom80Below(d, v, 0); }
 
@@ -279,18 +282,18 @@ HWY_INLINE Planes<D> UnitsOf(D d, hn::Vec<D> a, hn::Vec<D> b, hn::Vec<D> c) {
     last = Select(isContinuation, c, last);
     beforeLast = Select(isContinuation, b, beforeLast);
   }
-  auto low = hn::Or(Left<6>(d, beforeLast, 0xC0), hn::And(last, Repeat(d, 0x3F)));
+  auto low = hn::Or(Left<6>(d, beforeLast, 0xC0), hn::And(last, Broadcast(d, 0x3F)));
   auto high = Right<2>(d, beforeLast, 0x0F);
   if constexpr (kMaxBytes > 2)
     high = hn::Or(high, hn::IfThenZeroElse(isTwo, Left<4>(d, a, 0xF0)));
   if constexpr (kMaxBytes > 3) {
-    high = Select(isContinuation, hn::Or(hn::And(high, Repeat(d, 0x03)), Repeat(d, 0xDC)), high);
+    high = Select(isContinuation, hn::Or(hn::And(high, Broadcast(d, 0x03)), Broadcast(d, 0xDC)), high);
     // The bits from the 16th on, less 1, as the high surrogate has them.
-    const auto upper = hn::Sub(hn::Or(Left<2>(d, a, 0x1C), Right<4>(d, b, 0x03)), Repeat(d, 1));
+    const auto upper = hn::Sub(hn::Or(Left<2>(d, a, 0x1C), Right<4>(d, b, 0x03)), Broadcast(d, 1));
     const auto lower = hn::Or(Left<2>(d, b, 0x3C), Right<4>(d, c, 0x03));
     const auto isFour = IsAtLeast(d, a, 0xF0);
     low = Select(isFour, hn::Or(Left<6>(d, upper, 0xC0), lower), low);
-    high = Select(isFour, hn::Or(Right<2>(d, upper, 0x03), Repeat(d, 0xD8)), high);
+    high = Select(isFour, hn::Or(Right<2>(d, upper, 0x03), Broadcast(d, 0xD8)), high);
   }
   const auto isNonAscii = IsNonAscii(d, a);
   return {Select(isNonAscii, low, a), hn::IfThenElseZero(isNonAscii, high)};
@@ -358,12 +361,12 @@ template <int kVectors, class D> struct Utf8Block {
     return Bits([](auto lead, auto next) HWY_ATTR {
       const D d;
       // 80 to 9F may not follow E0, and nothing else may follow ED; xor with 0D turns one into the other.
-      const auto swap = hn::IfThenElseZero(IsFrom80Below(d, next, 0xA0), Repeat(d, 0x0D));
+      const auto swap = hn::IfThenElseZero(IsFrom80Below(d, next, 0xA0), Broadcast(d, 0x0D));
       const auto bad = IsEqual(d, hn::Xor(lead, swap), 0xED);
       if (!kHasFourBytes)
         return bad;
       // 80 to 8F may not follow F0, and nothing else may follow F4; xor with 04 turns one into the other.
-      const auto swap4 = hn::IfThenElseZero(IsFrom80Below(d, next, 0x90), Repeat(d, 0x04));
+      const auto swap4 = hn::IfThenElseZero(IsFrom80Below(d, next, 0x90), Broadcast(d, 0x04));
       return hn::Or(bad, hn::Or(IsEqual(d, hn::Xor(lead, swap4), 0xF4), IsAtLeast(d, lead, 0xF5)));
     });
   }
@@ -378,8 +381,8 @@ template <int kVectors, class D> struct Utf8Block {
       auto units = UnitsOf<kMaxBytes>(D(), a, b, c);
       if constexpr (kReplaces) {
         const auto isMalformed = MaskOf(D(), malformed >> k * kLanes<D>);
-        units = {Select(isMalformed, Repeat(D(), 0xFD), units.low),
-                 Select(isMalformed, Repeat(D(), 0xFF), units.high)};
+        units = {Select(isMalformed, Broadcast(D(), 0xFD), units.low),
+                 Select(isMalformed, Broadcast(D(), 0xFF), units.high)};
       }
       end = StorePairs<0, 2>(D(), units.low, units.high, kKeepUnits, keep, end);
       keep = keep >> (kLanes<D> - 1) >> 1;
@@ -440,7 +443,7 @@ template <int kVectors, class D> struct Utf8Block {
     const hn::Repartition<int16_t, D> di;
     const hn::Half<hn::RebindToSigned<D>> half;
     for (int k = 0; k < kVectors; ++k) {
-      const auto bytes = Get<0>(k), replaced = Select(IsNonAscii(d, bytes), Repeat(d, 0xFD), bytes);
+      const auto bytes = Get<0>(k), replaced = Select(IsNonAscii(d, bytes), Broadcast(d, 0xFD), bytes);
       // Sign extension widens FD to FFFD.
       const auto v = hn::BitCast(hn::RebindToSigned<D>(), replaced);
       hn::StoreU(hn::BitCast(d, hn::PromoteTo(di, hn::LowerHalf(half, v))), d, out + 2 * k * kLanes<D>);
@@ -525,16 +528,16 @@ template <class Tag> struct Utf16Block {
   }
 
   /// Returns bytes whose highest bit tells that the unit isn't ASCII.
-  HWY_INLINE hn::Vec<D> NonAscii() const { return hn::Or(hn::SaturatedAdd(high, Repeat(d, 0x7F)), low); }
+  HWY_INLINE hn::Vec<D> NonAscii() const { return hn::Or(hn::SaturatedAdd(high, Broadcast(d, 0x7F)), low); }
   /// Returns whether the block is ASCII, from the units as loaded: ASCII then needs no high bytes.
   HWY_INLINE bool IsAscii() const {
     const ToUnits<D> du;
     return hn::AllTrue(du, hn::Eq(hn::And(hn::BitCast(du, any), hn::Set(du, 0xFF80)), hn::Zero(du)));
   }
-  HWY_INLINE hn::Vec<D> ThreeBytes() const { return hn::SaturatedAdd(high, Repeat(d, 0x78)); }
+  HWY_INLINE hn::Vec<D> ThreeBytes() const { return hn::SaturatedAdd(high, Broadcast(d, 0x78)); }
   /// Returns the units whose high byte has the value kind in the bits of mask.
   HWY_INLINE hn::Mask<D> Is(uint8_t kind, uint8_t mask) const {
-    return IsEqual(d, hn::And(high, Repeat(d, mask)), kind);
+    return IsEqual(d, hn::And(high, Broadcast(d, mask)), kind);
   }
   /// Returns the bits of each unit from the sixth on, masked by kept.
   HWY_INLINE hn::Vec<D> UpperBits(uint8_t kept) const {
@@ -543,29 +546,29 @@ template <class Tag> struct Utf16Block {
 
   /// Stores a block without units from 800 on. Returns the end of its bytes.
   HWY_INLINE uint8_t* StoreTwo(uint64_t two, uint8_t* out) const {
-    const auto lead = hn::Or(UpperBits(0x1F), Repeat(d, 0xC0));
+    const auto lead = hn::Or(UpperBits(0x1F), Broadcast(d, 0xC0));
     const auto first = Select(IsNonAscii(d, NonAscii()), lead, low);
-    const auto last = hn::Or(hn::And(low, Repeat(d, 0x3F)), Repeat(d, 0x80));
+    const auto last = hn::Or(hn::And(low, Broadcast(d, 0x3F)), Broadcast(d, 0x80));
     return StorePairs<8, 1>(d, first, last, kKeepTwoBytes, two, out);
   }
 
   /// Stores any block. Returns the end of its bytes.
   template <bool kHasSurrogates> HWY_INLINE uint8_t* StoreThree(const UnitMasks& masks, uint8_t* out) const {
-    const auto marker = Repeat(d, 0x80), lead3 = hn::Or(Right<4>(d, high, 0x0F), Repeat(d, 0xE0));
-    auto first = Select(IsNonAscii(d, ThreeBytes()), lead3, hn::Or(UpperBits(0x1F), Repeat(d, 0xC0)));
+    const auto marker = Broadcast(d, 0x80), lead3 = hn::Or(Right<4>(d, high, 0x0F), Broadcast(d, 0xE0));
+    auto first = Select(IsNonAscii(d, ThreeBytes()), lead3, hn::Or(UpperBits(0x1F), Broadcast(d, 0xC0)));
     first = Select(IsNonAscii(d, NonAscii()), first, low);
-    auto middle = hn::Or(UpperBits(0x3F), marker), last = hn::Or(hn::And(low, Repeat(d, 0x3F)), marker);
+    auto middle = hn::Or(UpperBits(0x3F), marker), last = hn::Or(hn::And(low, Broadcast(d, 0x3F)), marker);
     if constexpr (kHasSurrogates) {
-      // A high surrogate gives three bytes, the third with bits of the low surrogate; that gives the last
-      // byte.
+      // A high surrogate gives the first three bytes, the third with bits of the low surrogate. The low
+      // surrogate gives the last byte.
       const auto isHigh = Is(0xD8, 0xFC), isLow = Is(0xDC, 0xFC);
-      const auto upper = hn::Add(UpperBits(0x0F), Repeat(d, 1)); // the bits from the 16th on
-      const auto lead4 = hn::Or(Right<2>(d, upper, 0x07), Repeat(d, 0xF0));
+      const auto upper = hn::Add(UpperBits(0x0F), Broadcast(d, 1)); // the bits from the 16th on
+      const auto lead4 = hn::Or(Right<2>(d, upper, 0x07), Broadcast(d, 0xF0));
       first = Select(isLow, last, Select(isHigh, lead4, first));
       const auto second = hn::Or(Left<4>(d, upper, 0x30), Right<2>(d, low, 0x0F));
       middle = Select(isHigh, hn::Or(second, marker), middle);
-      const auto third =
-          hn::Or(Left<4>(d, low, 0x30), hn::And(Window<1>(d, UpperBits(0x0F), hn::Zero(d)), Repeat(d, 0x0F)));
+      const auto third = hn::Or(Left<4>(d, low, 0x30),
+                                hn::And(Window<1>(d, UpperBits(0x0F), hn::Zero(d)), Broadcast(d, 0x0F)));
       last = Select(isHigh, hn::Or(third, marker), last);
     }
     // Four bytes for each unit: first, first, middle, last. The masks of even and of odd groups of four units
@@ -619,7 +622,7 @@ template <class Tag> struct Utf16Block {
 
   /// Returns the block with U+FFFD in the lanes of the mask.
   HWY_INLINE Utf16Block WithReplaced(hn::Mask<D> mask) const {
-    return {Select(mask, Repeat(d, 0xFD), low), Select(mask, Repeat(d, 0xFF), high), any};
+    return {Select(mask, Broadcast(d, 0xFD), low), Select(mask, Broadcast(d, 0xFF), high), any};
   }
 
   /// Converts the block, with U+FFFD for each unpaired surrogate.
@@ -658,7 +661,7 @@ Progress<char16> Utf8FromUtf16(const char16* p, const char16* end, char8* out, c
 template <class D> HWY_INLINE ssize_t WidenAscii(D d, const char8* src, ssize_t i, ssize_t n, char16* dst) {
   for (; n - i >= kLanes<D>; i += kLanes<D>) {
     const auto bytes = hn::LoadU(d, BytesOf(src + i));
-    StoreWidened(d, Select(IsNonAscii(d, bytes), Repeat(d, '?'), bytes), BytesOf(dst + i));
+    StoreWidened(d, Select(IsNonAscii(d, bytes), Broadcast(d, '?'), bytes), BytesOf(dst + i));
   }
   return i;
 }

@@ -52,12 +52,12 @@ constexpr PairFaults MakePairFaults() {
   return faults;
 }
 
-constexpr Repeats MakeRepeats() {
-  Repeats repeats{};
+constexpr BroadcastBytes MakeBroadcastBytes() {
+  BroadcastBytes bytes{};
   for (std::size_t x = 0; x < 256; ++x)
-    for (uint8_t& byte : repeats.rows[x])
+    for (uint8_t& byte : bytes.rows[x])
       byte = static_cast<uint8_t>(x);
-  return repeats;
+  return bytes;
 }
 
 } // namespace
@@ -75,6 +75,6 @@ constexpr Shuffles kReplaceUnits = MakeShuffles([](unsigned mask, unsigned k, au
     add(from, k < 8 && (mask >> k & 1) == (from != k));
 });
 constexpr PairFaults kPairFaults = MakePairFaults();
-constexpr Repeats kRepeats = MakeRepeats();
+constexpr BroadcastBytes kBroadcastBytes = MakeBroadcastBytes();
 
 } // namespace mirel::detail

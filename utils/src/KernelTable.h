@@ -58,8 +58,8 @@ template <class T> struct UnitKernels {
 /// What one instruction set offers for text of both widths.
 struct Kernels : UnitKernels<char8>, UnitKernels<char16> {
   const char* name;
-  /// Converts units from the first of n on, as Utf16FromAscii() does. Returns how many; what is left is less
-  /// than a vector.
+  /// Converts the first of the n units at src, as Utf16FromAscii() does. Returns how many; fewer units than a
+  /// vector holds are left.
   ssize_t (*utf16FromAscii)(const char8* src, ssize_t n, char16* out);
 };
 
@@ -78,8 +78,8 @@ extern const Shuffles kKeepTwoBytes;
 /// For 4 positions of four bytes, the second of them unused: keeps the first byte of each, the last of those
 /// whose bit is set in the lower half of the mask, and the third of those whose bit is set in the upper half.
 extern const Shuffles kKeepThreeBytes;
-/// For 8 bytes followed by the 3 bytes of U+FFFD: replaces those whose bit is set by U+FFFD. Rows of masks
-/// with more than four bits are cut off.
+/// For 8 bytes followed by the 3 bytes of U+FFFD: puts U+FFFD in place of the bytes whose bit is set. Rows of
+/// masks with more than four bits are cut off.
 extern const Shuffles kReplaceUnits;
 
 /// What can be wrong with two adjacent bytes, a bit for each fault. Two bytes have a fault if both nibbles of
@@ -90,11 +90,11 @@ struct alignas(16) PairFaults {
 };
 extern const PairFaults kPairFaults;
 
-/// Each value of a byte, repeated to fill the widest vector.
-struct alignas(64) Repeats {
+/// Each value of a byte, broadcast to the widest vector.
+struct alignas(64) BroadcastBytes {
   uint8_t rows[256][32];
 };
-extern const Repeats kRepeats;
+extern const BroadcastBytes kBroadcastBytes;
 
 /// Returns the k-th best kernels that this processor has, counted from 0; null if there are fewer. Each
 /// call reads what the compiler's runtime has found out about the processor before the program's constructors

@@ -116,7 +116,7 @@ public:
   CharOut* OutEnd() { return m_string.data() + std::max(m_string.capacity() - 1, ssize_t(0)); }
   void SetEnd(const CharOut* out) { Storage::SetSize(m_string, out - m_string.data()); }
 
-  /// Makes room for the result of the last rest units of the source.
+  /// Makes room for the result of the rest of the source, its last `rest` units.
   void GrowFor(ssize_t rest) {
     const ssize_t size = m_string.size(), tried = Sum(m_oldSize, m_srcLen);
     const ssize_t maxSize =

@@ -20,13 +20,13 @@ template <class D, class V = hn::Vec<D>> HWY_INLINE V Faults(D d, V bytes, V bef
   const V first = Window<n - 1>(d, before, bytes);
   const V byHigh = hn::TableLookupBytes(hn::LoadDup128(d, kPairFaults.firstHigh), Right<4>(d, first, 0x0F));
   const V byLow =
-      hn::TableLookupBytes(hn::LoadDup128(d, kPairFaults.firstLow), hn::And(first, Repeat(d, 0x0F)));
+      hn::TableLookupBytes(hn::LoadDup128(d, kPairFaults.firstLow), hn::And(first, Broadcast(d, 0x0F)));
   const V bySecond =
       hn::TableLookupBytes(hn::LoadDup128(d, kPairFaults.secondHigh), Right<4>(d, bytes, 0x0F));
   // The highest bit where the byte two before is at least E0, or the one three before at least F0.
-  const V third = hn::SaturatedSub(Window<n - 2>(d, before, bytes), Repeat(d, 0xE0 - 0x80));
-  const V fourth = hn::SaturatedSub(Window<n - 3>(d, before, bytes), Repeat(d, 0xF0 - 0x80));
-  const V isContinued = hn::And(hn::Or(third, fourth), Repeat(d, 0x80));
+  const V third = hn::SaturatedSub(Window<n - 2>(d, before, bytes), Broadcast(d, 0xE0 - 0x80));
+  const V fourth = hn::SaturatedSub(Window<n - 3>(d, before, bytes), Broadcast(d, 0xF0 - 0x80));
+  const V isContinued = hn::And(hn::Or(third, fourth), Broadcast(d, 0x80));
   return hn::Xor(hn::And(hn::And(byHigh, byLow), bySecond), isContinued);
 }
 

@@ -107,7 +107,7 @@ private:
   char block[kBlockSize];
   ssize_t filled = 0;
   ssize_t written = kInLine;  ///< how much of the line's indent the sink has; kInLine after the indent
-  ssize_t gathered = kInLine; ///< how much of the indent it has once the block is written
+  ssize_t gathered = kInLine; ///< how much of the line's indent the sink will have once it has the block
 };
 
 } // namespace detail
