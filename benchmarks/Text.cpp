@@ -199,13 +199,13 @@ void RegisterLossy(const Language& language, std::size_t size, bool isMalformed)
                   mirel::Utf16FromUtf8Lossy(wide, s.data(), Size(s));
                   return wide.size();
                 }));
-  lossy.Against(isMalformed ? "our strict one, well-formed" : "our strict one",
+  lossy.Against(isMalformed ? "our strict conversion, well-formed" : "our strict conversion",
                 Over(wellFormed, [faults](const std::string& s) {
                   mirel::Utf16FromUtf8(wide, s.data(), Size(s));
                   return wide.size() + faults;
                 }));
   if (isMalformed)
-    lossy.Against("our strict one, again and again", Over(texts, [](const std::string& s) {
+    lossy.Against("our strict conversion, again and again", Over(texts, [](const std::string& s) {
                     return StrictAgain(wide, s.data(), s.data() + s.size());
                   }));
   lossy.Against("ICU", Over(texts, [](const std::string& s) {
@@ -237,7 +237,7 @@ void RegisterLossyBack(const Language& language, std::size_t size, bool isMalfor
                   mirel::Utf8FromUtf16Lossy(narrow, Units(s), Size(s));
                   return narrow.size();
                 }));
-  lossy.Against(isMalformed ? "our strict one, well-formed" : "our strict one",
+  lossy.Against(isMalformed ? "our strict conversion, well-formed" : "our strict conversion",
                 Over(wellFormed, [faults](const std::u16string& s) {
                   mirel::Utf8FromUtf16(narrow, Units(s), Size(s));
                   return narrow.size() + faults * 3; // bytes of U+FFFD

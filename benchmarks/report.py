@@ -292,7 +292,7 @@ def main():
              "  by the same compiler",
              f"- command: `./dev bench`, with `--simdutf` and `--before` for those peers; {repetitions} repetitions of "
              "each party, 9 for the", "  longest, interleaved at random",
-             "- conversions of up to 64 units go through eight texts in turn; texts of 12 to 16 units end at a code point",
+             "- conversions of up to 64 units go through eight texts in turn; texts of 12 to 16 units end between code points",
              "- absolute times on a shared machine mean little, so the tables have none", "",
              "## Goals", "",
              "A goal applies to the geometric mean over the texts, against the peer with the lowest ratio. In brackets is the",
@@ -307,7 +307,8 @@ def main():
             lines += [f"## {heading}", "", text, ""]
     lines += ["## All benchmarks", "",
               f"A cell has the ratios of {' / '.join(names)}; – stands for not measured. The spread is half the",
-              "interquartile range of the ratios of single repetitions, relative to their median: the median of the row.", ""]
+              "interquartile range of the ratios of single repetitions, relative to their median; the column has the median of",
+              "a row's spreads.", ""]
     for area in sorted(areas):
         lines += [f"### {area}", "", *([notes[area], ""] if area in notes else []), *long_table(runs, area)]
     (output / "benchmarks.md").write_text("\n".join(lines).rstrip() + "\n")

@@ -210,6 +210,7 @@ done <<'ROWS'
 --from utf-7//IGNORE|unknown encoding 'utf-7//IGNORE'; did you mean utf-8?
 --from utf64|unknown encoding 'utf64'; did you mean utf-8, utf-16 or utf-32?
 --check -o kept|--check goes with --from and --quiet only
+--check -t utf-8|--check goes with --from and --quiet only
 -cR|--replace and --drop exclude each other
 --bom=add -t ascii|ascii has no byte order mark to add
 --bom=no|--bom takes keep, strip or add, not 'no'

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # Builds the Debian packages for amd64 and arm64 in build/package, and checks them: runs lintian, compares the binary
-# interface with the last version's, and uses the packages in a bare root.
+# interface with the last version's, and uses the packages in a minimal chroot.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 out=$PWD/build/package
@@ -38,7 +38,7 @@ compare_interfaces() {
   [ "${kept[0]}" = "debian/abi/$version.xz" ] || exit 1
 }
 
-# Makes, once, a bare root with what it takes to compile programs, from the archive that apt uses here.
+# Makes, once, a minimal chroot with what it takes to compile programs, from the archive that apt uses here.
 make_base() {
   [ ! -e "$out/base.tar" ] || return 0
   local format='deb $(REPO_URI) $(RELEASE) $(COMPONENT)'
@@ -59,7 +59,7 @@ compare_interfaces
 build arm64 -B -aarm64 -d -Pcross,nocheck # -d: only headers are needed, so no packages of arm64
 qemu-aarch64 -L /usr/aarch64-linux-gnu -E LD_LIBRARY_PATH="$out/arm64/root/usr/lib/aarch64-linux-gnu" \
   "$out/arm64/root/usr/bin/transcode" --version
-say 'making a bare root'
+say 'making a minimal chroot'
 wait "$base"
-say 'installing the packages in a bare root, using and removing them'
+say 'installing the packages in a minimal chroot, using and removing them'
 $as_root tests/package/debian_test.sh "$out/amd64" "$out/base.tar" "$out/bare"

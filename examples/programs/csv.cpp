@@ -18,7 +18,8 @@ using mirel::string8;
 
 using Row = std::vector<mstring8>; // its fields move, so a table grows and is sorted without copying text
 
-/// Parses a table in the form of RFC 4180: quoted fields may have commas, line ends and doubled quotes.
+/// Parses a table whose lines end with a newline. As in RFC 4180, quoted fields may have commas, line ends
+/// and doubled quotes.
 std::vector<Row> Parse(const string8& text) {
   std::vector<Row> rows;
   Row row;

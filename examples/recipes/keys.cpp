@@ -1,5 +1,5 @@
-// Strings as keys of maps. With Less, or Hash and Equal, a map is searched by a literal, a view or a string
-// of either kind, without making a key.
+// Strings as keys of maps. With Less, or Hash and Equal, a map is searched by a literal, a view, or one of
+// our or the standard's strings, without making a key.
 
 #include <cstdio>
 #include <map>

@@ -106,7 +106,7 @@ void Blocks::Decode(bool isEnd) {
   }
   const ssize_t rest = m_filled - m_size;
   if (isEnd && rest > 0 && rest < UnitSize(m_from.form) &&
-      GoesOnBehind({m_size, Describe(mirel::MalformedReason::kTruncated)}, rest))
+      ContinuesAfter({m_size, Describe(mirel::MalformedReason::kTruncated)}, rest))
     m_size = m_filled;
 }
 
@@ -147,7 +147,7 @@ void Blocks::DecodeUtf16(bool isEnd) {
 }
 
 /// Converts all units at once: the fast path. @return how many units make complete sequences, or -1 if one is
-/// malformed and the stream doesn't replace it
+/// malformed and the stream doesn't replace it; always -1 in kCheck, which converts nothing
 template <class Stream, class CharOut, class CharIn>
 ssize_t Blocks::DecodeWhole(mirel::basic_xstring<CharOut>& dst, const CharIn* p, ssize_t n, bool isEnd) {
   // A stream replaces by U+FFFD only, and drops nothing.
@@ -194,14 +194,14 @@ template <class T, class FindPiece> void Blocks::DecodePieces(const T* p, ssize_
       AppendText(m_text, p + i, piece.size);
     i += piece.size;
     m_size = i * unitSize;
-    if (piece.reason == nullptr || !GoesOnBehind({m_size, piece.reason}, piece.malformed * unitSize))
+    if (piece.reason == nullptr || !ContinuesAfter({m_size, piece.reason}, piece.malformed * unitSize))
       return;
     i += piece.malformed;
   }
 }
 
 /// Notes a fault of length bytes, and replaces it in kReplace. @return whether decoding continues after it
-bool Blocks::GoesOnBehind(const Fault& fault, ssize_t length) {
+bool Blocks::ContinuesAfter(const Fault& fault, ssize_t length) {
   if (m_faults == 0)
     m_fault = fault;
   if (m_mode != Mode::kReplace && m_mode != Mode::kDrop)

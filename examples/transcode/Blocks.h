@@ -56,7 +56,8 @@ public:
   std::string_view Utf8();
   /// Returns whether the text begins with the file's byte order mark.
   bool BeginsWithMark() const { return m_isFirst && !m_text.empty() && m_text[0] == kByteOrderMark; }
-  /// The number of the block's bytes before an index of its text, unless U+FFFD replaces some of them.
+  /// The number of the block's bytes before an index of its text. It isn't valid if U+FFFD replaces some of
+  /// them.
   ssize_t OffsetOf(ssize_t index) const;
 
 private:
@@ -74,7 +75,7 @@ private:
   void DecodeUtf32();
   void DecodeBytes();
   template <class T, class FindPiece> void DecodePieces(const T* p, ssize_t n, FindPiece findPiece);
-  bool GoesOnBehind(const Fault& fault, ssize_t length);
+  bool ContinuesAfter(const Fault& fault, ssize_t length);
   ByteOrder OrderByMark() const;
 
   Input& m_input;

@@ -14,7 +14,7 @@ bool IsMachineOrder(ByteOrder order) {
   return (first == 1) == (order == ByteOrder::kLittle);
 }
 
-void ExchangeBytes(string16& units) {
+void SwapBytes(string16& units) {
   for (char16& unit : units)
     unit = static_cast<char16>(unit << 8 | unit >> 8);
 }
@@ -48,7 +48,7 @@ ssize_t EncodedSize(Form form, const char16* p, ssize_t n) {
 }
 
 ssize_t LengthBelow(char16 limit, const char16* p, ssize_t n) {
-  constexpr ssize_t kAtOnce = 64; // compilers test a wide register of units at once
+  constexpr ssize_t kAtOnce = 64; // compilers vectorise the loop over these
   const auto isBelow = [limit](const char16* begin) {
     char16 all = 0; // the limit is a power of two
     for (ssize_t i = 0; i < kAtOnce; ++i)
@@ -66,7 +66,7 @@ void ReadUnits(string16& units, const char* p, ssize_t n, ByteOrder order) {
   if (!units.empty())
     std::memcpy(units.data(), p, 2 * static_cast<std::size_t>(units.size()));
   if (!IsMachineOrder(order))
-    ExchangeBytes(units);
+    SwapBytes(units);
 }
 
 void ReadUnits(std::u32string& units, const char* p, ssize_t n, ByteOrder order) {
@@ -91,7 +91,7 @@ std::string_view Encode(const string16& text, Form form, ByteOrder order, Room& 
     if (IsMachineOrder(order))
       return BytesOf(text);
     room.units = text;
-    ExchangeBytes(room.units);
+    SwapBytes(room.units);
     return BytesOf(room.units);
   case Form::kUtf32: Utf32FromUtf16(room.bytes, text, order); break;
   case Form::kLatin1:

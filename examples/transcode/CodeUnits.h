@@ -22,8 +22,8 @@ ssize_t EncodedSize(Form form, const char16* p, ssize_t n);
 /// Counts the units before the first that is at the limit or above. The limit is a power of two.
 ssize_t LengthBelow(char16 limit, const char16* p, ssize_t n);
 
-/// Reads units of two or four bytes from n bytes, in little or big order. Part of a unit at the end is left
-/// out.
+/// Reads units of two or four bytes from n bytes, little-endian or big-endian. Part of a unit at the end is
+/// left out.
 void ReadUnits(string16& units, const char* p, ssize_t n, ByteOrder order);
 void ReadUnits(std::u32string& units, const char* p, ssize_t n, ByteOrder order);
 

@@ -18,9 +18,9 @@ std::optional<Output> OpenOutput(const Options& options) {
 }
 
 /// Returns a description: "U+20AC, which ascii lacks,".
-std::string Describe(const Lack& lack, const Encoding& to) {
+std::string Describe(const Unmappable& unmappable, const Encoding& to) {
   char name[16];
-  std::snprintf(name, sizeof(name), "U+%04lX", static_cast<unsigned long>(lack.codePoint));
+  std::snprintf(name, sizeof(name), "U+%04lX", static_cast<unsigned long>(unmappable.codePoint));
   return std::string(name) + ", which " + to.name + " lacks,";
 }
 
@@ -38,8 +38,8 @@ private:
   struct File {
     const std::string& name;
     Statistics statistics = {};
-    std::string firstFault = {}; ///< where the first malformed sequence is
-    std::string firstLack = {};  ///< where the first code point is that the output's encoding lacks
+    std::string firstFault = {};      ///< where the first malformed sequence is
+    std::string firstUnmappable = {}; ///< where the first code point is that the output's encoding lacks
   };
 
   void Take(const std::string& name);
@@ -85,7 +85,7 @@ void Conversion::Take(const std::string& name) {
     m_output->Write(m_outgoing.EndFile());
   Tell(file, blocks.Faults(), "malformed sequence", "malformed sequences", file.firstFault);
   const std::string lacks = std::string(" that ") + m_options.to->name + " lacks";
-  Tell(file, m_outgoing.Lacks(), "character" + lacks, "characters" + lacks, file.firstLack);
+  Tell(file, m_outgoing.UnmappableCount(), "character" + lacks, "characters" + lacks, file.firstUnmappable);
   if (m_options.report)
     m_result.reports += BytesOf(file.statistics.Report(file.name + ", " + m_options.from->name));
 }
@@ -93,9 +93,10 @@ void Conversion::Take(const std::string& name) {
 void Conversion::TakeBlock(Blocks& blocks, File& file) {
   if (m_output) {
     m_output->Write(m_outgoing.Encode(blocks));
-    if (const auto& lack = m_outgoing.FirstLack())
-      file.firstLack = ContinueAfter(file, Describe(*lack, *m_options.to),
-                                     file.statistics.PlaceIn(blocks, blocks.OffsetOf(lack->index)));
+    if (const auto& unmappable = m_outgoing.FirstUnmappable())
+      file.firstUnmappable =
+          ContinueAfter(file, Describe(*unmappable, *m_options.to),
+                        file.statistics.PlaceIn(blocks, blocks.OffsetOf(unmappable->index)));
   }
   if (const auto& fault = blocks.FirstFault())
     file.firstFault = ContinueAfter(file, fault->reason, file.statistics.PlaceIn(blocks, fault->offset));

@@ -10,7 +10,7 @@ namespace transcode {
 
 /// The outcome of a run that has reached its end.
 struct Result {
-  bool isWell = true;   ///< whether no file that was checked has a fault
+  bool isWell = true;   ///< whether each file checked could be read and is well-formed
   std::string messages; ///< lines for standard error
   std::string reports;  ///< lines for standard output
 };

@@ -29,7 +29,7 @@ extern "C" void RemoveUnfinished(int signal) {
   raise(signal); // SA_RESETHAND has restored its default action
 }
 
-/// Returns whether the default action of a signal lets the process live, if only after a stop.
+/// Returns whether the default action of a signal doesn't end the process; it may stop it.
 bool IsHarmless(int signal) {
   constexpr int kHarmless[] = {SIGCHLD, SIGCONT, SIGTSTP, SIGTTIN, SIGTTOU, SIGURG, SIGWINCH};
   return std::find(std::begin(kHarmless), std::end(kHarmless), signal) != std::end(kHarmless);
@@ -40,7 +40,7 @@ void RemoveWhenInterrupted(const char* name) {
   for (int signal = 1; signal <= SIGRTMAX; ++signal) {
     struct sigaction action = {};
     if (IsHarmless(signal) || sigaction(signal, nullptr, &action) != 0 || action.sa_handler != SIG_DFL)
-      continue; // the parent process wants it ignored
+      continue; // harmless, reserved by the C library, or ignored as the parent process wants
     action.sa_handler = RemoveUnfinished;
     action.sa_flags = static_cast<int>(SA_RESETHAND);
     sigaction(signal, &action, nullptr);

@@ -26,8 +26,8 @@ const char kHelp[] = "Converts text of any length from one encoding to another, 
                      "  -C, --check              write nothing, only check whether the input is\n"
                      "                           well-formed\n"
                      "      --bom HOW            keep, strip or add the byte order mark; by default\n"
-                     "                           utf-16 and utf-32 have one in the output and lose\n"
-                     "                           it in the input, and other encodings keep it\n"
+                     "                           add it in utf-16 and utf-32 output, strip it if only\n"
+                     "                           the input is one of these, and keep it otherwise\n"
                      "      --line-endings ENDS  end each line with lf or crlf\n"
                      "  -q, --quiet              show no progress on the terminal\n"
                      "  -h, --help               print this help\n"
@@ -58,6 +58,7 @@ struct Parsed {
   bool replace = false;
   bool drop = false;
   bool check = false;
+  const Encoding* to = nullptr; ///< as given by --to
   std::optional<Mark> mark;
 };
 
@@ -100,7 +101,7 @@ void ParseOption(Parsed& parsed, int option) {
   Options& options = parsed.options;
   switch (option) {
   case 'f': options.from = ParseEncoding(optarg); break;
-  case 't': options.to = ParseEncoding(optarg); break;
+  case 't': parsed.to = ParseEncoding(optarg); break;
   case 'l': options.list = true; break;
   case 'o': options.output = ParseOutput(optarg); break;
   case 'r': options.report = true; break;
@@ -126,10 +127,12 @@ Mark UsualMark(const Encoding& from, const Encoding& to) {
 void Combine(Parsed& parsed) {
   Options& options = parsed.options;
   if (parsed.check && (parsed.replace || parsed.drop || options.report || !options.output.empty() ||
-                       parsed.mark || options.lineEnds != LineEnds::kKeep))
+                       parsed.to != nullptr || parsed.mark || options.lineEnds != LineEnds::kKeep))
     throw UsageError("--check goes with --from and --quiet only");
   if (parsed.replace && parsed.drop)
     throw UsageError("--replace and --drop exclude each other");
+  if (parsed.to != nullptr)
+    options.to = parsed.to;
   if (parsed.mark == Mark::kAdd && !options.to->IsUnicode())
     throw UsageError(std::string(options.to->name) + " has no byte order mark to add");
   options.mark = parsed.mark.value_or(UsualMark(*options.from, *options.to));

@@ -3,8 +3,8 @@
 namespace transcode {
 
 void Outgoing::BeginFile() {
-  m_lacks = 0;
-  m_firstLack.reset();
+  m_unmappableCount = 0;
+  m_firstUnmappable.reset();
 }
 
 std::string_view Outgoing::Encode(Blocks& block) {
@@ -37,7 +37,7 @@ std::string_view Outgoing::EndFile() {
 /// Leaves out the mark, and replaces, drops or stops at code points that the encoding lacks.
 const string16& Outgoing::Fit(const Blocks& block) {
   const string16& text = block.Text();
-  m_firstLack.reset();
+  m_firstUnmappable.reset();
   m_fitting.clear();
   for (const char16* p = text.begin() + block.BeginsWithMark();;) {
     const char16* const begin = p;
@@ -46,11 +46,11 @@ const string16& Outgoing::Fit(const Blocks& block) {
     if (p == text.end())
       return m_fitting;
     const char32_t codePoint = *mirel::CodePoints(p, text.end() - p).begin();
-    if (m_lacks == 0)
-      m_firstLack = Lack{p - text.begin(), codePoint};
+    if (m_unmappableCount == 0)
+      m_firstUnmappable = Unmappable{p - text.begin(), codePoint};
     if (m_mode == Mode::kConvert)
       return m_fitting;
-    ++m_lacks;
+    ++m_unmappableCount;
     if (m_mode == Mode::kReplace)
       m_fitting.push_back('?');
     p += codePoint < 0x10000 ? 1 : 2;

@@ -14,7 +14,7 @@ enum class Mark { kKeep, kStrip, kAdd };
 enum class LineEnds { kKeep, kLf, kCrLf };
 
 /// A code point that the encoding lacks, and its index in the text of a block.
-struct Lack {
+struct Unmappable {
   ssize_t index;
   char32_t codePoint;
 };
@@ -36,9 +36,9 @@ public:
   std::string_view EndFile();
 
   /// The first code point of the file that the encoding lacks, if it is in the block.
-  const std::optional<Lack>& FirstLack() const { return m_firstLack; }
+  const std::optional<Unmappable>& FirstUnmappable() const { return m_firstUnmappable; }
   /// The number of the file's code points that the encoding lacks and that have been replaced or dropped.
-  int64 Lacks() const { return m_lacks; }
+  int64 UnmappableCount() const { return m_unmappableCount; }
 
 private:
   const string16& Fit(const Blocks& block);
@@ -52,8 +52,8 @@ private:
   ByteOrder m_order;
   bool m_hasBegun = false;
   bool m_keepsCr = false; ///< whether a carriage return is kept back until it is known what follows it
-  std::optional<Lack> m_firstLack;
-  int64 m_lacks = 0;
+  std::optional<Unmappable> m_firstUnmappable;
+  int64 m_unmappableCount = 0;
   string16 m_fitting; ///< the text without what the encoding lacks
   string16 m_text;    ///< the text with other line ends, or another beginning
   Room m_room;

@@ -14,7 +14,7 @@ namespace {
 using mirel::char16;
 
 /// Counts the units of [p, end) that are of a kind. The inner loop's counter is as wide as a unit, so that
-/// compilers test a wide register of units at once.
+/// compilers vectorise the loop well.
 template <class T, class Predicate> ssize_t Count(const T* p, const T* end, Predicate isOfKind) {
   using Counter = std::conditional_t<sizeof(T) == 1, unsigned char, char16>;
   constexpr ssize_t kMax = std::numeric_limits<Counter>::max();
