@@ -1,9 +1,9 @@
 /// @file
 /// Code points: a range that decodes UTF-8 or UTF-16 while a loop walks it, and a function that appends one.
 ///
-/// Checks, counts, lengths, lossy conversions and the description of malformed text decode by the functions
-/// here what the kernels leave. The strict conversions don't: they have a scalar path of their own. Nothing
-/// here has global state, and only AppendCodePoint() allocates.
+/// Checking, counting and ExplainMalformed() also decode with the functions here, wherever no SIMD kernel
+/// does it for them, and so do the lossy conversions from malformed text on. The strict conversions don't:
+/// they have a scalar path of their own. Nothing here has global state, and only AppendCodePoint() allocates.
 
 #pragma once
 
@@ -215,8 +215,8 @@ private:
   bool m_isWellFormed = true;
 };
 
-/// The code points of a text that the range doesn't own; CodePoints() makes one. A change of the text's
-/// storage invalidates the range and its iterators.
+/// The code points of a text that the range doesn't own. CodePoints() makes such a range. Any change of the
+/// text invalidates the range and its iterators.
 /// @snippet examples/reference.cpp code points
 template <class T> class CodePointRange {
 public:

@@ -24,7 +24,8 @@
 
 namespace mirel::detail {
 
-/// Formats a string with its base, the formatter of std::string_view.
+/// Formats a string: passes a view of it, or of its copy in UTF-8, to the base class, the formatter of
+/// std::string_view.
 template <class T, class ViewFormatter> struct StringFormatter : ViewFormatter {
   template <class Context> auto format(const basic_xstring<T>& text, Context& context) const {
     ViewFormatter view = *this; // a copy, since format() isn't const in early standard libraries

@@ -8,8 +8,8 @@
 namespace mirel {
 
 /// Returns the name of the instruction set that searches and conversions use on this processor: "AVX2",
-/// "SSE4" or "NEON", or "none" where the processor has none of these or the library was built without
-/// kernels. No result depends on it.
+/// "SSE4" or "NEON", or "none" if the library has no SIMD code for the processor or was built without it. No
+/// result depends on it.
 MIREL_API const char* KernelName();
 
 } // namespace mirel

@@ -10,7 +10,7 @@ namespace mirel {
 /// Why a sequence isn't well-formed.
 enum class MalformedReason {
   kNone,                   ///< It is well-formed.
-  kTruncated,              ///< The text ends, or goes on with another unit, before the sequence is complete.
+  kTruncated,              ///< The end of the text, or a non-continuation byte, cuts the sequence off.
   kUnexpectedContinuation, ///< A byte 80 to BF that continues no sequence, as after a malformed lead byte.
   kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 begin nothing else.
   kSurrogate,              ///< A surrogate, D800 to DFFF, encoded in UTF-8.

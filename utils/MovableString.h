@@ -17,9 +17,10 @@ namespace mirel {
 /// A `std::vector` of movable strings grows, sorts and erases without copying any text. A moved-from string
 /// is empty and has no storage.
 ///
-/// A movable string takes over the storage of a temporary or moved basic_xstring; `s.swap(m)` gives the
-/// storage to a basic_xstring `s`. Inherited members keep their result types: `substr()` returns a
-/// basic_xstring, whose storage is taken over without a copy, and `+` returns a vector, which is copied.
+/// A movable string takes over the storage of a temporary or moved basic_xstring. To pass the storage of a
+/// movable string `m` to a basic_xstring `s`, call `s.swap(m)`. Inherited members keep their result types:
+/// `substr()` returns a basic_xstring, whose storage is taken over without a copy, and `+` returns a vector,
+/// which is copied.
 /// @snippet examples/reference.cpp MovableString
 template <class T> class MIREL_DESCRIBED MovableString : public basic_xstring<T> {
   typedef basic_xstring<T> Base;
@@ -44,8 +45,8 @@ public:
   MovableString& operator=(const MovableString& r) = default;
   /// Releases its own storage and takes over that of r, which is then empty.
   MovableString& operator=(MovableString&& r) noexcept { return *this = static_cast<Base&&>(r); }
-  /// Becomes a copy of a vector, as operator+ returns it. It is a template so that braces never convert to a
-  /// vector.
+  /// Becomes a copy of a vector, such as a result of operator+. It is a template so that braces never convert
+  /// to a vector.
   template <class V, std::enable_if_t<std::is_same_v<V, xvector<T>>, int> = 0>
   MovableString& operator=(const V& r) {
     xvector<T>::operator=(r);

@@ -1,10 +1,9 @@
 /// @file
-/// Ranges as arguments: which iterators they may have, how they are checked, and what their elements count
-/// as.
+/// Ranges as arguments: which iterators they may have, how they are checked, and how their elements are read.
 ///
 /// @par Units of other types
 /// A range may have any iterators over integers or enumerators, but not over types that convert to them. Each
-/// element counts by its unsigned value, on every processor: the byte E9 is the unit 00E9 of a string16,
+/// element is read as its unsigned value, on every processor: the byte E9 is the unit 00E9 of a string16,
 /// whether plain char is signed or not. A stored element must fit the vector's units, which is checked before
 /// anything changes. An element that is searched for may have any value, and equals nothing if it doesn't
 /// fit.
@@ -13,8 +12,9 @@
 /// @par Cost
 /// Pointers to elements of the vector's width, and the iterators of string views and of standard strings and
 /// vectors of such elements, are as fast as `const T*`; from C++20 on so is every contiguous iterator. An
-/// edit with other iterators copies the elements first. Forward iterators then need only one allocation, but
-/// walk the range twice unless they are random-access iterators. A search allocates nothing.
+/// edit with other iterators copies the elements first. If they are forward iterators, the copy takes one
+/// allocation, but the range is walked twice unless they are random-access iterators. A search allocates
+/// nothing.
 ///
 /// This header knows iterators and the byte buffer, but none of the library's vectors and strings.
 
@@ -92,8 +92,8 @@ template <class T, class It> constexpr bool StandsForPointer() { // decided at c
     return kIsContiguous<It>;
 }
 
-/// The base of our reverse iterators. They convert to the pointers that they hold, whose arithmetic has the
-/// opposite meaning, so it is deleted here.
+/// The base of our reverse iterators. They convert to the pointers that they hold, whose arithmetic and order
+/// have the opposite direction, so the operators for both are deleted here.
 struct ReversePointer {
   template <class X> ReverseIteratorsOnlyStep operator[](const X&) const = delete;
   template <class X> ReverseIteratorsOnlyStep operator+(const X&) const = delete;
@@ -229,7 +229,8 @@ private:
   VectorOfByte m_units;
 };
 
-/// An iterator over the unsigned values of a range: random-access or forward as the range's, otherwise input.
+/// An iterator over the unsigned values of a range. Its category is random-access, forward or input: the
+/// strongest of these that the range's iterators have.
 template <class It> class ValueIterator {
 public:
   typedef std::conditional_t<
@@ -282,8 +283,9 @@ template <class T, class It> UnitSpan<T> Span(It r1, It r2) {
     return {r1 == r2 ? nullptr : __builtin_addressof(*r1), static_cast<ssize_t>(r2 - r1)};
 }
 
-/// Returns the units of [r1, r2) as a contiguous range to copy from. It makes a copy if the iterators aren't
-/// contiguous, since only a pointer reveals whether it points into the vector.
+/// Returns the units of [r1, r2) as a contiguous range to copy from. It makes a copy unless the iterators are
+/// contiguous over units as wide as T: other elements must be converted, and other iterators don't reveal
+/// whether they point into the vector.
 template <class T, class It> auto Source(It r1, It r2) {
   if constexpr (StandsForPointer<T, It>())
     return Span<T>(r1, r2);

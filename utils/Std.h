@@ -1,8 +1,8 @@
 /// @file
 /// What connects the strings to the standard library: operators, hashes, views, copies, and streams.
 ///
-/// All but FillFrom() uses only public members of the strings. A program that doesn't include it pays
-/// nothing. Formatted output is in utils/Format.h.
+/// Everything but FillFrom() uses only public members of the strings. A program that doesn't include this
+/// header pays nothing for it. Formatted output is in utils/Format.h.
 
 #pragma once
 
@@ -74,7 +74,8 @@ template <class T> std::size_t HashText(TextRef<T> text) {
 /// Compare strings, vectors and results of `+` of one width with each other, or with an Operand on either
 /// side: a null-terminated string or, for 8-bit text, whatever converts to `std::string_view`. Code units
 /// compare as unsigned values; a proper prefix of a string orders before it. A literal null pointer or 0
-/// doesn't compile. Nothing is allocated; the cost is at worst linear in the shorter length.
+/// doesn't compile. Nothing is allocated. The cost is at worst linear in the shorter length, plus the length
+/// of a null-terminated string, which is measured first.
 /// @pre "s != nullptr" of a null-terminated string
 ///
 /// @snippet examples/reference.cpp operators
@@ -127,9 +128,11 @@ template <class T> bool operator>=(detail::Operand<T> a, const xvector<T>& b) { 
 
 /// @}
 /// @name Keys
-/// Comparators and a hash for maps that are searched without copying the key, with whatever the operators
-/// compare: a `std::map` from C++17 on, an unordered map from C++20 on. A pointer is always a null-terminated
-/// string, never an address, even where both operands are pointers.
+/// Comparators and a hash for maps. They let you search a map for any text that the operators compare,
+/// without copying it into a key: a `std::map` from C++17 on, an unordered map from C++20 on. A pointer is
+/// always a null-terminated string, never an address, even where both operands are pointers.
+/// @pre "s != nullptr" of a null-terminated string
+///
 /// @snippet examples/reference.cpp keys
 /// @{
 

@@ -8,8 +8,8 @@
 namespace mirel {
 
 /// Where the bytes of an xostream go: implement it for a file, a socket or a string.
-/// An exception that an implementation throws passes through the stream's member. The stream counts the bytes
-/// of that call as not written.
+/// An exception that an implementation throws propagates to the caller of the stream. The stream counts the
+/// bytes of that call as not written.
 /// @snippet examples/reference.cpp sinks
 struct MIREL_API IOutputStream {
   virtual ~IOutputStream();

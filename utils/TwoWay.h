@@ -14,21 +14,21 @@ namespace mirel {
 
 namespace detail {
 
-/// Decides how long a search may compare the needle at each place. That is fast as long as most comparisons
-/// fail within the first units, and takes quadratic time where they don't.
+/// Decides how long a search may compare the needle at each position. That is fast as long as most
+/// comparisons fail within the first units, and takes quadratic time if they don't.
 class Credit {
 public:
   explicit Credit(ssize_t needleLength) : m_credit(needleLength / 2 + 64) {}
 
   /// Returns whether the search may go on, after a comparison that found equalUnits equal units and then a
-  /// difference; passed is the number of places searched so far.
+  /// difference; passed is the number of positions searched so far.
   bool Allows(ssize_t equalUnits, ssize_t passed) {
     m_credit -= equalUnits / 4 + 8;
     return m_credit + 4 * int64(passed) >= 0;
   }
 
 private:
-  int64 m_credit; // 64 bits, since each place counts four
+  int64 m_credit; // 64 bits, since four for each position may exceed a 32-bit ssize_t
 };
 
 /// Counts the equal elements before the first difference of the n at x and the n at y; n if all are equal.
@@ -40,9 +40,9 @@ template <class It1, class It2> ssize_t EqualElements(It1 x, It2 y, ssize_t n) {
 }
 
 /// Two-way string matching, by Crochemore and Perrin (1991). The needle is cut in two. Its right part is
-/// compared forwards; a mismatch there moves the needle until its right part begins past it. Then the left
-/// part is compared backwards; a mismatch there moves the needle by its period if it is periodic, otherwise
-/// by one more than the longer part.
+/// compared forwards; a mismatch there moves the needle until its right part begins past the mismatch. Then
+/// the left part is compared backwards; a mismatch there moves the needle by its period if the needle is
+/// periodic, otherwise by one more than the longer part.
 template <class It> class TwoWay {
 public:
   /// Prepares a needle of at least one element.
@@ -113,7 +113,7 @@ private:
 };
 
 /// Returns the start of the first occurrence of [y1, y2) in [x1, x2), or x2. It compares the needle at each
-/// place, and changes to TwoWay once that turns out to be slow.
+/// position, and switches to TwoWay once that turns out to be slow.
 template <class It1, class It2> It1 FindNeedle(It1 x1, It1 x2, It2 y1, It2 y2) {
   const ssize_t length = y2 - y1;
   if (length == 0)

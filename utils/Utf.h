@@ -9,7 +9,7 @@
 /// What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for UTF-16.
 /// Each function takes a pointer and a count of units, or a string; for 8-bit text also a std::string_view,
 /// and so a std::string or a literal. A null pointer with a count of 0 is an empty text. Every function takes
-/// linear time, and reads no unit outside the text.
+/// at most linear time, and reads no unit outside the text.
 
 #pragma once
 
@@ -56,25 +56,26 @@ inline bool IsWellFormed(const xvector<char16>& text) { return FindMalformed(tex
 inline bool IsWellFormed(std::string_view text) { return FindMalformed(text) < 0; }
 bool IsWellFormed(std::nullptr_t) = delete;
 
-/// Explains what is wrong with the sequence that begins at an offset: a result of FindMalformed(), or another
-/// boundary of sequences. A well-formed sequence has its own length and the reason kNone. Constant time.
+/// Explains what is wrong with the sequence that begins at offset, which is a result of FindMalformed() or
+/// another index at which a sequence begins. For a well-formed sequence, the result has its length and the
+/// reason kNone. Constant time.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)", then "0 <= offset && offset < pn"
 MIREL_API MalformedText ExplainMalformed(const char8* p, ssize_t pn, ssize_t offset);
 /// Explains what is wrong with the UTF-16 sequence that begins at an offset. Constant time.
 /// @pre "pn == 0 || (pn > 0 && p != nullptr)", then "0 <= offset && offset < pn"
 MIREL_API MalformedText ExplainMalformed(const char16* p, ssize_t pn, ssize_t offset);
-/// Explains what is wrong with the sequence of a string that begins at an offset. Constant time.
-/// @pre "0 <= offset && offset < pn", where pn is its size
+/// Explains what is wrong with the sequence at an offset in a UTF-8 string. Constant time.
+/// @pre "0 <= offset && offset < pn", where pn is the string's size
 inline MalformedText ExplainMalformed(const xvector<char8>& text, ssize_t offset) {
   return ExplainMalformed(text.data(), text.size(), offset);
 }
-/// Explains what is wrong with the sequence of a string that begins at an offset. Constant time.
-/// @pre "0 <= offset && offset < pn", where pn is its size
+/// Explains what is wrong with the sequence at an offset in a UTF-16 string. Constant time.
+/// @pre "0 <= offset && offset < pn", where pn is the string's size
 inline MalformedText ExplainMalformed(const xvector<char16>& text, ssize_t offset) {
   return ExplainMalformed(text.data(), text.size(), offset);
 }
-/// Explains what is wrong with the sequence of a view's text that begins at an offset. Constant time.
-/// @pre "0 <= offset && offset < pn", where pn is its size
+/// Explains what is wrong with the sequence at an offset in a view's text. Constant time.
+/// @pre "0 <= offset && offset < pn", where pn is the view's size
 inline MalformedText ExplainMalformed(std::string_view text, ssize_t offset) {
   return ExplainMalformed(text.data(), detail::SizeOf(text), offset);
 }
@@ -152,7 +153,7 @@ MIREL_API bool Utf8FromUtf16(string8& dst, std::u16string_view text);
 /// appending what precedes the malformed sequence. A failed allocation throws std::bad_alloc and leaves what
 /// the destination held and the beginning of the result. Where the storage of a destination that isn't empty
 /// grows, it at least doubles, so that many small texts take amortised linear time. The source may not lie in
-/// the destination. To append and replace malformed text, use a UtfStream.
+/// the destination. To replace malformed text while appending, use a UtfStream.
 /// @snippet examples/reference.cpp appending conversions
 /// @{
 
@@ -184,8 +185,8 @@ inline bool AppendUtf8(string8& dst, const xvector<char16>& text) {
 /// @snippet examples/reference.cpp lossy conversions
 /// @{
 
-/// Converts UTF-8 to UTF-16 and replaces malformed text. @return how many U+FFFD replace it @pre "pn == 0 ||
-/// (pn > 0 && p != nullptr)"
+/// Converts UTF-8 to UTF-16 and replaces malformed text. @return how many U+FFFD replace it
+/// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf16FromUtf8Lossy(string16& dst, const char8* p, ssize_t pn);
 /// Converts a string from UTF-8 to UTF-16 and replaces malformed text. @return how many U+FFFD replace it
 inline ssize_t Utf16FromUtf8Lossy(string16& dst, const xvector<char8>& text) {
@@ -197,8 +198,8 @@ inline ssize_t Utf16FromUtf8Lossy(string16& dst, std::string_view text) {
   return Utf16FromUtf8Lossy(dst, text.data(), detail::SizeOf(text));
 }
 ssize_t Utf16FromUtf8Lossy(string16&, std::nullptr_t) = delete;
-/// Converts UTF-16 to UTF-8 and replaces unpaired surrogates. @return how many U+FFFD replace them @pre "pn
-/// == 0 || (pn > 0 && p != nullptr)"
+/// Converts UTF-16 to UTF-8 and replaces unpaired surrogates. @return how many U+FFFD replace them
+/// @pre "pn == 0 || (pn > 0 && p != nullptr)"
 MIREL_API ssize_t Utf8FromUtf16Lossy(string8& dst, const char16* p, ssize_t pn);
 /// Converts a string from UTF-16 to UTF-8 and replaces unpaired surrogates. @return how many U+FFFD replace
 /// them

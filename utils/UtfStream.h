@@ -20,8 +20,8 @@ public:
   explicit UtfStream(OnMalformed onMalformed = OnMalformed::kStop) : m_onMalformed(onMalformed) {}
 
   /// Converts the units pending from the last piece and the pn units at p, and appends the result to dst.
-  /// Units at the end that may begin a sequence are pending until the next piece completes it: up to three
-  /// bytes of UTF-8, one unit of UTF-16.
+  /// Units at the end that may begin a sequence are pending until later pieces complete it or show that it is
+  /// malformed: up to three bytes of UTF-8, one unit of UTF-16.
   ///
   /// A failed allocation throws std::bad_alloc; dst then holds the beginning of the result, and the stream
   /// can't go on: assign a new one to it. The source may not lie in dst.
@@ -42,8 +42,9 @@ public:
     const std::string_view view = text;
     return Append(dst, view.data(), static_cast<ssize_t>(view.size()));
   }
-  /// Ends the text. Pending units are malformed, since nothing completes them: they become U+FFFD or
-  /// stop the stream. The next call begins another text; until then the members below describe this one.
+  /// Ends the text. Pending units are malformed, since nothing completes them: they become U+FFFD in dst or
+  /// stop the stream. A failed allocation throws as in Append(). The next Append() or Finish() begins another
+  /// text; until then the members below describe this one.
   /// @return false if the stream has stopped at malformed text; always true with kReplace
   bool Finish(basic_xstring<CharOut>& dst);
 

@@ -21,7 +21,7 @@ class IndentingOutputStreamToOStream;
 
 namespace detail {
 
-/// Named by the compiler's message for put() of a pointer to other characters.
+/// The return type of the deleted put(), so that the compiler's message says what to write instead.
 struct ConvertToCharsOrVoidPointer {};
 
 /// Lets a template take part in overload resolution only if C is one of the types.
@@ -60,7 +60,7 @@ public:
 
   /// @}
   /// @name Writing bytes as they are
-  /// Write bytes unformatted, nulls included; of the format only the indent applies. A null pointer with a
+  /// Write bytes unformatted, nulls included: the indent applies, but not the width. A null pointer with a
   /// count of 0 writes nothing.
   /// @snippet examples/reference.cpp writing bytes
   /// @{
@@ -73,8 +73,8 @@ public:
   /// @}
   /// @name Writing values
   /// Write values as `<<` of the standard streams does, padded to width(), which is 0 again afterwards. Wide
-  /// characters are written as UTF-8, and as U+FFFD if they aren't Unicode scalar values. `<<` takes strings
-  /// and manipulators only.
+  /// characters are written as UTF-8, and as U+FFFD if they aren't Unicode scalar values. The `<<` of an
+  /// xostream takes strings and manipulators only.
   /// @snippet examples/reference.cpp writing values
   /// @{
 
@@ -86,16 +86,16 @@ public:
   void put(char16_t x);           ///< Writes a code point in UTF-8; a surrogate becomes U+FFFD.
   void put(char32_t x);           ///< Writes a code point in UTF-8.
   void put(short x);              ///< Writes a decimal number.
-  void put(unsigned short x);     ///< Writes a decimal number, of a char16 too, which is the same type.
+  void put(unsigned short x);     ///< Writes a decimal number, even for a char16, which is the same type.
   void put(int x);                ///< Writes a decimal number.
   void put(unsigned int x);       ///< Writes a decimal number.
   void put(long x);               ///< Writes a decimal number.
   void put(unsigned long x);      ///< Writes a decimal number.
   void put(long long x);          ///< Writes a decimal number.
   void put(unsigned long long x); ///< Writes a decimal number.
-  void put(float x);              ///< Writes a number of precision() significant digits.
-  void put(double x);             ///< Writes a number of precision() significant digits.
-  void put(long double x);        ///< Writes a number of precision() significant digits.
+  void put(float x);              ///< Writes a number with at most precision() significant digits.
+  void put(double x);             ///< Writes a number with at most precision() significant digits.
+  void put(long double x);        ///< Writes a number with at most precision() significant digits.
   /// Writes an address in hexadecimal. A pointer to char or char8_t is text instead; one to other characters
   /// doesn't compile.
   void put(const void* x);
@@ -111,7 +111,7 @@ public:
   /// Writes the pn bytes at p, padded to the given width instead of width().
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void put_internal(const xchar* p, ssize_t pn, ssize_t width);
-  /// Calls the manipulator with this stream, which it returns.
+  /// Calls the manipulator with this stream and returns its result.
   xostream& operator<<(Manipulator manipulator) { return manipulator(*this); }
   xostream& operator<<(std::nullptr_t) = delete; // a literal 0 isn't a manipulator
   /// @cond

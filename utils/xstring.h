@@ -16,11 +16,11 @@ namespace mirel {
 
 class xostream;
 
-/// Counts the code units before the null at s, in linear time. s may not be a null pointer, and isn't
-/// checked.
+/// Counts the code units from s to the first null, which isn't included, in linear time. s may not be a null
+/// pointer; that isn't checked.
 inline ssize_t GetStringLength(const char8* s) { return static_cast<ssize_t>(std::strlen(s)); }
-/// Counts the 16-bit code units before the null at s, in linear time. s may not be a null pointer, and isn't
-/// checked.
+/// Counts the 16-bit code units from s to the first null, which isn't included, in linear time. s may not be
+/// a null pointer; that isn't checked.
 inline ssize_t GetStringLength(const char16* s) {
   const char16* end = s;
   while (*end != 0)
@@ -71,7 +71,8 @@ public:
   template <class It, detail::IfIterator<It> = 0> basic_xstring(It r1, It r2) : Base(r1, r2) {}
   /// Copies a string; the capacity is the size.
   basic_xstring(const basic_xstring<T>& r) : Base(r) {}
-  /// Copies a vector, as operator+ returns it. It is a template so that braces never convert to a vector.
+  /// Copies a vector, such as a result of operator+. It is a template so that braces never convert to a
+  /// vector.
   template <class V, std::enable_if_t<std::is_same_v<V, xvector<T>>, int> = 0>
   basic_xstring(const V& r) : Base(r) {}
   /// Releases the storage.
@@ -103,9 +104,10 @@ public:
 
   /// Returns the contents with a null past the end, which is not part of the string.
   ///
-  /// The call counts as a change, although it is const: no other thread may use the string meanwhile. Without
-  /// unused capacity it makes room, for more than the null so that appends and c_str() in turn take amortised
-  /// constant time; that may move the storage, which invalidates pointers, references, iterators and views.
+  /// The call counts as a change, although it is const: no other thread may use the string meanwhile. If
+  /// there is no unused capacity, it makes room, and for more than the null: appends that alternate with
+  /// c_str() then take amortised constant time. Making room may move the storage, which invalidates pointers,
+  /// references, iterators and views.
   /// The result is valid until the next change other than c_str(), which returns the same pointer again.
   const T* c_str() const {
     const ssize_t n = this->size();
@@ -157,7 +159,7 @@ public:
   /// @pre "0 <= i && 0 <= n && i+n <= size()"
   int compare(ssize_t i, ssize_t n, const T* p) const { return compare(i, n, p, MIREL_LENGTH(p)); }
   using Base::_Eq;
-  /// Returns whether the string has the units of a null-terminated string.
+  /// Returns whether the string equals a null-terminated string.
   bool _Eq(const T* rhs) const { return compare(rhs) == 0; }
   using Base::_Lt;
   /// Returns whether the string orders before a null-terminated string.
@@ -267,13 +269,15 @@ extern template class xvector<char16>;
 extern template class basic_xstring<char16>;
 
 /// @name Conversions
-/// Replace the contents of the destination with the srcLen units at src, in one pass and in linear time.
+/// Convert the srcLen units at src, in one pass and in linear time, and replace the contents of the
+/// destination with the result.
 /// UTF-16 is in the machine's own byte order; a byte order mark is a code point like any other, and so is a
 /// null. What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for
 /// UTF-16. A failed allocation throws std::bad_alloc; a UTF conversion then leaves the beginning of the
-/// result in the destination, the conversion from ASCII leaves the destination as it was. On return the
-/// destination has its old capacity, or that of the result and the terminator of c_str() if that is more. The
-/// source may not lie in the destination. A null pointer with a count of 0 is an empty source.
+/// result in the destination; the conversion from ASCII leaves the destination as it was. On return the
+/// destination has its old capacity, or room for the result and the terminator of c_str() if that is more.
+/// The source may not lie in the destination. A null pointer with a count of 0 is an empty source; src
+/// isn't checked otherwise.
 /// @snippet examples/reference.cpp conversions
 /// @{
 
@@ -300,8 +304,8 @@ MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src, ssize_t srcLen);
 /// @pre "src"
 MIREL_API bool Utf8FromUtf16(string8& dst, const char16* src);
 
-/// Converts between the encodings in generic code: CharOut is char16 and CharIn char8 from UTF-8 to UTF-16,
-/// and the reverse from UTF-16 to UTF-8.
+/// Converts between the encodings in generic code: from UTF-8 to UTF-16 if CharOut is char16 and CharIn is
+/// char8, and from UTF-16 to UTF-8 if CharOut is char8 and CharIn is char16.
 /// @return false if the source is malformed or truncated; the destination then holds what precedes the
 /// malformed sequence
 /// @pre "srcLen >= 0"
@@ -323,7 +327,7 @@ detail::ReverseIteratorsOnlyStep Utf16FromAscii(string16&, const detail::Reverse
 
 /// @}
 
-/// Writes the units of v, nulls included, to os as write() does: of the format only the indent applies.
+/// Writes the units of v, nulls included, to os as write() does: the indent applies, but not the width.
 MIREL_API xostream& operator<<(xostream& os, const string8& v);
 
 /// Does nothing; a reference to it pulls the string code of a static library into a program.
