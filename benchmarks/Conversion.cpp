@@ -162,8 +162,8 @@ void RegisterFresh(const Language& language, std::size_t size) {
                }));
 }
 
-/// Registers conversions of text in which a byte that never occurs in UTF-8 follows about every so many
-/// bytes. Each party is called again after every such byte, so that it reports all of them.
+/// Registers conversions of text with an FF, which never occurs in UTF-8, about every `every` bytes. Each
+/// party is called again after every FF, so that it reports all of them.
 void RegisterMalformed(const Language& language, const char* data, std::size_t every) {
   auto& malformed = *new Malformed{TextsIn<char>(language, std::size_t(1) << 16)[0], {0}};
   std::string& text = malformed.text;

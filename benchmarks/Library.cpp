@@ -1,4 +1,5 @@
-// Compiled twice where an earlier version takes part: with its headers, `mirel` is a macro for its namespace.
+// Compiled twice where an earlier version takes part. The second time, the headers are that version's, and
+// `mirel` is a macro for its namespace.
 #include "Library.h"
 
 #include <map>

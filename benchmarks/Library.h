@@ -63,14 +63,14 @@ extern const Library kOurs;
 extern const Library kBefore;
 #endif
 
-/// Adds this library to a case, and if isBesideBefore the earlier version.
-template <class Make> Case& AddLibrary(Case& to, bool isBesideBefore, Make make) {
+/// Adds this library to a case, and if withEarlierVersion the earlier version.
+template <class Make> Case& AddLibrary(Case& to, bool withEarlierVersion, Make make) {
   to.Against("ours", make(kOurs));
 #ifdef HAVE_BEFORE
-  if (isBesideBefore)
+  if (withEarlierVersion)
     to.Against("earlier version", make(kBefore));
 #else
-  static_cast<void>(isBesideBefore);
+  static_cast<void>(withEarlierVersion);
 #endif
   return to;
 }

@@ -50,12 +50,12 @@ Party OurSearch(const Library& library, Op op, const StdString<T>& text, const S
 }
 
 /// Registers a search with ours and the standard string as parties, and with the earlier version if the text
-/// is short or isBesideBefore.
+/// is short or withEarlierVersion.
 template <class T>
 Case Search(Op op, const std::string& work, const std::string& data, const StdString<T>& text,
-            const StdString<T>& what, bool isBesideBefore = false) {
+            const StdString<T>& what, bool withEarlierVersion = false) {
   Case search(Width<T>::kArea, work, data, text.size(), Width<T>::kUnit);
-  AddLibrary(search, isBesideBefore || text.size() <= 64,
+  AddLibrary(search, withEarlierVersion || text.size() <= 64,
              [&](const Library& library) { return OurSearch<T>(library, op, text, what); });
   return search.Against(Width<T>::kPeer, Searching(op, text, what));
 }
@@ -119,12 +119,12 @@ template <class T>
 void RegisterSet(const StdString<T>& text, const StdString<T>& set, const std::string& members) {
   const std::string data = "set of " + std::to_string(set.size()) + members + ", absent";
   const auto& kept = Kept<T>(set);
-  const bool isBesideBefore = sizeof(T) == 2 && set.size() == 40;
-  Case first = Search<T>(Op::kFirstOf, "find_first_of", data, text, kept, isBesideBefore);
+  const bool withEarlierVersion = sizeof(T) == 2 && set.size() == 40;
+  Case first = Search<T>(Op::kFirstOf, "find_first_of", data, text, kept, withEarlierVersion);
   if constexpr (sizeof(T) == 1)
     first.Against("strcspn", [&] { return IndexOf(text, std::strcspn(text.c_str(), kept.c_str())); });
   if (members.empty())
-    Search<T>(Op::kLastOf, "find_last_of", data, text, kept, isBesideBefore);
+    Search<T>(Op::kLastOf, "find_last_of", data, text, kept, withEarlierVersion);
 }
 
 template <class T> void RegisterComplement(const StdString<T>& text, const StdString<T>& set) {

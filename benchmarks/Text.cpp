@@ -1,5 +1,5 @@
-// Checks, counts, walks and lossy conversions. Each party must detect malformed text; a party that only
-// counts checks the text first.
+// Checks, counts, walks and lossy conversions. A party that can detect malformed text does: simdutf, whose
+// functions only count, checks the text first. u_countChar32 and utfcpp's unchecked iterators detect none.
 #include "Cases.h"
 #include "Simdutf.h"
 #include "Texts.h"
@@ -185,8 +185,8 @@ template <class Unit> ssize_t Spoil(std::basic_string<Unit>& text, Unit malforme
 }
 
 /// Registers lossy conversions of well-formed text, or of the same text with an FF at about every tenth byte.
-/// Beside the latter, our strict conversion takes part on the well-formed text, and on the malformed one,
-/// called again after each fault.
+/// Our strict conversion always takes part on the well-formed text, and on malformed text too, called again
+/// after each fault.
 void RegisterLossy(const Language& language, std::size_t size, bool isMalformed) {
   const auto& wellFormed = *new std::vector<std::string>(TextsIn<char>(language, size));
   auto& texts = *new std::vector<std::string>(wellFormed);

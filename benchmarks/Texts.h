@@ -117,7 +117,7 @@ template <class Unit>
 std::vector<std::basic_string<Unit>> TextsIn(const Language& language, std::size_t size) {
   constexpr std::size_t kStep = 97;
   const std::size_t count = size < 100 ? 8 : 1;
-  const std::size_t units = size + kStep * count; // with no more than three bytes for each
+  const std::size_t units = size + kStep * count; // a 16-bit unit takes at most three bytes of UTF-8
   const auto text =
       boost::locale::conv::utf_to_utf<Unit>(TextIn(language, sizeof(Unit) == 1 ? units : 3 * units));
   std::vector<std::basic_string<Unit>> texts;

@@ -62,14 +62,16 @@ TYPED_TEST_SUITE(Allocation, CodeUnits);
 TYPED_TEST(Allocation, GrowthIsGeometric) {
   using S = basic_xstring<TypeParam>;
   const S text = Of<TypeParam>("seventeen units..");
-  const EditsOf<S> edits = {EDIT(s.push_back('x')),
-                            EDIT(s.append(1, 'x')),
-                            EDIT(s.resize(s.size() + 1, 'x')),
-                            EDIT(s += text),
-                            EDIT(s.push_back('x'), s.c_str()),
-                            EDIT(s.append(1, 'x'), s.c_str()),
-                            EDIT(s += text, s.c_str()),
-                            EDIT(FillFrom(s, 10, [](auto*, ssize_t n) { return n - 3; }))};
+  const EditsOf<S> edits = {
+    EDIT(s.push_back('x')),
+    EDIT(s.append(1, 'x')),
+    EDIT(s.resize(s.size() + 1, 'x')),
+    EDIT(s += text),
+    EDIT(s.push_back('x'); s.c_str()),
+    EDIT(s.append(1, 'x'); s.c_str()),
+    EDIT(s += text; s.c_str()),
+    EDIT(FillFrom(s, 10, [](auto*, ssize_t n) { return n - 3; }))
+  };
   const auto allocations = [](int times, const Edit<S>& edit) {
     S s;
     return allocation::Count([&] {
@@ -79,7 +81,8 @@ TYPED_TEST(Allocation, GrowthIsGeometric) {
   };
   for (const auto& edit : edits)
     EXPECT_LT(allocations(100000, edit), 40) << edit.text;
-  EXPECT_LT(allocations(2000, EDIT(s.insert(s.size() / 2, 'x'), s.push_front('y'))), 20);
+  EXPECT_LT(allocations(2000, EDIT(s.insert(s.size() / 2, 'x'))), 20);
+  EXPECT_LT(allocations(2000, EDIT(s.push_front('y'))), 20);
 }
 
 TYPED_TEST(Allocation, CapacityFollowsTheStatedRules) {
@@ -107,26 +110,28 @@ TYPED_TEST(Allocation, CapacityFollowsTheStatedRules) {
   EXPECT_EQ(allocation::Count([&] { s + 'x'; }), 1);
 }
 
-TYPED_TEST(Allocation, NoneIfThereIsRoomAndNothingAliases) {
+TYPED_TEST(Allocation, NoneIfThereIsRoomAndNoRangeAliases) {
   using S = basic_xstring<TypeParam>;
   const S r = Of<TypeParam>("xyz");
-  const EditsOf<S> edits = {EDIT(s.append(r)),
-                            EDIT(s.insert(2, r.data(), 3)),
-                            EDIT(s.replace(1, 2, r, 1, 1)),
-                            EDIT(s.push_back(r.begin(), r.end())),
-                            EDIT(s.assign(r)),
-                            EDIT(s = r),
-                            EDIT(s.insert(0, 3, s[0])),
-                            EDIT(s.push_front(s.back())),
-                            EDIT(s += s[1]),
-                            EDIT(s.pop_back(), s.c_str()),
-                            EDIT(s.FindAndErase(s[0])),
-                            EDIT(s = *&s),
-                            EDIT(s.resize(6, 'x')),
-                            EDIT(s.assign(6, 'x')),
-                            EDIT(s.replace(0, 1, 4, 'x')),
-                            EDIT(s.resize(5, 'x'), s.c_str()),
-                            EDIT(s.push_back('x'), s.push_back('y'), s.push_back('z'))};
+  const EditsOf<S> edits = {
+    EDIT(s.append(r)),
+    EDIT(s.insert(2, r.data(), 3)),
+    EDIT(s.replace(1, 2, r, 1, 1)),
+    EDIT(s.push_back(r.begin(), r.end())),
+    EDIT(s.assign(r)),
+    EDIT(s = r),
+    EDIT(s.insert(0, 3, s[0])),
+    EDIT(s.push_front(s.back())),
+    EDIT(s += s[1]),
+    EDIT(s.pop_back(); s.c_str()),
+    EDIT(s.FindAndErase(s[0])),
+    EDIT(s = *&s),
+    EDIT(s.resize(6, 'x')),
+    EDIT(s.assign(6, 'x')),
+    EDIT(s.replace(0, 1, 4, 'x')),
+    EDIT(s.resize(5, 'x'); s.c_str()),
+    EDIT(s.push_back('x'); s.push_back('y'); s.push_back('z'))
+  };
   for (const auto& edit : edits) {
     S s = Of<TypeParam>("abc");
     s.reserve(6); // most edits fill it exactly
@@ -150,7 +155,7 @@ template <class V> void ExpectSafe(const V& v, const EditsOf<V>& edits) {
       } catch (const std::bad_alloc&) {
       }
       allocation::failAfter = -1;
-      ASSERT_EQ(s.compare(v), 0);
+      ASSERT_EQ(s, v);
       ASSERT_EQ(s.data(), data);
       ASSERT_EQ(s.capacity(), v.size());
     }

@@ -27,9 +27,15 @@ public:
 
 private:
   static constexpr unsigned kAlphabet[] = {'a', 'b', 0,
-                                           sizeof(T) == 1 ? 0xE9 : 0x61E9}; // whose low byte is E9, too
+                                           sizeof(T) == 1 ? 0xE9 : 0x61E9}; // the low byte is E9 in both
   Numbers& m_numbers;
 };
+
+/// Text as a message shows it. GoogleTest shows 32 units of a basic_string<char16>, and all of a u16string.
+inline std::string Quoted(const std::string& text) { return testing::PrintToString(text); }
+inline std::string Quoted(const std::basic_string<char16>& text) {
+  return testing::PrintToString(std::u16string(text.begin(), text.end()));
+}
 
 /// Names an edit by its call, makes it, and replaces len elements at pos of the model with some text.
 #define EDIT(NUMBER, CALL, ...)                                                                              \
@@ -100,7 +106,7 @@ public:
       EDIT(26, v += v, size, 0, before);
       EDIT(27, v.insert(i, v.begin(), v.end()), i, 0, before);
       EDIT(28, erased = v.FindAndErase(x1), 0, size, without(own1));
-      EDIT(29, (v.resize(i, x), v *= 2), i, size - i, M(m, 0, size_t(i)));
+      EDIT(29, v *= 2, size, 0, before);
       EDIT(30, (n > 0 ? at = v.erase(at) : at), at - v.begin(), n > 0, {});
       EDIT(31, erased = v.FindAndEraseFirst(x), ssize_t(std::min(m.rfind(x), m.size())), 1, {});
       EDIT(32, v.append(v.c_str() + ri), size, 0, upToNull);
@@ -114,9 +120,9 @@ public:
       EDIT(40, size > 0 ? v.pop_back() : void(), size - (size > 0), 1, {});
     }
     SCOPED_TRACE(edit);
-    ASSERT_EQ(Std(v), m) << "from " << testing::PrintToString(before) << " with i " << i << ", n " << n
-                         << ", ri " << ri << ", rn " << rn << ", count " << count << ", x " << ssize_t(x)
-                         << ", r " << testing::PrintToString(text);
+    ASSERT_EQ(Std(v), m) << "from " << Quoted(before) << " to " << Quoted(Std(v)) << ", not " << Quoted(m)
+                         << ", with i " << i << ", n " << n << ", ri " << ri << ", rn " << rn << ", count "
+                         << count << ", x " << ssize_t(x) << ", r " << Quoted(text);
     ASSERT_THAT(erased, testing::AnyOf(kNpos, size - v.size()));
     ASSERT_LE(v.size(), v.capacity());
     ASSERT_EQ(v.end() - v.begin(), ssize_t(m.size()));
@@ -146,7 +152,7 @@ public:
   using typename TextMaker<T, Numbers>::S;
   using TextMaker<T, Numbers>::TextMaker;
 
-  /// Searches a text of up to so many units for a random needle, and compares it with another text.
+  /// Searches a random text of at most `longest` units for a random needle, and compares it with another one.
   void Step(ssize_t longest) {
     const auto sign = [](int x) { return (x > 0) - (x < 0); };
     const auto text = this->Text(longest);
@@ -160,13 +166,17 @@ public:
     const int number = std::make_unsigned_t<T>(c);
     const T *const z = r.c_str(), *const p = r.data();
     const ssize_t pn = r.size();
+    const auto inputs = [&] { // called only for a message
+      return "text " + Quoted(text) + ", needle " + Quoted(needle) + ", unit " + std::to_string(number) +
+             ", forward " + std::to_string(forward) + ", reverse " + std::to_string(reverse);
+    };
 #define SEARCH(NAME, OURS, THEIRS)                                                                           \
-  ASSERT_EQ(v.NAME(c, OURS), ssize_t(text.NAME(c, THEIRS)));                                                 \
-  ASSERT_EQ(v.NAME(r, OURS), ssize_t(text.NAME(needle, THEIRS)));                                            \
-  ASSERT_EQ(v.NAME(z, OURS), ssize_t(text.NAME(z, THEIRS)));                                                 \
-  ASSERT_EQ(v.NAME(p, OURS, pn), ssize_t(text.NAME(needle, THEIRS)));                                        \
-  ASSERT_EQ(v.NAME(p, p + pn, OURS), ssize_t(text.NAME(needle, THEIRS)));                                    \
-  ASSERT_EQ(v.NAME(number, OURS), ssize_t(text.NAME(c, THEIRS)))
+  ASSERT_EQ(v.NAME(c, OURS), ssize_t(text.NAME(c, THEIRS))) << inputs();                                     \
+  ASSERT_EQ(v.NAME(r, OURS), ssize_t(text.NAME(needle, THEIRS))) << inputs();                                \
+  ASSERT_EQ(v.NAME(z, OURS), ssize_t(text.NAME(z, THEIRS))) << inputs();                                     \
+  ASSERT_EQ(v.NAME(p, OURS, pn), ssize_t(text.NAME(needle, THEIRS))) << inputs();                            \
+  ASSERT_EQ(v.NAME(p, p + pn, OURS), ssize_t(text.NAME(needle, THEIRS))) << inputs();                        \
+  ASSERT_EQ(v.NAME(number, OURS), ssize_t(text.NAME(c, THEIRS))) << inputs()
     SEARCH(find, forward, uf);
     SEARCH(find_first_of, forward, uf);
     SEARCH(find_first_not_of, forward, uf);
@@ -174,8 +184,9 @@ public:
     SEARCH(find_last_of, reverse, ur);
     SEARCH(find_last_not_of, reverse, ur);
 #undef SEARCH
-    ASSERT_EQ(v.contains(r.begin(), r.end(), forward), text.compare(uf, needle.size(), needle) == 0);
-    ASSERT_EQ(Std(v.substr(forward, kNpos)), text.substr(uf));
+    ASSERT_EQ(v.contains(r.begin(), r.end(), forward), text.compare(uf, needle.size(), needle) == 0)
+        << inputs();
+    ASSERT_EQ(Std(v.substr(forward, kNpos)), text.substr(uf)) << inputs();
     const auto second = std::basic_string<T>(this->Text(12));
     const S o(second.data(), static_cast<ssize_t>(second.size()));
     const auto order = [](const std::basic_string<T>& a, const std::basic_string<T>& b) {
@@ -183,16 +194,17 @@ public:
       return std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end(), less) ? -1 : a != b;
     };
     const int expected = order(text, second), expectedUpToNull = order(text, second.c_str());
-    ASSERT_EQ(sign(v.compare(second.c_str())), expectedUpToNull);
-    ASSERT_EQ(v._Eq(second.c_str()), expectedUpToNull == 0);
-    ASSERT_EQ(v._Lt(second.c_str()), expectedUpToNull < 0);
-    ASSERT_EQ(sign(v.compare(o)), expected);
-    ASSERT_EQ(sign(v.compare(0, v.size(), o, 0, o.size())), expected);
-    ASSERT_EQ(sign(v.compare(o.data(), o.size())), expected);
-    ASSERT_EQ(v._Eq(o), expected == 0);
-    ASSERT_EQ(v._Lt(o), expected < 0);
-    if (sizeof(T) == 2) { // whose result is -1, 0 or 1
-      ASSERT_EQ(v.compare(o), expected);
+    const auto both = [&] { return Quoted(text) + " and " + Quoted(second); };
+    ASSERT_EQ(sign(v.compare(second.c_str())), expectedUpToNull) << both();
+    ASSERT_EQ(v._Eq(second.c_str()), expectedUpToNull == 0) << both();
+    ASSERT_EQ(v._Lt(second.c_str()), expectedUpToNull < 0) << both();
+    ASSERT_EQ(sign(v.compare(o)), expected) << both();
+    ASSERT_EQ(sign(v.compare(0, v.size(), o, 0, o.size())), expected) << both();
+    ASSERT_EQ(sign(v.compare(o.data(), o.size())), expected) << both();
+    ASSERT_EQ(v._Eq(o), expected == 0) << both();
+    ASSERT_EQ(v._Lt(o), expected < 0) << both();
+    if (sizeof(T) == 2) { // compare() of 16-bit units returns -1, 0 or 1
+      ASSERT_EQ(v.compare(o), expected) << both();
     }
   }
 };

@@ -38,7 +38,8 @@ inline std::size_t SequenceLength(View<char8> text) {
   return 0;
 }
 
-/// The length of the maximal subpart that malformed text begins with: of an incomplete row, or one byte.
+/// The length of the maximal subpart that malformed text begins with: the bytes that begin a row without
+/// completing it, or else one byte.
 inline std::size_t SubpartLength(View<char8> text) {
   const auto byte = [&](std::size_t i) { return i < text.size() ? static_cast<unsigned char>(text[i]) : -1; };
   for (const Row& row : kTable)
@@ -144,17 +145,20 @@ template <class CharOut, class CharIn> void Check(View<CharIn> source) {
     const View<CharOut> units(dst.data(), static_cast<std::size_t>(dst.size()));
     if (ok != isWellFormed || units != expected) // expectations would take too long for billions of texts
       FAIL() << name << ": " << testing::PrintToString(source) << (ok ? " is " : " is not ")
-             << "converted: " << testing::PrintToString(units);
+             << "converted: " << testing::PrintToString(units) << ", but the oracle "
+             << (isWellFormed ? "converts" : "stops") << " after " << testing::PrintToString(expected);
   });
 }
 
-/// Checks source by itself, and between sequences as long as the one with which it may begin, since several
-/// of these are converted at once.
+/// Checks source by itself, and with one sequence before it and three after it. These take two bytes in
+/// UTF-8, or three if source seems to begin with a sequence of three: a kernel converts several sequences of
+/// one length at once.
 template <class T> void CheckAmongSequences(View<T> source) {
   using Other = std::conditional_t<sizeof(T) == 1, char16, char8>;
   static thread_local Text<T> text;
-  const bool isHigh = sizeof(T) == 1 ? (source[0] & 0xF0) == 0xE0 : static_cast<char16>(source[0]) >= 0x800;
-  const char32_t c = isHigh ? 0x20AC : 0xE9;
+  const bool isThreeBytes =
+      sizeof(T) == 1 ? (source[0] & 0xF0) == 0xE0 : static_cast<char16>(source[0]) >= 0x800;
+  const char32_t c = isThreeBytes ? 0x20AC : 0xE9;
   text.clear();
   Put(text, c);
   text += source;

@@ -1,5 +1,5 @@
 // Calls that users write compile and mean what they say, and the declared signatures exist. POSIX headers are
-// included first here and last in another file, and both use the whole namespace.
+// included first, and namespace mirel is used whole, since their names must not conflict.
 #include <sys/socket.h>
 #include <sys/types.h>
 #include <unistd.h>
@@ -15,7 +15,8 @@ using namespace mirel;
 namespace {
 
 [[maybe_unused]] const ssize_t kIsStillAType = int64{1} + uint16{1} + uint8{1};
-static_assert(std::is_same_v<ssize_t, ::ssize_t> && std::is_same_v<char16, uint16>);
+static_assert(std::is_same_v<ssize_t, ::ssize_t>);
+static_assert(std::is_same_v<char16, uint16>);
 
 template <class T> class Overload : public testing::Test {};
 TYPED_TEST_SUITE(Overload, CodeUnits);
@@ -61,7 +62,7 @@ template <class T, class N> void CallWithIntegers() {
 
 template <class T, class... N> void CallWithEach() { (CallWithIntegers<T, N>(), ...); }
 
-TYPED_TEST(Overload, IntegersOfEveryType) {
+TYPED_TEST(Overload, TakesIntegersOfEveryType) {
   CallWithEach<TypeParam, short, int, unsigned, ssize_t, std::size_t, long long, unsigned char>();
 }
 
@@ -119,24 +120,30 @@ TYPED_TEST(Overload, LiteralZeroIsANumber) {
   static_assert(!std::is_constructible_v<S, std::nullptr_t>);
 }
 
-TYPED_TEST(Overload, DeclaredSignatures) {
+TYPED_TEST(Overload, HasTheDeclaredSignatures) {
   using T = TypeParam;
   using V = xvector<T>;
   using S = basic_xstring<T>;
-  static_assert(sizeof(S) == sizeof(VectorOfByte) && !std::is_polymorphic_v<S>);
-  static_assert(std::is_same_v<decltype(V() + V()), const V> && std::is_same_v<decltype(S() + 'x'), const V>);
+  static_assert(sizeof(S) == sizeof(VectorOfByte));
+  static_assert(!std::is_polymorphic_v<S>);
+  static_assert(std::is_same_v<decltype(V() + V()), const V>);
+  static_assert(std::is_same_v<decltype(S() + 'x'), const V>);
   static_assert(std::is_same_v<decltype(std::declval<S>().substr(0)), S>);
-  static_assert(std::is_convertible_v<const T*, S> && !std::is_convertible_v<const T*, V>);
+  static_assert(std::is_convertible_v<const T*, S>);
+  static_assert(!std::is_convertible_v<const T*, V>);
   static_assert(!std::is_default_constructible_v<typename V::reverse_iterator>);
-  static_assert(std::is_nothrow_destructible_v<S> && std::is_nothrow_destructible_v<VectorOfByte>);
-  static_assert(std::is_nothrow_swappable_v<V> && std::is_nothrow_swappable_v<S>);
+  static_assert(std::is_nothrow_destructible_v<S>);
+  static_assert(std::is_nothrow_destructible_v<VectorOfByte>);
+  static_assert(std::is_nothrow_swappable_v<V>);
+  static_assert(std::is_nothrow_swappable_v<S>);
   static_assert(noexcept(std::declval<S&>().swap(std::declval<S&>())));
   static_assert(noexcept(std::declval<VectorOfByte&>().swap(std::declval<VectorOfByte&>())));
-  EXPECT_TRUE((static_cast<T* (V::*)(T*, const T&)>(&V::insert)) != nullptr);
-  EXPECT_TRUE((static_cast<void (V::*)(ssize_t, int, const T&)>(&V::insert)) != nullptr);
-  EXPECT_TRUE((static_cast<void (V::*)(ssize_t) const>(&V::reserve)) != nullptr);
-  EXPECT_TRUE((static_cast<ssize_t (V::*)(const V&, ssize_t)>(&V::find_first_not_of)) != nullptr);
-  EXPECT_TRUE((static_cast<S& (S::*)(ssize_t, ssize_t, const T*)>(&S::replace)) != nullptr);
+  // A conversion to a type that no overload has doesn't compile.
+  static_cast<void>(static_cast<T* (V::*)(T*, const T&)>(&V::insert));
+  static_cast<void>(static_cast<void (V::*)(ssize_t, int, const T&)>(&V::insert));
+  static_cast<void>(static_cast<void (V::*)(ssize_t) const>(&V::reserve));
+  static_cast<void>(static_cast<ssize_t (V::*)(const V&, ssize_t)>(&V::find_first_not_of));
+  static_cast<void>(static_cast<S& (S::*)(ssize_t, ssize_t, const T*)>(&S::replace));
 }
 
 } // namespace

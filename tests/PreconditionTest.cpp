@@ -95,8 +95,8 @@ template <class V, class... A> struct CallOf {
 #define REVERSE(WITH, ...)                                                                                   \
   WITH(v.rfind(__VA_ARGS__)), WITH(v.find_last_of(__VA_ARGS__)), WITH(v.find_last_not_of(__VA_ARGS__))
 
-/// An argument as a message shows it: pointers, and iterators that become pointers, by their address. No null
-/// ends what they point to.
+/// An argument as a message shows it: a pointer, or an iterator that converts to one, by its address, since
+/// what it points to isn't null-terminated.
 template <class A> auto Shown(A a) {
   if constexpr (std::is_convertible_v<A, const void*>)
     return static_cast<const void*>(a);
@@ -371,6 +371,7 @@ TEST(Precondition, OfConversionsAndText) {
                WITH_P_PN(mirel::Utf8Length(p, pn)), WITH_P_PN(mirel::CodePoints(p, pn))});
   ExpectStops(wide, "0 <= offset && offset < pn", kBadElement,
               {WITH_I(mirel::ExplainMalformed("abc", 3, i)), WITH_I(ExplainMalformed(v, i))});
+  ExpectStops(wide, "0 <= offset && offset < pn", kOnce, {WITHOUT(mirel::ExplainMalformed("", 0, 0))});
 }
 
 TEST(Precondition, OfStreams) {

@@ -27,7 +27,7 @@ template <class T> basic_xstring<T> Of(const std::string& text) {
 
 template <class T> std::basic_string<T> Std(const xvector<T>& v) {
   return v.empty() ? std::basic_string<T>()
-                   : std::basic_string<T>(v.begin(), v.end()); // which takes no null pointers
+                   : std::basic_string<T>(v.begin(), v.end()); // libstdc++ gives null pointers to memcpy
 }
 
 /// Expects that an edit leaves a unit for each byte of text.
@@ -40,13 +40,13 @@ template <class T> void ExpectText(const xvector<T>& v, const std::string& text,
     ExpectText(S, TEXT, #EDIT);                                                                              \
   } while (false)
 
-/// Every test of a template runs for both widths.
+/// The code units that a typed test runs for.
 using CodeUnits = testing::Types<char8, char16>;
 
 namespace allocation {
 
 inline thread_local long count = 0;            ///< how many allocations this thread has made
-inline thread_local long failAfter = -1;       ///< how many more succeed before one fails; -1 for all
+inline thread_local long failAfter = -1;       ///< how many more succeed before all fail; -1 if none fails
 inline thread_local std::size_t requested = 0; ///< the size of the last one, in bytes
 
 /// Counts the allocations of an action.

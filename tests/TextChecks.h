@@ -70,7 +70,7 @@ template <class F> void ForEachKernels(const F& f) {
 #endif
 }
 
-/// Checks the workers of the calls, by each of the kernels.
+/// Checks the functions that the public ones call, with each table of kernels and by the scalar path.
 template <class T> void CheckKernels(View<T> source, const Expected<T>& expected) {
   const T *const p = source.data(), *const end = p + source.size();
   const ssize_t n = ssize_t(source.size()), count = ssize_t(expected.sequences.size());
@@ -89,7 +89,7 @@ template <class T> void CheckKernels(View<T> source, const Expected<T>& expected
   });
 }
 
-// The functions of the header, which choose the kernels.
+// Functions of utils/Utf.h under a name for both widths. They choose the kernels themselves.
 inline bool AppendOther(mirel::string16& dst, const char8* p, ssize_t n) {
   return mirel::AppendUtf16(dst, p, n);
 }
@@ -148,12 +148,12 @@ template <class T> void CheckPieces(const Text<T>& text, const std::vector<std::
     for (int again = 0; again < 2; ++again) { // a finished stream begins another text
       basic_xstring<Other<T>> dst(1, 'x');
       std::size_t at = 0;
-      bool ok = true;
       for (const std::size_t cut : cuts) {
-        ok = stream.Append(dst, text.data() + at, ssize_t(cut - at));
+        const bool goesOn = stream.Append(dst, text.data() + at, ssize_t(cut - at));
+        ASSERT_EQ(goesOn, !isStrict || stream.malformed().reason == MalformedReason::kNone);
         at = cut;
       }
-      ok = stream.Finish(dst);
+      const bool ok = stream.Finish(dst);
       ASSERT_EQ(ok, !isStrict || expected.first == kNpos);
       ASSERT_EQ(Std(dst), Text<Other<T>>(1, 'x') + (isStrict ? expected.strict : expected.lossy));
       ASSERT_EQ(stream.malformed().offset, expected.first);

@@ -43,6 +43,10 @@ template <class It1, class It2> std::array<It1, 8> Expected(It1 x1, It1 x2, It2 
           last(std::find_if(r1, r2, isIn)), last(std::find_if_not(r1, r2, isIn))};
 }
 
+const char* const kSearches[] = {
+    "find",        "findLast",       "findFirstSubSequence", "findLastSubSequence",
+    "findFirstOf", "findFirstNotOf", "findLastOf",           "findLastNotOf"};
+
 /// Checks the templates for the iterators of any container.
 template <class Container> void SearchAnyContainer() {
   const auto binary = [](unsigned bits) { // the binary digits of a number without the highest
@@ -70,7 +74,11 @@ template <class Container> void SearchAnyContainer() {
                                                              FindFirstNotOf(x1, x2, y1, y2),
                                                              FindLastOf(x1, x2, y1, y2),
                                                              FindLastNotOf(x1, x2, y1, y2)};
-        EXPECT_TRUE(found == Expected(x1, x2, y1, y2)) << bits << ' ' << needleBits;
+        const auto expected = Expected(x1, x2, y1, y2);
+        for (std::size_t k = 0; k < found.size(); ++k)
+          EXPECT_EQ(std::distance(x1, found[k]), std::distance(x1, expected[k]))
+              << kSearches[k] << " of " << testing::PrintToString(needle) << " in "
+              << testing::PrintToString(text);
       }
     }
 }
@@ -107,7 +115,7 @@ template <class T> std::vector<Way<T>> Ways() {
   return ways;
 }
 
-TYPED_TEST(RangeAlgorithms, EmptyRangesAndSets) {
+TYPED_TEST(RangeAlgorithms, TakeEmptyRangesAndSets) {
   using T = TypeParam;
   const T text[] = {'a', 'b'}, *const x2 = text + 2, *const null = nullptr;
   for (const auto& [name, s] : Ways<T>()) {
@@ -124,10 +132,6 @@ TYPED_TEST(RangeAlgorithms, EmptyRangesAndSets) {
   EXPECT_EQ(FindFirstSubSequence(text, x2, null, null), text);
   EXPECT_EQ(FindLastSubSequence(text, x2, null, null), x2);
 }
-
-const char* const kSearches[] = {
-    "find",        "findLast",       "findFirstSubSequence", "findLastSubSequence",
-    "findFirstOf", "findFirstNotOf", "findLastOf",           "findLastNotOf"};
 
 /// Compares every way to search with the standard library. A sanitizer checks the ends of both vectors.
 template <class T> void Check(const std::vector<T>& text, const std::vector<T>& what) {
@@ -195,9 +199,9 @@ TEST(RangeAlgorithmsTest, OneDifferenceAtEveryPlace) {
   }
 }
 
-/// A unit that a set's tables take for a member, and then a member near the end, in what smaller vectors
-/// search: it was missed once.
-TEST(RangeAlgorithmsTest, MembersBehindAFalseHit) {
+/// A unit that the set's tables take for a member, and a real member fewer than 20 units after it, in either
+/// direction. Such a member was missed once.
+TEST(RangeAlgorithmsTest, MembersSoonAfterAFalseHitAreFound) {
   std::vector<char16> set; // in nine rows, the first and the last of which share a bit
   for (int row = 0; row < 9; ++row)
     set.push_back(static_cast<char16>(0x1009 + row * 0x1110));
@@ -248,7 +252,7 @@ TYPED_TEST(RangeAlgorithms, RandomTextsNeedlesAndSets) {
 }
 
 /// Needles that are found late or never and resemble the text before: parts of the Fibonacci word, a repeated
-/// unit with another one in it, and a period that fails after its 40th unit.
+/// unit with another one in it, and 45 or more units of a periodic text, followed by "b".
 TYPED_TEST(RangeAlgorithms, PeriodicNeedles) {
   using T = TypeParam;
   std::string fibonacci = "ab", before = "a", period;
@@ -276,7 +280,7 @@ TYPED_TEST(RangeAlgorithms, PeriodicNeedles) {
 
 TEST(RangeAlgorithmsTest, TwoWayOnAllShortNeedles) {
   std::mt19937 random(5);
-  for (unsigned bits = 2; bits < 1u << 9; ++bits) { // the highest one ends the needle
+  for (unsigned bits = 2; bits < 1u << 9; ++bits) { // the highest set bit marks the needle's end
     std::vector<short> needle;
     for (unsigned b = bits; b > 1; b /= 2)
       needle.push_back(b % 2 != 0);
@@ -286,9 +290,12 @@ TEST(RangeAlgorithmsTest, TwoWayOnAllShortNeedles) {
         unit = random() % 8 == 0 ? 2 : int(random() % 2);
       const auto expected = std::search(text.begin(), text.end(), needle.begin(), needle.end());
       const mirel::detail::TwoWay<const short*> twoWay(needle.data(), needle.data() + needle.size());
-      ASSERT_EQ(twoWay.Find(text.begin(), text.end()), expected) << bits;
-      ASSERT_EQ(FindLastSubSequence(text.begin(), text.end(), needle.begin(), needle.end()),
-                std::find_end(text.begin(), text.end(), needle.begin(), needle.end()));
+      const auto last = FindLastSubSequence(text.begin(), text.end(), needle.begin(), needle.end());
+      const auto expectedLast = std::find_end(text.begin(), text.end(), needle.begin(), needle.end());
+      ASSERT_EQ(twoWay.Find(text.begin(), text.end()) - text.begin(), expected - text.begin())
+          << testing::PrintToString(needle) << " in " << testing::PrintToString(text);
+      ASSERT_EQ(last - text.begin(), expectedLast - text.begin())
+          << testing::PrintToString(needle) << " in " << testing::PrintToString(text);
     }
   }
 }
@@ -309,7 +316,8 @@ TYPED_TEST(RangeAlgorithms, NoNeedleIsSlow) {
             integers.end());
   EXPECT_EQ(FindLastSubSequence(integers.begin(), integers.end(), last.begin(), last.end()), integers.end());
   const std::chrono::duration<double> time = std::chrono::steady_clock::now() - start;
-  EXPECT_LT(time.count(), 8) << "seconds; with the product of the lengths one search takes longer";
+  EXPECT_LT(time.count(), 8)
+      << "seconds; in time proportional to the product of the lengths, one search takes longer";
 }
 
 /// Expects that an edit of b leaves these bytes.
@@ -344,7 +352,7 @@ TEST(VectorOfByteTest, EditsAtAnyPlace) {
   EXPECT_BYTES(b.push_back<unsigned short>(0x0303), 5, 5, 2, 5, 2, 2, 5, 2, 2, 2, 3, 3);
 }
 
-TEST(VectorOfByteTest, AccessAndStorage) {
+TEST(VectorOfByteTest, KnowsItsBytesAndOwnsItsWholeCapacity) {
   VectorOfByte b{1, 2, 3};
   const VectorOfByte c(b);
   EXPECT_EQ(c.size(), 3);
@@ -361,7 +369,7 @@ TEST(VectorOfByteTest, AccessAndStorage) {
   EXPECT_FALSE(VectorOfByte().owns(nullptr));
 }
 
-TEST(VectorOfByteTest, AppendsAndCopies) {
+TEST(VectorOfByteTest, AppendsWhereThereIsRoomAndCopiesToItsSize) {
   const VectorOfByte tail{3, 4};
   VectorOfByte b{1, 2};
   b.reserve(9);

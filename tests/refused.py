@@ -22,7 +22,7 @@ enum class E { e };
 enum Unscoped {};
 struct Wrapped { operator int() const; };
 struct Converts : std::string { operator string8() const; };
-namespace Program { // with its own operators, which match in every way
+namespace Program { // with operators of its own: functions, templates, and one that takes a view
 string8 operator+(const string8&, const char*);
 template <class T> bool operator==(const basic_xstring<T>&, const basic_xstring<T>&);
 template <class T> bool operator<(const xvector<T>&, const xvector<T>&);

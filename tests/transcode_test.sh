@@ -18,8 +18,8 @@ check() {
 expect() { [ "$2" = "$3" ] || fail "$1: '$2' is not '$3'"; }
 same() { cmp -s "$2" "$3" || fail "$1: $2 and $3 differ"; }
 
-# The sequences recur every 10 bytes, in UTF-8 and in UTF-16, so the ends of a few blocks fall at every place in them; at
-# odd ones if the first byte arrives alone.
+# The sequences recur every 10 bytes, in UTF-8 and in UTF-16, so the ends of a few blocks fall at every even place in
+# them, and at every odd place if the first byte arrives alone.
 printf '\357\273\277z\303\251\342\202\254\360\237\230\200\n' >in
 { cat in; yes "$(tail -c +4 in)" | tr -d '\n' | head -c 500000; cat in; } >long
 encodings='utf-8 utf-16le utf-16be utf-32le utf-32be'
@@ -39,7 +39,7 @@ ASCII code points 25 % round trip same bytes "
 done
 
 # Faults before, at and past the end of a block: the text before a fault is printed, and the fault and its place are
-# named. One more run checks all files, and one writes them with replacements (R).
+# named. Three more runs take all files: one checks them, one replaces the faults (R), and one drops them.
 while read -r encoding width fault replaced reason; do
   bad=() messages=
   : >wanted
@@ -161,7 +161,7 @@ expect "replaced" "$(cat err)" ""
 echo old >kept
 chmod 640 kept
 check "malformed late" 1 "$transcode" -f ascii -t utf-16le -o kept bad.4
-check "what is added to" 1 timeout 5 bash -c "'$transcode' kept >>kept"
+check "a file appended to itself" 1 timeout 5 bash -c "'$transcode' kept >>kept"
 # A signal ends a run that waits for more text, once its temporary file exists.
 mkfifo fifo
 ulimit -c 0

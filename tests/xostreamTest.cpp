@@ -154,7 +154,7 @@ TEST(XOStream, CallsTheSinkSeldom) {
   }
 }
 
-/// Indents text without spaces as the stream should.
+/// Returns text, which has no spaces, as the stream should indent it.
 std::string Indented(const std::string& text, std::size_t indent) {
   std::string result;
   for (const char c : text)

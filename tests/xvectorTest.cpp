@@ -57,7 +57,7 @@ TYPED_TEST(XVector, ReverseIteratorsConvertToPointersPastTheirElement) {
   EXPECT_TRUE(v.rbegin() == v.rend());
 }
 
-TYPED_TEST(XVector, NullTerminatedArguments) {
+TYPED_TEST(XVector, TakesNullTerminatedArguments) {
   using Text = basic_xstring<TypeParam>;
   const Text text = Of<TypeParam>("abcabc"), bc = Of<TypeParam>("bc"), none;
   const TypeParam* const z = bc.c_str();

@@ -125,8 +125,8 @@ def emulated(processor, triplet="", emulator="", link="", exhaustive=True):
 
 def everyday(row):
     """Tests what most users build; then the same program on older processors, from one with every instruction set of
-    the kernels to one without any, and under valgrind. The latter leaves out slow tests that would find nothing new:
-    millions of texts, and tests whose child processes do the work, on which valgrind doesn't report."""
+    the kernels to one without any, and under valgrind. These runs leave out slow tests that would find nothing new:
+    millions of texts and, under valgrind, tests whose child processes do the work, on which it doesn't report."""
     suite(flags="-O2 -g")(row)
     tests = row.dir / "tests" / "mirel_tests"
     for processor, kernels in ("Haswell", "AVX2"), ("Nehalem", "SSE4"), ("core2duo", "none"):
@@ -168,7 +168,8 @@ def mutants(row):
 HARDENING = ("-O2 -D_FORTIFY_SOURCE=2 -D_GLIBCXX_ASSERTIONS -fstack-protector-strong -fstack-clash-protection "
              "-fcf-protection -Wformat -Werror=format-security -fPIE")
 SHARED = "-DBUILD_SHARED_LIBS=ON"
-# Debian's fmt is built for libstdc++ and the native processor, and its headers convert implicitly.
+# Debian's fmt is built for libstdc++ and the native processor, and its headers have implicit conversions, which clang's
+# sanitizer reports.
 NO_FMT = "-DCMAKE_DISABLE_FIND_PACKAGE_fmt=ON"
 
 
@@ -179,7 +180,8 @@ def libcxx(std, flags, *options, exhaustive=True):
 
 ROWS = [
     Row("AArch64 under emulation", suite(cxx="aarch64-linux-gnu-g++", flags="-O2", options=("--preset", "aarch64"))),
-    # Of the emulated processors only AArch64 has kernels, for which the exhaustive tests are written.
+    # The exhaustive tests are written for the kernels. Of the emulated processors AArch64 has NEON; i686 has SSE4,
+    # which the rows for x86-64 test; the others have none.
     Row("s390x under emulation, big-endian", emulated("s390x", exhaustive=False)),
     Row("i686 under emulation, 32 bits", emulated("i686", emulator="i386", exhaustive=False,
         link="-static")),  # QEMU 7.2 hangs when a dynamic program of i686 forks

@@ -29,7 +29,8 @@ def mirel_escaped(character, width, charset):
 
 
 def mirel_literal(units, width, order, charset, is_cut):
-    """Code units as a literal: octal escapes are bytes, other escapes are code points or unpaired surrogates."""
+    """Code units as a literal. Octal escapes are control characters or bytes of malformed UTF-8; hexadecimal ones are
+    code points or unpaired surrogates."""
     encoding, errors = ("utf-8", "surrogateescape") if width == 1 else (f"utf-16-{order}", "surrogatepass")
     text = codecs.getincrementaldecoder(encoding)(errors).decode(units, final=not is_cut)
     escaped = "".join(mirel_escaped(character, width, charset) for character in text)

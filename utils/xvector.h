@@ -27,7 +27,7 @@ namespace mirel {
 /// looked for; `offset` where a search starts; `count` a repeat, fill or substring length. Indices
 /// and counts are in elements, and signed. An integer of any type may stand for an index, a count or an
 /// element: a literal 0 is one of these, never a pointer. utils/Ranges.h says which iterators a range may
-/// have, and what its elements count as; a single element counts by its unsigned value too. A constant that
+/// have, and how its elements are read; a single element is read as its unsigned value too. A constant that
 /// doesn't fit doesn't compile with clang, nor with g++ if it optimises. G++ may take a variable for a
 /// constant if it knows the value, and only warns of a constant that is searched for.
 ///
@@ -565,6 +565,7 @@ public:
   /// @{
 
   /// Finds the first element equal to c, from offset on.
+  /// @return its index, or npos @pre "0 <= offset && offset <= size()"
   ssize_t find(const T& c, ssize_t offset = 0) const {
     MIREL_ASSERT(0 <= offset && offset <= size());
     return Index(Find(begin() + offset, end(), c), end());
@@ -588,6 +589,7 @@ public:
   }
 
   /// Finds the last element equal to c, at or before offset.
+  /// @return its index, or npos @pre "offset == npos || (0 <= offset && offset < size())"
   ssize_t rfind(const T& c, ssize_t offset = npos) const {
     MIREL_ASSERT(offset == npos || (0 <= offset && offset < size()));
     return Index(FindLast(begin(), After(offset), c), After(offset));
@@ -606,6 +608,7 @@ public:
   }
 
   /// Finds the first element equal to c from offset on, as find().
+  /// @return its index, or npos @pre "0 <= offset && offset <= size()"
   ssize_t find_first_of(const T& c, ssize_t offset = 0) const { return find(c, offset); }
   /// Finds the first element from offset on that occurs in [r1, r2). An empty set matches nothing.
   template <class It, detail::IfIterator<It> = 0>
@@ -628,6 +631,7 @@ public:
   }
 
   /// Finds the first element from offset on that differs from c.
+  /// @return its index, or npos @pre "0 <= offset && offset <= size()"
   ssize_t find_first_not_of(const T& c, ssize_t offset = 0) const {
     return find_first_not_of(&c, &c + 1, offset);
   }
@@ -652,6 +656,7 @@ public:
   }
 
   /// Finds the last element equal to c at or before offset, as rfind().
+  /// @return its index, or npos @pre "offset == npos || (0 <= offset && offset < size())"
   ssize_t find_last_of(const T& c, ssize_t offset = npos) const { return rfind(c, offset); }
   /// Finds the last element at or before offset that occurs in [r1, r2).
   template <class It, detail::IfIterator<It> = 0>
@@ -673,6 +678,7 @@ public:
   }
 
   /// Finds the last element at or before offset that differs from c.
+  /// @return its index, or npos @pre "offset == npos || (0 <= offset && offset < size())"
   ssize_t find_last_not_of(const T& c, ssize_t offset = npos) const {
     return find_last_not_of(&c, &c + 1, offset);
   }

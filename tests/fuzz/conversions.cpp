@@ -23,7 +23,8 @@ extern "C" int LLVMFuzzerTestOneInput(const unsigned char* data, std::size_t siz
   // seldom because it takes long, a text of many blocks.
   static constexpr std::size_t kBefore[] = {0, 0, 0, 0, 0, 0, 1, 2, 5, 20, 31, 34, 1000};
   const std::size_t before = kBefore[data[0] % std::size(kBefore)];
-  ++data, --size;
+  ++data;
+  --size;
   CheckCuts<char8>(before, oracle::Text<char8>(reinterpret_cast<const char8*>(data), size));
   oracle::Text<char16> units(size / 2, 0);
   for (std::size_t i = 0; i < units.size(); ++i)

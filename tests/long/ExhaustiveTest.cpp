@@ -27,7 +27,7 @@ template <class F> void ForAll(const char* what, const F& check) {
   std::fprintf(stderr, "\n");
 }
 
-TEST(Exhaustive, FourBytes) {
+TEST(Exhaustive, EveryFourBytesConvertAsByTheOracle) {
   ForAll("four bytes", [](char16 high) {
     char8 text[] = {static_cast<char8>(high >> 8), static_cast<char8>(high), 0, 0};
     for (unsigned low = 0; low <= 0xFFFF; ++low) {
@@ -38,7 +38,7 @@ TEST(Exhaustive, FourBytes) {
   });
 }
 
-TEST(Exhaustive, TwoUnits) {
+TEST(Exhaustive, EveryTwoUnitsConvertAsByTheOracle) {
   ForAll("two units", [](char16 first) {
     char16 units[] = {first, 0};
     for (unsigned second = 0; second <= 0xFFFF; ++second) {

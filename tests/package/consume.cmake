@@ -6,7 +6,8 @@ set(warnings "-Wall -Wextra -Wpedantic -Wconversion -Wsign-conversion -Wshadow")
 file(REMOVE_RECURSE ${dir})
 
 if(WAY STREQUAL "pkg-config")
-  # As a makefile would. The C compiler links the static library, since it doesn't add the C++ runtime by itself.
+  # As a makefile would. With the static library the C compiler links: it doesn't add the C++ runtime by
+  # itself, so pkg-config must.
   find_program(pkgconfig pkg-config REQUIRED)
   find_program(cc cc REQUIRED)
   set(ENV{PKG_CONFIG_PATH} ${LIBDIR}/pkgconfig)

@@ -32,16 +32,17 @@ template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, co
 /// path alone if they are null.
 template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* end);
 
-/// Returns what is wrong with the sequence at p, as Decode() returned it.
+/// Returns what is wrong with the sequence at p; `sequence` is what Decode(p, end) returned.
 MalformedReason ReasonOf(const char8* p, const char8* end, const Sequence& sequence);
 MalformedReason ReasonOf(const char16* p, const char16* end, const Sequence& sequence);
 
-/// Returns how many units at the end of [begin, end) begin a sequence that further units may complete.
+/// Returns how many units at the end of [begin, end), which isn't empty, begin a sequence that further units
+/// may complete.
 ssize_t CutOffAtEnd(const char8* begin, const char8* end);
 ssize_t CutOffAtEnd(const char16* begin, const char16* end);
 
-/// Skips ASCII at the beginning of a text that the kernels don't take, eight bytes at a time: that checks 14
-/// bytes in half the time of a loop over single bytes.
+/// Skips whole groups of eight ASCII bytes at the beginning of a text that the kernels don't take: that
+/// checks 14 bytes in half the time of a loop over single bytes.
 inline const char8* SkipAscii(const char8* p, const char8* end) {
   for (uint64_t word = 0; end - p >= ssize_t(sizeof(word)); p += sizeof(word)) {
     std::memcpy(&word, p, sizeof(word));
@@ -50,10 +51,12 @@ inline const char8* SkipAscii(const char8* p, const char8* end) {
   }
   return p;
 }
+/// Skips nothing; it lets the templates call SkipAscii() for both widths.
 inline const char16* SkipAscii(const char16* p, const char16*) { return p; }
 
 /// The fewest units for which a kernel that checks or counts pays: a shorter text is decoded one code point
-/// at a time in the time that a kernel takes to copy it into a block. Conversions have no such limit.
+/// at a time in the time that a kernel takes to copy it into a block. It can't be below 16: the kernels for
+/// UTF-16 read a whole block that ends with the text. Conversions have no such limit.
 constexpr ssize_t kLeastForKernels = 24;
 
 /// Once the scalar path decodes malformed text, it goes on until this many units in a row are well-formed:

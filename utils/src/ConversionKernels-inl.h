@@ -2,10 +2,11 @@
 //
 // A text is converted in blocks. For every position of a block the kernel computes what a code point that
 // begins there would give, even where none begins. A byte shuffle from a table then drops the positions where
-// none begins. The only branch that depends on where code points begin is the one for blocks that consist of
-// three-byte sequences only. Masks with one bit for each position tell whether the block is well-formed; one
-// that isn't is left to the scalar path, which finds the malformed sequence. From there a lossy conversion
-// goes on in blocks whose masks tell where a maximal subpart begins; there U+FFFD replaces what was computed.
+// none begins. In well-formed text, the only branch that depends on where code points begin is the one for
+// blocks that begin with 20 three-byte sequences. Masks with one bit for each position tell whether the block
+// is well-formed; one that isn't is left to the scalar path, which finds the malformed sequence. From there a
+// lossy conversion goes on in blocks whose masks tell where a maximal subpart begins; there U+FFFD replaces
+// what was computed.
 // A block ends before a code point that its end would cut off, so no state passes from one block to the next.
 // The last block ends where the text ends. It overlaps what has been converted, and may store that part
 // again.
@@ -29,7 +30,7 @@ using Narrow = hn::FixedTag<uint8_t, 16>; // for short texts, and for shuffles, 
 template <class D> using ToUnits = hn::Repartition<uint16_t, D>;
 template <class D> constexpr ssize_t kLanes = static_cast<ssize_t>(hn::MaxLanes(D()));
 
-// Bits and bytes ----------
+// Bits and bytes
 
 HWY_INLINE ssize_t Count(uint64_t bits) { return static_cast<ssize_t>(hwy::PopCount(bits)); }
 constexpr uint64_t FirstBits(ssize_t n) { return n < 64 ? (uint64_t{1} << n) - 1 : ~uint64_t{0}; }
@@ -145,8 +146,8 @@ HWY_INLINE uint8_t* StoreKept(hn::Vec<Narrow> v, const Shuffles& shuffles, uint6
   return out + kLeast + kEach * Count(mask16 & 0xFF0);
 }
 
-/// Stores what the shuffles keep of vectors: first of the lower 16 bytes of each, by its mask as StoreKept()
-/// takes it, then of the upper 16 bytes, by the mask's bits from the 16th on.
+/// Stores what the shuffles keep of the lower 16 bytes of every vector, then of the upper 16 bytes of every
+/// vector. StoreKept() takes the masks as they are for the lower bytes, from their 16th bit on for the upper.
 template <int kLeast, int kEach, class D, std::size_t n>
 HWY_INLINE uint8_t* StoreHalves(D d, const hn::Vec<D> (&vectors)[n], const Shuffles& shuffles,
                                 const uint64_t (&masks)[n], uint8_t* out) {
@@ -172,7 +173,7 @@ HWY_INLINE uint8_t* StorePairs(D d, hn::Vec<D> even, hn::Vec<D> odd, const Shuff
   return out;
 }
 
-// A conversion, whatever its direction ----------
+// A conversion, whatever its direction
 
 /// How much of a block was converted, in units of the source and of the result; 0 and 0 if it isn't
 /// well-formed.
@@ -186,7 +187,7 @@ struct Replaced {
   ssize_t replacements;
 };
 
-/// A conversion under way. A Block has, beside the functions called here:
+/// A conversion under way. A Block has, besides the functions called here:
 /// - kUnits: how many units of the source it has,
 /// - kMaxStored: the most units that its Convert() writes from out on, those past the result included.
 ///   Before out it rewrites only what the block's first units gave.
@@ -200,8 +201,8 @@ template <class In> struct Conversion {
   HWY_INLINE Progress<In> At(Stop stop) const { return {p, out, stop}; }
 
   /// Converts the units [from, to) of a block. p points at the from-th; those before it have been converted.
-  /// After kEnd the conversion goes on at p, which is before the to-th if the block's end cuts a code point
-  /// off.
+  /// Returns kEnd if nothing stops the conversion here: it then goes on at p, which is before the to-th unit
+  /// if the block's end cuts a code point off.
   template <class Block> HWY_INLINE Stop Convert(const Block& block, ssize_t from, ssize_t to) {
     constexpr ssize_t kMaxStoredBytes = Block::kMaxStored * ssize_t(sizeof(Out));
     // ASCII up to the block's end writes nothing past the result.
@@ -260,7 +261,7 @@ Progress<In> ReplaceByBlocks(const In* p, const In* end, OtherUnit<In>* out, Oth
   return text.At(Stop::kMalformed);
 }
 
-// UTF-8 to UTF-16 ----------
+// UTF-8 to UTF-16
 
 /// The low and the high bytes of UTF-16 units.
 template <class D> struct Planes { hn::Vec<D> low, high; };
@@ -332,8 +333,8 @@ template <int kVectors, class D> struct Utf8Block {
     return k + 1 < kVectors ? hn::LoadU(D(), p + k * kLanes<D> + n)
                             : Window<n>(D(), lastVector, hn::Zero(D()));
   }
-  /// Returns a bit for each position, from the masks that f gives for each vector and the one a byte further
-  /// on.
+  /// Returns a bit for each position. f gives the mask of a vector from that vector and the one that begins a
+  /// byte later.
   template <class F> HWY_INLINE uint64_t Bits(const F& f) const {
     uint64_t bits = 0;
     for (int k = 0; k < kVectors; ++k)
@@ -495,7 +496,7 @@ Progress<char8> Utf16FromUtf8(const char8* p, const char8* end, char16* out, cha
   return text.At(text.ConvertShort<Utf8Block<1, Narrow>>());
 }
 
-// UTF-16 to UTF-8 ----------
+// UTF-16 to UTF-8
 
 /// A bit for each unit that takes at least two bytes of UTF-8, and for each that takes at least three.
 struct UnitMasks {
@@ -655,7 +656,7 @@ Progress<char16> Utf8FromUtf16(const char16* p, const char16* end, char8* out, c
   return text.At(text.ConvertShort<Utf16Block<Narrow>>());
 }
 
-// ASCII to UTF-16 ----------
+// ASCII to UTF-16
 
 /// Converts whole vectors from the i-th of n bytes on. Returns where it stopped.
 template <class D> HWY_INLINE ssize_t WidenAscii(D d, const char8* src, ssize_t i, ssize_t n, char16* dst) {

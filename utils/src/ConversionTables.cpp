@@ -7,7 +7,7 @@ namespace mirel::detail {
 namespace {
 
 /// Makes a shuffle for each mask. addBytes(mask, k, add) adds the bytes that take the place of byte k:
-/// add(from, bits) adds byte from if the lowest bit of bits is set.
+/// add(from, bits) adds the byte at index `from` if the lowest bit of `bits` is set.
 template <class F> constexpr Shuffles MakeShuffles(const F& addBytes) {
   Shuffles shuffles{};
   for (unsigned mask = 0; mask < 256; ++mask) {
@@ -26,8 +26,8 @@ template <class F> constexpr Shuffles MakeShuffles(const F& addBytes) {
 struct PairFault {
   int first, firstLast, second, secondLast, bit;
 };
-/// From table 3-7 of the Unicode Standard. Two faults that share a bit have the same range for one of the
-/// bytes, so that the nibbles of the one never combine with those of the other to a third.
+/// From table 3-7 of the Unicode Standard. Two faults share a bit only if they differ in a single nibble:
+/// otherwise nibbles of the one could combine with nibbles of the other to pairs that aren't faults.
 constexpr PairFault kFaults[] = {
     {0xC0, 0xFF, 0x00, 0x7F, 0}, {0xC0, 0xFF, 0xC0, 0xFF, 0}, // a continuation byte is missing
     {0x00, 0x7F, 0x80, 0xBF, 1},                              // an unexpected continuation byte

@@ -39,13 +39,15 @@ template <class T> struct Measured {
 };
 
 /// What one instruction set offers for text of one width. The conversions read nothing outside [p, end) and
-/// write nothing outside [out, outEnd), but may write more of it than they report.
+/// write nothing outside [out, outEnd), but may write more of it than they report. skip() and measure() take
+/// no text of fewer than kLeastForKernels units (Conversion.h): for UTF-16 they read a whole block that ends
+/// with the text.
 template <class T> struct UnitKernels {
   using Out = OtherUnit<T>;
   Progress<T> (*convert)(const T* p, const T* end, Out* out, Out* outEnd);
   /// Converts blocks from malformed text on, with U+FFFD for each maximal subpart, and adds how many there
   /// were to replacements. It stops before a well-formed block, or when less than a block of text or room is
-  /// left, so it may convert nothing.
+  /// left, so it may convert nothing. It always reports Stop::kMalformed.
   Progress<T> (*replace)(const T* p, const T* end, Out* out, Out* outEnd, ssize_t& replacements);
   /// Returns the end of a well-formed prefix that cuts no sequence off: the end of the text, or a place not
   /// far before malformed text.
@@ -58,14 +60,14 @@ template <class T> struct UnitKernels {
 /// What one instruction set offers for text of both widths.
 struct Kernels : UnitKernels<char8>, UnitKernels<char16> {
   const char* name;
-  /// Converts the first of the n units at src, as Utf16FromAscii() does. Returns how many; fewer units than a
-  /// vector holds are left.
+  /// Converts as many of the n units at src as fill whole vectors, as Utf16FromAscii() does. Returns how many
+  /// these are; fewer than 16 are left.
   ssize_t (*utf16FromAscii)(const char8* src, ssize_t n, char16* out);
 };
 
-// The tables of the conversions, once for all instruction sets. They are defined in a file of their own: a
-// vector whose value g++ sees is built anew at each use, with three instructions in the loop. A load is part
-// of the instruction that uses it.
+// The tables of the conversions, once for all instruction sets. They are defined in a file of their own, so
+// that g++ doesn't see their values: it builds a vector of known value anew at each use, with three
+// instructions in the loop, while a load is part of the instruction that uses it.
 
 /// A byte shuffle for each mask of positions, which drops or replaces positions and leaves no gaps.
 struct alignas(64) Shuffles {
@@ -75,16 +77,17 @@ struct alignas(64) Shuffles {
 extern const Shuffles kKeepUnits;
 /// For 8 positions of two bytes: keeps the first byte of each, and the second of those whose bit is set.
 extern const Shuffles kKeepTwoBytes;
-/// For 4 positions of four bytes, the second of them unused: keeps the first byte of each, the last of those
-/// whose bit is set in the lower half of the mask, and the third of those whose bit is set in the upper half.
+/// For 4 positions of four bytes, of which the second is always dropped: keeps the first byte of each
+/// position, the last byte of those whose bit is set in the lower half of the mask, and the third byte of
+/// those whose bit is set in the upper half.
 extern const Shuffles kKeepThreeBytes;
 /// For 8 bytes followed by the 3 bytes of U+FFFD: puts U+FFFD in place of the bytes whose bit is set. Rows of
 /// masks with more than four bits are cut off.
 extern const Shuffles kReplaceUnits;
 
-/// What can be wrong with two adjacent bytes, a bit for each fault. Two bytes have a fault if both nibbles of
-/// the first and the high nibble of the second have its bit. The highest bit stands for two continuation
-/// bytes, which are a fault unless a lead byte requires them.
+/// What can be wrong with two adjacent bytes, a bit for each kind of fault. Two bytes have a fault if both
+/// nibbles of the first and the high nibble of the second have its bit. The highest bit stands for two
+/// continuation bytes, which are a fault unless a lead byte requires them.
 struct alignas(16) PairFaults {
   uint8_t firstHigh[16], firstLow[16], secondHigh[16];
 };

@@ -1,5 +1,5 @@
-// The choice of the kernels at run time. This file is compiled once for each instruction set, by Highway's
-// foreach_target.h, and the kernels with it; each lands in a namespace of its own, N_AVX2 for example.
+// The choice of the kernels at run time. Highway's foreach_target.h compiles this file, and the kernels that
+// it includes, once for each instruction set, each time into a namespace of its own: N_AVX2 for example.
 
 #include "KernelTable.h"
 
@@ -10,7 +10,8 @@
 #if defined(MIREL_KERNELS) && __BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__
 
 // The kernels use neither AES nor conversions of floating-point numbers, so no processor has to have them.
-// Other targets are left out: none was found to be a third faster than the best of these.
+// The targets disabled here aren't worth their code: none was found to be a third faster than the best of
+// those that are left.
 #define HWY_DISABLE_PCLMUL_AES
 #define HWY_DISABLE_F16C
 #define HWY_DISABLED_TARGETS                                                                                 \

@@ -22,8 +22,8 @@ private:
   uint64_t m_words[sizeof(T) == 1 ? 256 / 64 : 65536 / 64] = {};
 };
 
-/// Returns the first of [p, end) that is in a set or, if !isMember, isn't; end if there is none. The bits are
-/// set up only after enough units without a hit to be worth it.
+/// Returns the first unit of [p, end) that is in [y1, y2) or, if !isMember, isn't; end if there is none. The
+/// UnitBits are filled only if comparing with each member finds nothing in the first `near` units.
 template <class It, class T> It FindInSet(It p, It end, const T* y1, const T* y2, bool isMember) {
   const ssize_t near = 8 + ssize_t(sizeof(UnitBits<T>) / 8 / (std::size_t(y2 - y1) + 1));
   for (const It stop = end - p < near ? end : p + near; p != stop; ++p)

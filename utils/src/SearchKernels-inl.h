@@ -2,7 +2,7 @@
 //
 // A search is a scan with a predicate, which gives the mask of the lanes that are hits. A scan reads whole
 // vectors. The last one ends with the range, and so may overlap units that are known to be no hits. A range
-// shorter than a vector is read in smaller ones.
+// shorter than a vector is read in smaller ones, and one of fewer than 8 bytes unit by unit.
 //
 // There is no include guard: the file is included once for each instruction set.
 
@@ -57,11 +57,11 @@ template <class T> struct Different {
 // Scans return the first hit, in reverse the last one; null if there is none.
 
 /// Scans the vector at p.
-template <bool kReverse, class D, class T, class Is>
-HWY_INLINE const T* HitIn(D d, const T* p, const Is& is) {
+template <bool kReverse, class D, class T, class Pred>
+HWY_INLINE const T* HitIn(D d, const T* p, const Pred& pred) {
   const hn::Repartition<uint8_t, D> d8; // converting masks of wider lanes to bits takes longer
   uint64_t bits = 0;
-  hn::StoreMaskBits(d8, hn::MaskFromVec(hn::BitCast(d8, hn::VecFromMask(d, is.Lanes(d, p)))),
+  hn::StoreMaskBits(d8, hn::MaskFromVec(hn::BitCast(d8, hn::VecFromMask(d, pred.Lanes(d, p)))),
                     reinterpret_cast<uint8_t*>(&bits));
   if (bits == 0)
     return nullptr;
@@ -70,64 +70,65 @@ HWY_INLINE const T* HitIn(D d, const T* p, const Is& is) {
   return p + byte / sizeof(T);
 }
 
-template <class D, class T, class Is>
-HWY_INLINE bool HasHit(D d, const T* p, const T* q, const T* r, const T* s, const Is& is) {
+template <class D, class T, class Pred>
+HWY_INLINE bool HasHit(D d, const T* p, const T* q, const T* r, const T* s, const Pred& pred) {
   return !hn::AllFalse(
-      d, hn::Or(hn::Or(is.Lanes(d, p), is.Lanes(d, q)), hn::Or(is.Lanes(d, r), is.Lanes(d, s))));
+      d, hn::Or(hn::Or(pred.Lanes(d, p), pred.Lanes(d, q)), hn::Or(pred.Lanes(d, r), pred.Lanes(d, s))));
 }
 
 /// Scans a range of one vector or more.
-template <bool kReverse, class D, class T, class Is>
-HWY_INLINE const T* ScanVectors(D d, const T* x1, const T* x2, const Is& is) {
+template <bool kReverse, class D, class T, class Pred>
+HWY_INLINE const T* ScanVectors(D d, const T* x1, const T* x2, const Pred& pred) {
   constexpr std::size_t n = hn::MaxLanes(D());
   // Unsigned: i may exceed the length, which in a 32-bit program may be the largest ssize_t.
   const std::size_t length = static_cast<std::size_t>(x2 - x1), last = length - n;
   const auto at = [=](std::size_t i) { return kReverse ? x2 - n - i : x1 + i; };
   const auto clamped = [=](std::size_t i) { return at(i < last ? i : last); };
-  if (const T* const hit = HitIn<kReverse>(d, at(0), is))
+  if (const T* const hit = HitIn<kReverse>(d, at(0), pred))
     return hit;
   std::size_t i = n;
-  if constexpr (Is::kIsCheap) {
-    while (length - i >= 4 * n && !HasHit(d, at(i), at(i + n), at(i + 2 * n), at(i + 3 * n), is))
+  if constexpr (Pred::kIsCheap) {
+    while (length - i >= 4 * n && !HasHit(d, at(i), at(i + n), at(i + 2 * n), at(i + 3 * n), pred))
       i += 4 * n;
     if (i >= length ||
-        (length - i < 4 * n && !HasHit(d, clamped(i), clamped(i + n), clamped(i + 2 * n), at(last), is)))
+        (length - i < 4 * n && !HasHit(d, clamped(i), clamped(i + n), clamped(i + 2 * n), at(last), pred)))
       return nullptr;
   }
   for (; i < length; i += n)
-    if (const T* const hit = HitIn<kReverse>(d, clamped(i), is))
+    if (const T* const hit = HitIn<kReverse>(d, clamped(i), pred))
       return hit;
   return nullptr;
 }
 
 /// Scans a range of one to two vectors.
-template <bool kReverse, class D, class T, class Is>
-HWY_INLINE const T* ScanEnds(D d, const T* x1, const T* x2, const Is& is) {
+template <bool kReverse, class D, class T, class Pred>
+HWY_INLINE const T* ScanEnds(D d, const T* x1, const T* x2, const Pred& pred) {
   const T* const last = x2 - hn::MaxLanes(d);
-  const T* const hit = HitIn<kReverse>(d, kReverse ? last : x1, is);
-  return hit != nullptr ? hit : HitIn<kReverse>(d, kReverse ? x1 : last, is);
+  const T* const hit = HitIn<kReverse>(d, kReverse ? last : x1, pred);
+  return hit != nullptr ? hit : HitIn<kReverse>(d, kReverse ? x1 : last, pred);
 }
 
 /// Scans unit by unit.
-template <bool kReverse, class T, class Is>
-HWY_INLINE const T* ScanUnits(const T* x1, const T* x2, const Is& is) {
+template <bool kReverse, class T, class Pred>
+HWY_INLINE const T* ScanUnits(const T* x1, const T* x2, const Pred& pred) {
   for (ssize_t i = 0, n = x2 - x1; i < n; ++i)
-    if (const T* const p = kReverse ? x2 - 1 - i : x1 + i; is.At(p))
+    if (const T* const p = kReverse ? x2 - 1 - i : x1 + i; pred.At(p))
       return p;
   return nullptr;
 }
 
-template <bool kReverse, class T, class Is> HWY_INLINE const T* Scan(const T* x1, const T* x2, const Is& is) {
+template <bool kReverse, class T, class Pred>
+HWY_INLINE const T* Scan(const T* x1, const T* x2, const Pred& pred) {
   const ssize_t length = x2 - x1;
   constexpr ssize_t n = ssize_t(hn::MaxLanes(FullTag<T>()));
   if (length >= n)
-    return length <= 2 * n ? ScanEnds<kReverse>(FullTag<T>(), x1, x2, is)
-                           : ScanVectors<kReverse>(FullTag<T>(), x1, x2, is);
+    return length <= 2 * n ? ScanEnds<kReverse>(FullTag<T>(), x1, x2, pred)
+                           : ScanVectors<kReverse>(FullTag<T>(), x1, x2, pred);
   if (length >= 16 / ssize_t(sizeof(T)))
-    return ScanEnds<kReverse>(TagOf<T, 16>(), x1, x2, is);
+    return ScanEnds<kReverse>(TagOf<T, 16>(), x1, x2, pred);
   if (length >= 8 / ssize_t(sizeof(T)))
-    return ScanEnds<kReverse>(TagOf<T, 8>(), x1, x2, is);
-  return ScanUnits<kReverse>(x1, x2, is);
+    return ScanEnds<kReverse>(TagOf<T, 8>(), x1, x2, pred);
+  return ScanUnits<kReverse>(x1, x2, pred);
 }
 
 template <class T> HWY_INLINE const T* HitOrEnd(const T* hit, const T* end) {
@@ -149,7 +150,7 @@ template <bool kReverse, class T> HWY_INLINE ssize_t PassHit(const T*& p, const 
   return length - (end - p);
 }
 
-/// Whether a needle may begin at a place, by three of its units.
+/// Whether a needle may begin at a position, by three of its units.
 template <class T> class NeedleStart {
 public:
   static constexpr bool kIsCheap = true;
@@ -160,9 +161,9 @@ public:
     return *p == m_first && p[m_last] == m_final && p[m_last / 2] == m_middle;
   }
   template <class D> HWY_INLINE hn::Mask<D> Lanes(D d, const T* p) const {
-    const auto isEnd =
+    const auto matchesEnds =
         hn::And(EqualTo(d, LoadUnits(d, p), m_first), EqualTo(d, LoadUnits(d, p + m_last), m_final));
-    return hn::And(isEnd, EqualTo(d, LoadUnits(d, p + m_last / 2), m_middle));
+    return hn::And(matchesEnds, EqualTo(d, LoadUnits(d, p + m_last / 2), m_middle));
   }
 
   /// Scans [p, end). The first unit alone is found faster, unless it is too frequent.
@@ -193,7 +194,7 @@ const T* FindSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
   NeedleStart<T> start(y1, y2);
   Credit credit(length);
   const T* p = x1;
-  const T* end = x2 - (length - 1); // past the last place where the needle fits
+  const T* end = x2 - (length - 1); // past the last position where the needle fits
   ssize_t equal = 0;
   for (ssize_t passed = 0; credit.Allows(equal, passed);) {
     const T* const hit = start.template Next<kReverse>(p, end);
@@ -204,7 +205,7 @@ const T* FindSubSequence(const T* x1, const T* x2, const T* y1, const T* y2) {
       return hit;
     passed += PassHit<kReverse>(p, end, hit);
   }
-  const auto& scalar = ScalarSearches<T>(); // changes to Two-Way
+  const auto& scalar = ScalarSearches<T>(); // these searches switch to Two-Way if comparing stays slow
   end += length - 1;
   const T* const q = (kReverse ? scalar.findLastSubSequence : scalar.findFirstSubSequence)(p, end, y1, y2);
   return q == end ? x2 : q;
@@ -225,7 +226,7 @@ template <class T> struct Members {
   }
 };
 
-/// For each nibble its bit in a byte, which nibbles 8 apart share.
+/// Gives each value of a nibble a bit of a byte: 1 << value % 8.
 alignas(16) constexpr uint8_t kNibbleBits[16] = {1, 2, 4, 8, 16, 32, 64, 128, 1, 2, 4, 8, 16, 32, 64, 128};
 
 template <class D> HWY_INLINE hn::Vec<D> Lookup(D d, const uint8_t (&table)[16], hn::Vec<D> indices) {
@@ -236,8 +237,8 @@ template <class D> HWY_INLINE hn::Vec<D> HighNibbles(D d, hn::Vec<D> v) {
   return hn::And(hn::BitCast(d, hn::ShiftRight<4>(hn::BitCast(d16, v))), hn::Set(d, 0xF));
 }
 
-/// A set of bytes, in two tables by the low nibble. A bit is set for each high nibble that makes a member:
-/// below 8 in low, from 8 on in high.
+/// A set of bytes in two tables, which are indexed by the low nibble. An entry has a bit for each high nibble
+/// that makes a member with it: those below 8 in `low`, the others in `high`.
 struct ByteTable {
   static constexpr bool kIsCheap = true, isExact = true; ///< isExact: the table has no other members
   alignas(16) uint8_t low[16], high[16];
@@ -327,14 +328,14 @@ template <bool kReverse, bool kIsMember, class T>
 const T* FindInSet(const T* x1, const T* x2, const T* y1, const T* y2) {
   const ssize_t length = x2 - x1, size = y2 - y1;
   const Members<T> set = {y1, y2};
-  const Membership<kIsMember, T, Members<T>> is = {y1, y2, set};
+  const Membership<kIsMember, T, Members<T>> pred = {y1, y2, set};
   const bool isLarge = size > 64;
   ssize_t near = isLarge ? 8 : 16;
   if (length <= 24 || (!isLarge && int64(length) * size < 1024 * int64(sizeof(T) * sizeof(T))))
     near = length;
   const T* const from = kReverse ? x2 - near : x1;
   const T* const hit =
-      isLarge ? ScanUnits<kReverse>(from, from + near, is) : Scan<kReverse>(from, from + near, is);
+      isLarge ? ScanUnits<kReverse>(from, from + near, pred) : Scan<kReverse>(from, from + near, pred);
   if (hit != nullptr || near == length)
     return HitOrEnd(hit, x2);
   return FindInSetByTable<kReverse, kIsMember>(x1, x2, y1, y2);

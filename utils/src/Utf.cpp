@@ -50,7 +50,8 @@ namespace {
 template <class CharOut, class CharIn>
 [[gnu::noinline]] Progress<CharIn> ConvertScalar(const CharIn* src, const CharIn* srcEnd, CharOut* out,
                                                  const CharOut* outEnd) {
-  // As unsigned units: from signed ones the traits would silently convert negative values.
+  // As unsigned units: a signed byte from 80 on is negative. The comparison with 0x80 below would take it for
+  // ASCII, and the traits would convert it implicitly.
   using Unsigned = std::make_unsigned_t<CharIn>;
   using Encoding = utf::utf_traits<CharOut>;
   const Unsigned* p = reinterpret_cast<const Unsigned*>(src);
@@ -72,7 +73,8 @@ template <class CharOut, class CharIn>
 }
 
 /// Converts from malformed text on, and replaces what is malformed, until the text seems to be well-formed:
-/// in blocks, or one code point at a time where less than a block of text or room is left.
+/// in blocks, or one code point at a time where there are no kernels or less than a block of text or room is
+/// left. If it reports Stop::kMalformed, the conversion goes on, whether malformed text follows or not.
 template <class CharOut, class CharIn>
 Progress<CharIn> Replace(const UnitKernels<CharIn>* kernels, const CharIn* p, const CharIn* end, CharOut* out,
                          CharOut* outEnd, ssize_t& replacements) {
@@ -116,22 +118,24 @@ public:
   CharOut* OutEnd() { return m_string.data() + std::max(m_string.capacity() - 1, ssize_t(0)); }
   void SetEnd(const CharOut* out) { Storage::SetSize(m_string, out - m_string.data()); }
 
-  /// Makes room for the result of the rest of the source, its last `rest` units.
+  /// Makes more room when the last `rest` units of the source are left: first for one unit of the result for
+  /// each unit of the whole source; if that was too little, for the most that the rest can take.
   void GrowFor(ssize_t rest) {
     const ssize_t size = m_string.size(), tried = Sum(m_oldSize, m_srcLen);
     const ssize_t maxSize =
         size + kMaxOutPerIn<CharOut> * std::min(rest, (kMax - size) / kMaxOutPerIn<CharOut>);
     Grow(m_string.capacity() <= tried ? tried : maxSize);
   }
-  /// Gives back what isn't needed. A string that was appended to keeps twice its old capacity.
+  /// Gives back what isn't needed. A string that held text before and has grown keeps at least twice its old
+  /// capacity.
   void Finish() {
     if (m_string.capacity() != m_oldCapacity)
-      Storage::GiveBack(m_string, std::max(Least(), m_string.size() + 1));
+      Storage::GiveBack(m_string, std::max(MinCapacity(), m_string.size() + 1));
   }
 
 private:
-  ssize_t Least() const { return m_oldSize == 0 ? m_oldCapacity : Sum(m_oldCapacity, m_oldCapacity); }
-  void Grow(ssize_t n) { ReserveTerminated(m_string, std::max(n, Least())); }
+  ssize_t MinCapacity() const { return m_oldSize == 0 ? m_oldCapacity : Sum(m_oldCapacity, m_oldCapacity); }
+  void Grow(ssize_t n) { ReserveTerminated(m_string, std::max(n, MinCapacity())); }
 
   basic_xstring<CharOut>& m_string;
   const ssize_t m_oldSize, m_oldCapacity, m_srcLen;

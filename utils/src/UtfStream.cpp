@@ -29,7 +29,8 @@ void UtfStream<CharOut, CharIn>::Convert(basic_xstring<CharOut>& dst, const Char
 }
 
 /// Adds units to the pending ones until they are a sequence or can't become one, and converts them. A unit
-/// that doesn't continue the sequence isn't taken.
+/// that doesn't continue the sequence isn't taken. If the pn units end before that, all of them become
+/// pending.
 /// @return how many of the pn units were taken
 template <class CharOut, class CharIn>
 ssize_t UtfStream<CharOut, CharIn>::CompletePending(basic_xstring<CharOut>& dst, const CharIn* p,

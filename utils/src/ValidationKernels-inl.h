@@ -10,7 +10,7 @@ HWY_BEFORE_NAMESPACE();
 namespace mirel::detail::HWY_NAMESPACE {
 namespace {
 
-// UTF-8 ----------
+// UTF-8
 
 /// Returns nonzero bytes where a byte may not follow those before it. The nibbles of each two adjacent bytes
 /// are looked up in kPairFaults. Both must be continuation bytes exactly where a lead byte two or three
@@ -23,7 +23,8 @@ template <class D, class V = hn::Vec<D>> HWY_INLINE V Faults(D d, V bytes, V bef
       hn::TableLookupBytes(hn::LoadDup128(d, kPairFaults.firstLow), hn::And(first, Broadcast(d, 0x0F)));
   const V bySecond =
       hn::TableLookupBytes(hn::LoadDup128(d, kPairFaults.secondHigh), Right<4>(d, bytes, 0x0F));
-  // The highest bit where the byte two before is at least E0, or the one three before at least F0.
+  // These have the highest bit set where the byte two places before is at least E0, or the byte three places
+  // before at least F0.
   const V third = hn::SaturatedSub(Window<n - 2>(d, before, bytes), Broadcast(d, 0xE0 - 0x80));
   const V fourth = hn::SaturatedSub(Window<n - 3>(d, before, bytes), Broadcast(d, 0xF0 - 0x80));
   const V isContinued = hn::And(hn::Or(third, fourth), Broadcast(d, 0x80));
@@ -43,7 +44,7 @@ template <bool kIsCounted> struct Utf8Scan {
   using D = Wide;
   static constexpr ssize_t kUnits = WideUtf8Block::kUnits;
 
-  hn::Vec<D> last; ///< the last vector of the block before
+  hn::Vec<D> last; ///< the last vector of the block before; if that block is ASCII, any vector of ASCII
   ssize_t continuations, fourBytes;
   bool followsAscii;
 
@@ -51,8 +52,8 @@ template <bool kIsCounted> struct Utf8Scan {
   // the kernels'.
   static HWY_INLINE Utf8Scan Begin() { return {hn::Zero(D()), 0, 0, true}; }
 
-  /// Returns whether the block at p goes on well-formed, except for a sequence that its end cuts off, and
-  /// counts it if it does.
+  /// Returns whether the text stays well-formed through the block at p, except for a sequence that the
+  /// block's end cuts off, and counts the block if so.
   HWY_INLINE bool Take(const char8* p) {
     const bool isAscii = IsAscii<kUnits>(p);
     if (isAscii && followsAscii)
@@ -103,7 +104,7 @@ template <bool kIsCounted> HWY_INLINE Measured<char8> ScanUtf8(const char8* cons
   return {p, {codePoints, codePoints + scan.fourBytes - (cutOff > 0 && UnitValue(*p) >= 0xF0)}};
 }
 
-// UTF-16 ----------
+// UTF-16
 
 /// A scan of UTF-16. A bit tells the next block whether this one ends with a high surrogate: a block that
 /// began at that surrogate would have to wait for the masks of this one.
@@ -111,15 +112,15 @@ template <bool kIsCounted, class D> struct Utf16Scan {
   using Block = Utf16Block<D>;
   static constexpr ssize_t kUnits = Block::kUnits;
 
-  /// How many bytes the units lack of three: one for each unit below 800, another for each below 80.
+  /// How many bytes fewer than three the units take: one for each unit below 800, another for each below 80.
   hn::Vec<hn::Repartition<uint64_t, D>> lacking;
   ssize_t surrogates, zeros;
   uint64_t isCutOff; ///< 1 if the block before ends with a high surrogate
 
   static HWY_INLINE Utf16Scan Begin() { return {hn::Zero(hn::Repartition<uint64_t, D>()), 0, 0, 0}; }
 
-  /// Returns whether the block at p goes on well-formed from unit `from` on, and counts it if it does. The
-  /// units before that count as zeros.
+  /// Returns whether the text stays well-formed from unit `from` of the block at p on, except for a high
+  /// surrogate at the block's end, and counts the block if so. The units before `from` count as zeros.
   HWY_INLINE bool Take(const char16* p, ssize_t from) {
     const ToUnits<D> du;
     auto first = hn::LoadU(du, p), second = hn::LoadU(du, p + kUnits / 2);
@@ -129,8 +130,8 @@ template <bool kIsCounted, class D> struct Utf16Scan {
     }
     const auto mask = hn::Set(du, 0xF800), surrogate = hn::Set(du, 0xD800);
     const auto kind1 = hn::And(first, mask), kind2 = hn::And(second, mask);
-    const bool hasNone = hn::AllFalse(du, hn::Or(hn::Eq(kind1, surrogate), hn::Eq(kind2, surrogate)));
-    if (!hasNone || isCutOff != 0) {
+    const bool hasNoSurrogates = hn::AllFalse(du, hn::Or(hn::Eq(kind1, surrogate), hn::Eq(kind2, surrogate)));
+    if (!hasNoSurrogates || isCutOff != 0) {
       const Block block = Block::Of(hn::BitCast(D(), first), hn::BitCast(D(), second));
       const uint64_t highs = BitsOf(D(), block.Is(0xD8, 0xFC)), lows = BitsOf(D(), block.Is(0xDC, 0xFC));
       if ((((highs << 1 | isCutOff << from) ^ lows) & FirstBits(kUnits)) != 0)
@@ -151,7 +152,7 @@ template <bool kIsCounted, class D> struct Utf16Scan {
 };
 
 /// Scans UTF-16 in blocks as far as it is well-formed. Where it stops, a sequence begins. The last block ends
-/// with the text.
+/// with the text, so the text must have as many units as a block.
 template <bool kIsCounted, class D>
 HWY_INLINE Measured<char16> ScanUtf16(const char16* const begin, const char16* end) {
   auto scan = Utf16Scan<kIsCounted, D>::Begin();

@@ -33,9 +33,9 @@ void FillBytes(uint8* dst, ssize_t n, uint8 x) {
 
 void detail::AllocationFailed() { throw std::bad_alloc(); }
 
-/// Decides growth for all edits: to the new size plus the old capacity. The capacity at least doubles, so a
-/// series of edits moves each byte a constant number of times on average. The first request gets exactly what
-/// it asks for.
+/// Decides growth for all edits: to the new size plus the old capacity. The capacity at least doubles, so
+/// that in a series of edits growth moves each byte a constant number of times on average. The first request
+/// gets exactly what it asks for.
 ssize_t VectorOfByte::GrownCapacity(ssize_t capacity, std::size_t n) {
   if (n > std::size_t(kMaxBytes))
     throw std::bad_alloc();

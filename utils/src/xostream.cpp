@@ -16,7 +16,8 @@ namespace mirel {
 namespace detail { // not an unnamed namespace: g++ warns of a member of such a type in unity builds
 
 /// Buffers text in a block, so that the sink is called seldom, and adds the indent between a newline and the
-/// next byte. A line as long as the block goes to the sink without being copied.
+/// next byte. A line of at least the block's size, or any text of that size while there is no indent, goes to
+/// the sink without being copied.
 class IndentingBuffer : public std::streambuf {
 public:
   explicit IndentingBuffer(IOutputStream& os) : sink(&os) {}

@@ -49,7 +49,9 @@ int main() {
   mirel::string8 text;
   text.assign(units.begin(), units.end()); // a template that the library has no instance of
   const std::vector<mirel::string16> words = Words(text);
-  Expect(words.size() == 2 && words[0].size() == 1 && words[0][0] == 0xE4, "the words are there");
+  Expect(words.size() == 2, "the text has two words");
+  Expect(words[0].size() == 1, "the first word has one unit");
+  Expect(words[0][0] == 0xE4, "the first word is U+00E4");
 
   SmallSink sink;
   Print(sink, words[0]);

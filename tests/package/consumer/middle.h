@@ -1,4 +1,4 @@
-// The exported functions of a shared library that hides everything else. They pass strings, streams and
+// The exported functions of a shared library that hides everything else. They pass strings, sinks and
 // exceptions.
 
 #pragma once

@@ -1,4 +1,4 @@
-// A program without exceptions and RTTI. With an argument, it allocates more memory than exists.
+// A program without exceptions and RTTI. With an argument, it asks for more memory than exists.
 
 #include <cstdint>
 #include <cstdio>

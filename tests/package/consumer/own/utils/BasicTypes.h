@@ -1,2 +1,2 @@
-// A program's own header, which is named as one of the library's and stands before it in the search path.
+// A program's own header. It has the name of one of the library's, and is found first.
 #define OWN_BASIC_TYPES
