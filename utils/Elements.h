@@ -15,8 +15,9 @@
 namespace mirel {
 
 /// @name Element ranges
-/// A range is half open and given by two pointers; an empty one may be a pair of null pointers. Overload
-/// resolution decides how a source is copied: `const T*` as one block, anything else in a loop.
+/// A range is half open and given by two pointers; a source may have other iterators. An empty range may be a
+/// pair of null pointers. Overload resolution decides how a source is copied: `const T*` as one block,
+/// anything else in a loop.
 /// @snippet examples/reference.cpp element ranges
 /// @{
 
@@ -34,7 +35,8 @@ inline void p_create(char8* r1, char8* r2, char8 x) {
   if (r1 < r2)
     std::memset(r1, x, static_cast<std::size_t>(r2 - r1));
 }
-/// Fills [r1, r2) with x, a 16-bit code unit, by assigning_p_create().
+/// Fills [r1, r2) with x, a 16-bit code unit; a reversed range is empty.
+/// @pre "r1 >= r2 || r1 != nullptr"
 inline void p_create(char16* r1, char16* r2, char16 x) { assigning_p_create<char16>(r1, r2, x); }
 
 /// Copies [src1, src2) to dst as one block. The two ranges may not overlap.
@@ -52,11 +54,13 @@ template <class T, class It> void p_copy(T* dst, It src1, It src2) {
   for (; src1 != src2; ++src1, ++dst)
     *dst = *src1;
 }
-/// Copies 8-bit code units by memcpy_p_copy().
+/// Copies the 8-bit code units of [src1, src2) to dst as one block. The two ranges may not overlap.
+/// @pre "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)"
 inline void p_copy(char8* dst, const char8* src1, const char8* src2) {
   memcpy_p_copy<char8>(dst, src1, src2);
 }
-/// Copies 16-bit code units by memcpy_p_copy().
+/// Copies the 16-bit code units of [src1, src2) to dst as one block. The two ranges may not overlap.
+/// @pre "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)"
 inline void p_copy(char16* dst, const char16* src1, const char16* src2) {
   memcpy_p_copy<char16>(dst, src1, src2);
 }

@@ -58,7 +58,7 @@ template <class T, class N> constexpr bool HasBitsFor(N x) { // decided at compi
 }
 
 /// The compiler's message about a constant that doesn't fit.
-#define MIREL_CUT                                                                                            \
+#define MIREL_TOO_MANY_BITS                                                                                  \
   "this constant has more bits than the code unit that it is passed as: cast it if that is meant"
 
 #ifdef __clang__
@@ -66,18 +66,19 @@ template <class T, class N> constexpr bool HasBitsFor(N x) { // decided at compi
 template <class T, bool kStored, class N> constexpr void CheckConstant(N) {}
 #else
 /// Isn't defined: the compilation fails if a call remains after optimisation.
-void ConstantDoesNotFit() __attribute__((error(MIREL_CUT)));
+void ConstantDoesNotFit() __attribute__((error(MIREL_TOO_MANY_BITS)));
 /// Never inlined, so that the compiler warns of a call that remains after optimisation.
-__attribute__((noipa, warning(MIREL_CUT))) inline void ConstantIsCut() {}
+__attribute__((noipa, warning(MIREL_TOO_MANY_BITS))) inline void ConstantIsTruncated() {}
 
 /// Refuses a constant with too many bits that is stored, and warns of one that is searched for, if the
-/// compiler optimises. Nothing is checked at run time. The compiler also takes a variable for a constant if
-/// it knows the value, as in `if (n == 256)`; a search for that is no mistake, so it is only a warning.
+/// compiler optimises. Nothing is checked at run time. The compiler also takes a variable for a constant
+/// where it knows the value: n, for example, within `if (n == 256) {...}`. To search for such a variable is
+/// no mistake, so a search only gets a warning.
 template <class T, bool kStored, class N>
 [[gnu::always_inline]] inline void CheckConstant([[maybe_unused]] N x) {
 #ifdef __OPTIMIZE__
-  if (__builtin_constant_p(x) && !HasBitsFor<T>(x))   // decided at compile time
-    kStored ? ConstantDoesNotFit() : ConstantIsCut(); // decided at compile time
+  if (__builtin_constant_p(x) && !HasBitsFor<T>(x))         // decided at compile time
+    kStored ? ConstantDoesNotFit() : ConstantIsTruncated(); // decided at compile time
 #endif
 }
 #endif
@@ -128,7 +129,7 @@ template <class T, int kMore, class X> [[gnu::always_inline]] inline T UnitToFin
 #ifdef __clang__
 #define MIREL_FITS(T, x)                                                                                     \
   _Pragma("clang diagnostic push") _Pragma("clang diagnostic ignored \"-Wgcc-compat\"")                      \
-      __attribute__((diagnose_if(!::mirel::detail::HasBitsFor<T>(x), MIREL_CUT, "error")))                   \
+      __attribute__((diagnose_if(!::mirel::detail::HasBitsFor<T>(x), MIREL_TOO_MANY_BITS, "error")))         \
       _Pragma("clang diagnostic pop")
 #else
 #define MIREL_FITS(T, x)

@@ -1,5 +1,6 @@
 /// @file
-/// Calls that vectors and strings don't have: deleted, with a return type that names what to write instead.
+/// Calls that vectors and strings don't have: deleted, with a return type, or the type of a parameter Hint,
+/// that names what to write instead.
 ///
 /// The operators take their arguments by user-defined conversions, so overload resolution prefers whatever
 /// operator a program or another header declares for such arguments, those of utils/Std.h included. Deleted
@@ -29,8 +30,8 @@ struct AnyVector {
 };
 
 /// Any non-const vector or string converts to it.
-struct ChangeableVector {
-  template <class T> ChangeableVector(xvector<T>&);
+struct NonConstVector {
+  template <class T> NonConstVector(xvector<T>&);
 };
 
 /// Vectors and strings of T convert to it.
@@ -73,8 +74,8 @@ struct WriteTwoPointers {};
 
 struct ReversePointer;
 
-/// The unit of text: the value_type of a class with the members of a string, or the type that a pointer
-/// points to; void for other types.
+/// The code unit of X if X is text: the value_type of a class that has npos, as strings and string views do,
+/// or the type that a pointer points to; void for other types.
 template <class X, class = void> struct TextUnit { typedef void type; };
 template <class X> struct TextUnit<X, std::void_t<decltype(X::npos), typename X::value_type>> {
   typedef std::remove_cv_t<typename X::value_type> type;
@@ -100,8 +101,8 @@ struct InPlaceOf<T, X, U,
   typedef std::conditional_t<sizeof(T) == 1, ConvertToUtf8First, ConvertToUtf16First> Conversion;
   typedef std::conditional_t<sizeof(T) == sizeof(U), Copy, Conversion> type;
 };
-/// The hint for X, if nothing but integers follows it. It is a parameter of a deleted template, so that
-/// compilers print it.
+/// The hint for X, if nothing but integers follows it. It is the default of a deleted template's parameter,
+/// so that compilers print it.
 template <class T, class X, class... N>
 using Instead = std::enable_if_t<kIsEachInteger<N...>, typename InPlaceOf<T, X>::type>;
 
@@ -123,7 +124,7 @@ detail::IncludeStdOrWrite_Lt operator<=(detail::AnyVector, detail::Anything) = d
 detail::IncludeStdOrWrite_Lt operator<=(detail::NoVector, detail::AnyVector) = delete;
 detail::IncludeStdOrWrite_Lt operator>=(detail::AnyVector, detail::Anything) = delete;
 detail::IncludeStdOrWrite_Lt operator>=(detail::NoVector, detail::AnyVector) = delete;
-detail::ConvertToStringOfItsWidthFirst operator+=(detail::ChangeableVector, detail::Anything) = delete;
+detail::ConvertToStringOfItsWidthFirst operator+=(detail::NonConstVector, detail::Anything) = delete;
 template <class C, class Traits>
 detail::IncludeStdOrWriteCStr operator<<(std::basic_ostream<C, Traits>&, detail::VectorOf<char8>) = delete;
 template <class C, class Traits>

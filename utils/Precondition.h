@@ -2,7 +2,8 @@
 /// The precondition assertion: a bad argument stops the process, in every build.
 ///
 /// Unlike `assert` it ignores NDEBUG, both the library's and the program's: a check that is inlined into an
-/// optimised program must not disappear there. The report is that of the C library's own `assert`.
+/// optimised program must not disappear there. With glibc and on Android the C library's own `assert`
+/// makes the report; elsewhere the library prints glibc's line itself.
 
 #pragma once
 
@@ -11,7 +12,7 @@
 namespace mirel {
 
 /// Reports a violated precondition through the C library's assertion facility and ends the process (SIGABRT).
-/// Where no such facility is known, it prints the same line to standard error itself.
+/// With a C library other than glibc's and Android's, it prints glibc's line to standard error itself.
 ///
 /// @param expression  the violated expression, as text
 /// @param file        the source file of the check; the report shows its path from the last utils/ on

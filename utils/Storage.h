@@ -24,7 +24,7 @@ struct Storage {
     v.m_buffer.size_ = size * ssize_t(sizeof(T));
   }
   /// Reduces the storage to capacity elements, which are no fewer than v has.
-  template <class T> static void GiveBack(xvector<T>& v, ssize_t capacity) {
+  template <class T> static void Shrink(xvector<T>& v, ssize_t capacity) {
     if (capacity < v.capacity())
       v.m_buffer.Shrink(capacity * ssize_t(sizeof(T)));
   }

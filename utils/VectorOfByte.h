@@ -92,8 +92,8 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 /// worst the cost is linear in the haystack for one element, and in the product of both lengths for a needle
 /// or a set. It is linear in the sum of the lengths for needles if both ranges have random-access iterators
 /// over integers, and for all searches if every pointer is a `const char8*` or every one a `const char16*`.
-/// These have overloads of the same names and results, which use SIMD instructions if the processor has them;
-/// a pointer to units that aren't const doesn't select them.
+/// Such pointers select overloads of the same names and results, which use SIMD instructions if the processor
+/// has them; a pointer to units that aren't const doesn't.
 /// @snippet examples/reference.cpp searching ranges
 /// @{
 
@@ -195,7 +195,7 @@ template <class T> struct SearchKernels {
 /// Returns whether a range is so short that the loops in this file are faster than a call of a kernel.
 template <class T> bool IsShort(const T* x1, const T* x2) { return x2 - x1 <= 16; }
 
-/// Find() that checks for the end of the range only at every fourth unit.
+/// Finds what Find() does, but checks for the end of the range only at every fourth unit.
 template <class T> const T* FindByFour(const T* i1, const T* i2, T v) {
   while (i2 - i1 >= 4 && i1[0] != v && i1[1] != v && i1[2] != v && i1[3] != v)
     i1 += 4;
@@ -204,8 +204,8 @@ template <class T> const T* FindByFour(const T* i1, const T* i2, T v) {
   return i1;
 }
 
-/// FindLast() that checks for the beginning of the range only at every fourth unit. It counts by an index,
-/// since compilers generate better code for that than for a pointer that goes back.
+/// Finds what FindLast() does, but checks for the beginning of the range only at every fourth unit. It
+/// decrements an index, since compilers generate better code for that than for a pointer that goes back.
 template <class T> const T* FindLastByFour(const T* i1, const T* i2, T v) {
   ssize_t i = i2 - i1;
   while (i >= 4 && i1[i - 1] != v && i1[i - 2] != v && i1[i - 3] != v && i1[i - 4] != v)
@@ -238,7 +238,7 @@ bool IsPrefix(const T* x1, const T* x2, const T* y1, const T* y2) {
 }
 template <class T, detail::IfCodeUnit<T> = 0> const T* Find(const T* i1, const T* i2, const T& v) {
   if constexpr (sizeof(T) == 1) {
-    // The C library is as fast. Even for no bytes memchr may not be given null pointers.
+    // The C library's memchr is as fast as a kernel. Even for no bytes it may not be given null pointers.
     const void* const p = i1 == i2 ? nullptr : std::memchr(i1, v, static_cast<std::size_t>(i2 - i1));
     return p != nullptr ? static_cast<const T*>(p) : i2;
   } else {
@@ -255,7 +255,7 @@ const T* FindFirstSubSequence(const T* x1, const T* x2, const T* y1, const T* y2
     return x1;
   if (!detail::IsShort(x1, x2)) {
     const ssize_t length = y2 - y1;
-    if (sizeof(T) == 1 && x2 - x1 >= length) // if the first byte is rare, memchr does all the work
+    if (sizeof(T) == 1 && x2 - x1 >= length) // if the first byte is rare, memchr does most of the work
       x1 = Find(x1, x2 - (length - 1), detail::CopyOf(y1));
     return x2 - x1 < length ? x2 : detail::BestSearches(x1).findFirstSubSequence(x1, x2, y1, y2);
   }
@@ -307,8 +307,9 @@ inline int LexicographicalCompareX(const char16* x1, const char16* x2, const cha
 /// An untyped, growable array of bytes: the storage of every vector and string.
 ///
 /// Parameters: `i` is an offset or an iterator, `n` a number of bytes from there, `i1`/`i2` and `r1`/`r2` the
-/// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a repeat count. An integer of
-/// any type may stand for an offset, a count or a byte: a literal 0 is one of these, never a pointer.
+/// ends of half-open ranges in this buffer and elsewhere, `x` a byte, `count` a number of bytes to add or
+/// remove. An integer of any type may stand for an offset, a count or a byte: a literal 0 is one of these,
+/// never a pointer. Only push_back(x) takes x as a number of its own type, and appends all bytes of it.
 ///
 /// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments
 /// stop the process with the text after "@pre", before anything has changed. A source is checked after all
@@ -371,8 +372,8 @@ public:
   /// Appends count uninitialised bytes. @pre "0 <= count"
   void growbytes(ssize_t count) {
     MIREL_ASSERT(0 <= count);
-    if (count <= m_capacity - size_) // all that insertbytes() does if there is room
-      size_ += count;
+    if (count <= m_capacity - size_)
+      size_ += count; // all that insertbytes() does at the end if there is room
     else
       insertbytes(size(), count);
   }
@@ -440,12 +441,13 @@ public:
   /// Appends the bytes of [r1, r2). @pre "r1 <= r2"
   void push_back(const value_type* r1, const value_type* r2);
 
-  /// Appends the bytes of one number. When the buffer is full it reserves the new size plus the old capacity.
+  /// Appends all bytes of one number in the machine's own byte order: four for an int, for example. If there
+  /// isn't enough room, it reserves the new size plus the old capacity.
   template <class T> void push_back(const T& x) {
     static_assert(std::is_arithmetic_v<T> || std::is_enum_v<T>,
                   "push_back appends one number: write += for a buffer, and push_back(r1, r2) for bytes");
     static_assert(!std::is_same_v<std::remove_cv_t<T>, long double>,
-                  "a long double has bytes of no particular value: append it as a double");
+                  "a long double may have padding bytes: append it as a double");
     const std::remove_volatile_t<T> value = x; // x may lie in the storage that is about to be released
     const std::size_t n = std::size_t(size_) + sizeof(T); // unsigned, where it can't overflow
     if (std::size_t(m_capacity) < n) {
@@ -504,8 +506,8 @@ public:
 
   /// @}
   /// @name Comparison
-  /// The sign of the result is the order of the first differing bytes, as unsigned values. The cost is at
-  /// worst linear in the shorter length.
+  /// The sign of the result is the order of the first differing bytes, as unsigned values; a proper prefix of
+  /// a buffer orders before it. The cost is at worst linear in the shorter length.
   /// @snippet examples/reference.cpp bytes comparison
   /// @{
 
@@ -597,7 +599,7 @@ private:
   // a loop of appends.
   static value_type* Reallocate(value_type* buffer, ssize_t n);
   static void Release(value_type* buffer) noexcept;
-  /// Reduces the storage to n bytes, at least size() and 1; keeps it if that fails.
+  /// Reduces the storage to n bytes; keeps it if that fails. n must be at least 1 and at least size().
   void Shrink(ssize_t n) noexcept;
   friend struct detail::Storage;
 

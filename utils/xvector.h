@@ -24,12 +24,12 @@ namespace mirel {
 /// Parameters, throughout: `i` an index or iterator, `n` a number of elements from there; `i1`/`i2` the ends
 /// of a half-open range of this vector; `r` another vector, `ri`/`rn` a sub-range of it; `p`/`pn` a pointer
 /// and a number of elements; `r1`/`r2` a half-open range elsewhere; `x` an element; `c` an element that is
-/// looked for; `offset` where a search starts; `count` a repeat, fill or substring length. Indices
-/// and counts are in elements, and signed. An integer of any type may stand for an index, a count or an
-/// element: a literal 0 is one of these, never a pointer. utils/Ranges.h says which iterators a range may
-/// have, and how its elements are read; a single element is read as its unsigned value too. A constant that
-/// doesn't fit doesn't compile with clang, nor with g++ if it optimises. G++ may take a variable for a
-/// constant if it knows the value, and only warns of a constant that is searched for.
+/// looked for; `offset` where a search or a substring starts; `count` a number of repetitions, or the length
+/// of a substring. Indices and counts are in elements, and signed. An integer of any type may stand for an
+/// index, a count or an element: a literal 0 is one of these, never a pointer. utils/Ranges.h says which
+/// iterators a range may have, and how its elements are read; a single element is read as its unsigned value
+/// too. Clang refuses a constant that doesn't fit. So does g++ if it optimises, but it only warns of one that
+/// is searched for, and may take a variable for a constant if it knows the value.
 ///
 /// @par Bad arguments
 /// They stop the process with the text given after "@pre", before anything has changed. They are never
@@ -54,7 +54,8 @@ namespace mirel {
 /// A series of edits takes amortised constant time per element added, plus time linear in the number of
 /// elements moved.
 /// @par Threads
-/// Different threads may use different vectors, and may read one vector that no thread changes.
+/// Different threads may use different vectors, and may read one vector that no thread changes. reserve()
+/// counts as a change, although it is const.
 ///
 /// @snippet examples/reference.cpp xvector
 template <class T> class MIREL_DESCRIBED MIREL_API xvector {
@@ -83,7 +84,8 @@ public:
 
   /// @}
   /// @name Construction, copy
-  /// There is no move: copies copy, and swap() exchanges storage. A new vector's capacity is its size.
+  /// A vector has no move operations: a temporary is copied too. Use swap() to exchange storage. A new
+  /// vector's capacity is its size.
   /// @snippet examples/reference.cpp construction
   /// @{
 
@@ -371,7 +373,7 @@ public:
     MIREL_ASSERT(0 <= i && i <= size());
     FillRange(i, 0, 1, x);
   }
-  /// Inserts x before an iterator. @return an iterator at the inserted element
+  /// Inserts x before an iterator. @pre "0 <= i && i <= size()" @return an iterator at the inserted element
   iterator insert(iterator i, const T& x) {
     const ssize_t n = i - begin();
     insert(n, x);
@@ -383,12 +385,14 @@ public:
     MIREL_ASSERT(0 <= count);
     FillRange(i, 0, count, x);
   }
-  /// Inserts count elements equal to x before an iterator.
+  /// Inserts count elements equal to x before an iterator. @pre "0 <= i && i <= size()", then "0 <= count"
   void insert(iterator i, ssize_t count, const T& x) { insert(i - begin(), count, x); }
 #if __SIZEOF_POINTER__ != 4 // otherwise ssize_t is int
   /// Inserts count elements equal to x, with an int for the count, before index i.
+  /// @pre "0 <= i && i <= size()", then "0 <= count"
   void insert(ssize_t i, int count, const T& x) { insert(i, ssize_t(count), x); }
   /// Inserts count elements equal to x, with an int for the count, before an iterator.
+  /// @pre "0 <= i && i <= size()", then "0 <= count"
   void insert(iterator i, int count, const T& x) { insert(i, ssize_t(count), x); }
 #endif
 
@@ -498,8 +502,8 @@ public:
   /// @}
   /// @name Comparison
   /// Compare the first differing elements as unsigned values; a proper prefix of a vector orders before it.
-  /// compare() returns a negative number, 0 or a positive one: for char8 a difference is the value of memcmp,
-  /// otherwise the result is -1, 0 or 1. The cost is at worst linear in the shorter length.
+  /// compare() returns a negative number, 0 or a positive one: for char8 the value of memcmp if two elements
+  /// differ, otherwise -1, 0 or 1. The cost is at worst linear in the shorter length.
   /// @snippet examples/reference.cpp comparison
   /// @{
 
@@ -715,7 +719,7 @@ public:
 
   // Overloads for integers of any type, then deleted overloads. An integer matches the former exactly, so
   // that a literal 0 is an index, a count or an element, never a null pointer. Each calls the declared
-  // overload of its name, with elements by their unsigned value.
+  // overload of its name, and converts elements by their unsigned value.
   /// @cond
 
   template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>
@@ -822,7 +826,8 @@ public:
   template <class... A>
   detail::ReverseIteratorsOnlyStep replace(const detail::ReversePointer&, A...) = delete;
   detail::ReverseIteratorsOnlyStep operator+=(const detail::ReversePointer&) = delete;
-  // Text of other units, and other strings. The compiler's message names what to write as the type of Hint.
+  // These refuse text of other units, standard strings and reverse iterators. In the compiler's message, the
+  // type of Hint names what to write instead.
   template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
   explicit xvector(const X&, N...) = delete;
   template <class X, class... N, class Hint = detail::Instead<T, X, N...>>
@@ -884,7 +889,7 @@ private:
       detail::AllocationFailed();
     return count * S;
   }
-  /// Converts bytes to elements. An unsigned division is a shift, and compilers see that it is never
+  /// Converts bytes to elements. An unsigned division is a shift, and compilers see that the result is never
   /// negative.
   static ssize_t Elements(ssize_t bytes) { return ssize_t(static_cast<std::size_t>(bytes) / sizeof(T)); }
   // Every insertion, assignment and replacement resizes a range of elements and overwrites it. The exceptions
@@ -1036,8 +1041,8 @@ template <class T> void xvector<T>::ReplaceRange(ssize_t i, ssize_t n, const T* 
   p_copy(range, p, p + pn);
 }
 
-/// Replaces the n elements at index i by count elements of value x, which is passed by value, since it may be
-/// one of them.
+/// Replaces the n elements at index i by count elements equal to x. The argument may be an element of
+/// this vector, so x is passed by value.
 template <class T> void xvector<T>::FillRange(ssize_t i, ssize_t n, ssize_t count, T x) {
   T* const range = ResizeRange(i, n, count);
   p_create(range, range + count, x);

@@ -130,7 +130,7 @@ public:
   /// capacity.
   void Finish() {
     if (m_string.capacity() != m_oldCapacity)
-      Storage::GiveBack(m_string, std::max(MinCapacity(), m_string.size() + 1));
+      Storage::Shrink(m_string, std::max(MinCapacity(), m_string.size() + 1));
   }
 
 private:
@@ -241,7 +241,7 @@ bool Utf8FromUtf16(string8& dst, std::u16string_view text) {
     isWellFormed = detail::AppendStrict(dst, part, static_cast<ssize_t>(n) - cutOff);
     text.remove_prefix(n - static_cast<std::size_t>(cutOff));
   }
-  detail::Storage::GiveBack(dst, std::max(oldCapacity, dst.size() + 1));
+  detail::Storage::Shrink(dst, std::max(oldCapacity, dst.size() + 1));
   return isWellFormed;
 }
 
