@@ -23,8 +23,9 @@
 
 #if HWY_TARGET == HWY_AVX2 || HWY_TARGET == HWY_SSE4 || (HWY_TARGET == HWY_NEON && HWY_ARCH_ARM_A64)
 
-#include "ConversionKernels-inl.h"
 #include "SearchKernels-inl.h"
+#include "Utf16Kernels-inl.h"
+#include "Utf8Kernels-inl.h"
 #include "ValidationKernels-inl.h"
 
 namespace mirel::detail::HWY_NAMESPACE {

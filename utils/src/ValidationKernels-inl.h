@@ -3,14 +3,18 @@
 // A text is scanned in blocks. One that is well-formed is counted; the first that isn't ends the scan, and
 // the scalar path finds the malformed sequence.
 //
-// There is no include guard: the file is included once for each instruction set, after
-// ConversionKernels-inl.h, whose names it uses.
+// There is no include guard: the file is included once for each instruction set.
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+
+#include "Utf16Kernels-inl.h"
+#include "Utf8Kernels-inl.h"
 
 HWY_BEFORE_NAMESPACE();
 namespace mirel::detail::HWY_NAMESPACE {
 namespace {
-
-// UTF-8
 
 /// Returns nonzero bytes where a byte may not follow those before it. The nibbles of each two adjacent bytes
 /// are looked up in kPairFaults. Both must be continuation bytes exactly where a lead byte two or three
@@ -103,8 +107,6 @@ template <bool kIsCounted> HWY_INLINE Measured<char8> ScanUtf8(const char8* cons
   p -= cutOff;
   return {p, {codePoints, codePoints + scan.fourBytes - (cutOff > 0 && UnitValue(*p) >= 0xF0)}};
 }
-
-// UTF-16
 
 /// A scan of UTF-16. A bit tells the next block whether this one ends with a high surrogate: a block that
 /// began at that surrogate would have to wait for the masks of this one.
