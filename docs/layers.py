@@ -17,7 +17,7 @@ def includes(path):
     """The names of a file's includes, of this project and of libraries; standard headers have no directory."""
     text = path.read_text()
     found = re.findall(r"^#include <(\w+)/([\w/]+)\.\w+>", text, re.MULTILINE)
-    own = set(re.findall(r'^#include "(\w+)\.h"', text, re.MULTILINE))
+    own = set(re.findall(r'^#include "([\w-]+)\.h"', text, re.MULTILINE))
     return own | {name if library == "utils" else library for library, name in found}
 
 

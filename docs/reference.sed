@@ -5,6 +5,6 @@
 /friend struct detail::/s/.*//
 s/, detail::If\w+<([^<>]|<[^<>]*>)*> = 0>/>/
 s/, detail::IfIterator<It>>/>/
-s/, std::enable_if_t<.*, int> = 0>/>/
+s/, (std::enable_if_t<.*, int>|IfView<V>) = 0>/>/
 s/ : public detail::ReversePointer//
 s/detail::Operand<T>/Operand<T>/g

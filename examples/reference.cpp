@@ -164,7 +164,7 @@ void Vectors() {
   assert(v[4] == 3);
 
   // [replacing]
-  v.replace(0, 5, 1, 6); // five elements by one of value 6
+  v.replace(0, 5, 1, 6); // five elements with one of value 6
   // [replacing]
   assert(v[0] == 6);
 

@@ -12,7 +12,8 @@
 
 #include <utils/Std.h>
 
-// The linker replaces the static library's realloc by the wrapper; a shared library finds it in the program.
+// The linker replaces the static library's realloc with the wrapper; a shared library finds it in the
+// program.
 #ifdef MIREL_SHARED
 #define REAL_REALLOC __libc_realloc
 #define WRAPPED_REALLOC realloc

@@ -13,7 +13,10 @@
 #include <string_view>
 #include <type_traits>
 
+#include "Precondition.h"
+#include "xchar.h"
 #include "xstring.h"
+#include "xvector.h"
 
 namespace mirel {
 

@@ -57,9 +57,11 @@ template <class T, class N> constexpr bool HasBitsFor(N x) { // decided at compi
   }
 }
 
-/// The compiler's message about a constant that doesn't fit.
+// The compiler's message about a constant that doesn't fit.
+/// @cond
 #define MIREL_TOO_MANY_BITS                                                                                  \
   "this constant has more bits than the code unit that it is passed as: cast it if that is meant"
+/// @endcond
 
 #ifdef __clang__
 // With clang, MIREL_FITS refuses constants that don't fit, at any optimisation level.

@@ -33,7 +33,7 @@ struct MalformedText {
 /// What a conversion in pieces does with malformed text.
 enum class OnMalformed {
   kStop,   ///< Stops at the first malformed sequence and converts nothing from there on.
-  kReplace ///< Replaces each maximal subpart by U+FFFD.
+  kReplace ///< Replaces each maximal subpart with U+FFFD.
 };
 
 } // namespace mirel

@@ -8,7 +8,9 @@
 
 #include <type_traits>
 
+#include "NotOffered.h"
 #include "xstring.h"
+#include "xvector.h"
 
 namespace mirel {
 

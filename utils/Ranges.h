@@ -23,6 +23,7 @@
 #include <limits>
 #include <string> // has std::iterator_traits without the streams that <iterator> brings along
 #include <type_traits>
+#include <utility>
 #if __cplusplus >= 202002L
 #include <iterator>
 #endif
@@ -31,6 +32,8 @@
 #endif
 
 #include "Integers.h"
+#include "NotOffered.h"
+#include "Precondition.h"
 #include "VectorOfByte.h"
 
 namespace mirel {

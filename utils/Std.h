@@ -13,9 +13,13 @@
 #include <string_view>
 #include <type_traits>
 
+#include "Integers.h"
 #include "MovableString.h"
+#include "Precondition.h"
 #include "Storage.h"
+#include "VectorOfByte.h"
 #include "xstring.h"
+#include "xvector.h"
 
 namespace mirel {
 

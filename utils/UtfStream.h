@@ -15,6 +15,12 @@ namespace mirel {
 /// result is that of the whole text.
 /// @snippet examples/reference.cpp streams
 template <class CharOut, class CharIn> class MIREL_API UtfStream {
+  /// Matches what converts to a std::string_view, where the input is UTF-8.
+  template <class V>
+  using IfView = std::enable_if_t<sizeof(CharIn) == 1 && std::is_convertible_v<const V&, std::string_view> &&
+                                      !std::is_null_pointer_v<V>,
+                                  int>;
+
 public:
   /// Makes a stream at the beginning of a text.
   explicit UtfStream(OnMalformed onMalformed = OnMalformed::kStop) : m_onMalformed(onMalformed) {}
@@ -34,11 +40,7 @@ public:
   }
   /// Converts the next piece, the UTF-8 text of a view, a std::string or a literal, and appends the result to
   /// dst.
-  template <class V,
-            std::enable_if_t<sizeof(CharIn) == 1 && std::is_convertible_v<const V&, std::string_view> &&
-                                 !std::is_null_pointer_v<V>,
-                             int> = 0>
-  bool Append(basic_xstring<CharOut>& dst, const V& text) {
+  template <class V, IfView<V> = 0> bool Append(basic_xstring<CharOut>& dst, const V& text) {
     const std::string_view view = text;
     return Append(dst, view.data(), static_cast<ssize_t>(view.size()));
   }

@@ -6,6 +6,7 @@
 
 #pragma once
 
+#include <cstddef>
 #include <cstring>
 #include <initializer_list>
 #include <type_traits>

@@ -2,7 +2,8 @@
 /// xostream, the formatted text output stream.
 ///
 /// It formats as the standard library's streams do, in the classic locale, and keeps no byte back: when a
-/// member returns, the sink has what it wrote. It knows no containers: strings write themselves to it.
+/// member returns, the sink has what it wrote. Its interface names no containers: a string writes itself to
+/// it.
 
 #pragma once
 

@@ -9,7 +9,14 @@
 
 #include <cstddef>
 #include <cstring>
+#include <initializer_list>
+#include <type_traits>
 
+#include "Integers.h"
+#include "NotOffered.h"
+#include "Precondition.h"
+#include "Ranges.h"
+#include "xchar.h"
 #include "xvector.h"
 
 namespace mirel {
@@ -28,8 +35,10 @@ inline ssize_t GetStringLength(const char16* s) {
   return end - s;
 }
 
-/// Measures a null-terminated argument of a member. It is a macro so that the report names the member.
+// Measures a null-terminated argument of a member. It is a macro so that the report names the member.
+/// @cond
 #define MIREL_LENGTH(s) (MIREL_ASSERT_AS((s) != nullptr, "s != nullptr"), GetStringLength(s))
+/// @endcond
 
 /// A string: a vector of code units that also takes and returns null-terminated strings.
 ///
@@ -140,7 +149,7 @@ public:
     return *this;
   }
   using Base::replace;
-  /// Replaces n units from index i on by a null-terminated string.
+  /// Replaces n units from index i on with a null-terminated string.
   /// @pre "0 <= i && 0 <= n && i+n <= size()"
   basic_xstring<T>& replace(ssize_t i, ssize_t n, const T* p) {
     replace(i, n, p, MIREL_LENGTH(p));

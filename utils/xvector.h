@@ -10,12 +10,15 @@
 #include <cstring>
 #include <initializer_list>
 #include <limits>
+#include <type_traits>
 
 #include "Elements.h"
 #include "Integers.h"
 #include "NotOffered.h"
+#include "Precondition.h"
 #include "Ranges.h"
 #include "VectorOfByte.h"
+#include "xchar.h"
 
 namespace mirel {
 
@@ -402,45 +405,45 @@ public:
   /// @snippet examples/reference.cpp replacing
   /// @{
 
-  /// Replaces n elements from index i on by those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
+  /// Replaces n elements from index i on with those of r. @pre "0 <= i && 0 <= n && i+n <= size()"
   void replace(ssize_t i, ssize_t n, const xvector<T>& r) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     ReplaceRange(i, n, r.begin(), r.size());
   }
-  /// Replaces n elements from index i on by rn elements of r from index ri on.
+  /// Replaces n elements from index i on with rn elements of r from index ri on.
   /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= ri && 0 <= rn && ri+rn <= r.size()"
   void replace(ssize_t i, ssize_t n, const xvector<T>& r, ssize_t ri, ssize_t rn) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT_SUBRANGE(ri, rn, r.size());
     ReplaceRange(i, n, r.begin() + ri, rn);
   }
-  /// Replaces n elements from index i on by the pn elements at p.
+  /// Replaces n elements from index i on with the pn elements at p.
   /// @pre "0 <= i && 0 <= n && i+n <= size()", then "pn == 0 || (pn > 0 && p != nullptr)"
   void replace(ssize_t i, ssize_t n, const T* p, ssize_t pn) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     ReplaceRange(i, n, p, pn);
   }
-  /// Replaces n elements from index i on by count elements equal to x.
+  /// Replaces n elements from index i on with count elements equal to x.
   /// @pre "0 <= i && 0 <= n && i+n <= size()", then "0 <= count"
   void replace(ssize_t i, ssize_t n, ssize_t count, const T& x) {
     MIREL_ASSERT_SUBRANGE(i, n, size());
     MIREL_ASSERT(0 <= count);
     FillRange(i, n, count, x);
   }
-  /// Replaces the elements of [i1, i2) by those of r. @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
+  /// Replaces the elements of [i1, i2) with those of r. @pre "begin() <= i1 && i1 <= i2 && i2 <= end()"
   void replace(iterator i1, iterator i2, const xvector<T>& r) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
     ReplaceRange(i1 - begin(), i2 - i1, r.begin(), r.size());
   }
-  /// Replaces the elements of [i1, i2) by the pn elements at p.
+  /// Replaces the elements of [i1, i2) with the pn elements at p.
   /// @pre "begin() <= i1 && i1 <= i2 && i2 <= end()", then "pn == 0 || (pn > 0 && p != nullptr)"
   void replace(iterator i1, iterator i2, const T* p, ssize_t pn) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
     MIREL_ASSERT(pn == 0 || (pn > 0 && p != nullptr));
     ReplaceRange(i1 - begin(), i2 - i1, p, pn);
   }
-  /// Replaces the elements of [i1, i2) by count elements equal to x.
+  /// Replaces the elements of [i1, i2) with count elements equal to x.
   /// @pre "begin() <= i1 && i1 <= i2 && i2 <= end()", then "0 <= count"
   void replace(iterator i1, iterator i2, ssize_t count, const T& x) {
     MIREL_ASSERT(begin() <= i1 && i1 <= i2 && i2 <= end());
@@ -856,7 +859,6 @@ public:
   void replace(I, J, const X&, N...) = delete;
   template <class I, class J, class X, class... N, class Hint = detail::Instead<T, X, N...>>
   void compare(I, J, const X&, N...) const = delete;
-  /// @endcond
 
 protected:
   /// The most elements whose bytes an ssize_t can count.
@@ -878,6 +880,7 @@ protected:
     if (pn > 0) // memmove may not be given null pointers, even for no bytes
       std::memmove(begin() + oldSize, p, static_cast<std::size_t>(pn * S));
   }
+  /// @endcond
 
 private:
   /// The element size in bytes.
@@ -893,7 +896,7 @@ private:
   /// negative.
   static ssize_t Elements(ssize_t bytes) { return ssize_t(static_cast<std::size_t>(bytes) / sizeof(T)); }
   // Every insertion, assignment and replacement resizes a range of elements and overwrites it. The exceptions
-  // are push_back of one element, and Append() to a vector with room.
+  // are resize(), push_back() of one element, and Append() to a vector with room.
   T* ResizeRange(ssize_t i, ssize_t n, ssize_t newN);
   void ReplaceRange(ssize_t i, ssize_t n, const T* p, ssize_t pn);
   void FillRange(ssize_t i, ssize_t n, ssize_t count, T x);
@@ -1030,7 +1033,7 @@ template <class T> T* xvector<T>::ResizeRange(ssize_t i, ssize_t n, ssize_t newN
   return begin() + i;
 }
 
-/// Replaces the n elements at index i by the pn at p. The arguments have been checked.
+/// Replaces the n elements at index i with the pn at p. The arguments have been checked.
 template <class T> void xvector<T>::ReplaceRange(ssize_t i, ssize_t n, const T* p, ssize_t pn) {
   if (m_buffer.owns(p)) {
     xvector<T> copy;

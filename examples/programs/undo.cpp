@@ -17,7 +17,7 @@ class Buffer {
 public:
   const string16& Text() const { return m_text; }
 
-  /// Replaces n units from index i on by a text.
+  /// Replaces n units from index i on with a text.
   void Replace(ssize_t i, ssize_t n, const string16& by) {
     m_undone.clear();
     m_done.push_back(Exchange({i, by, n}));
@@ -37,7 +37,7 @@ public:
   bool Redo() { return Step(m_undone, m_done); }
 
 private:
-  /// Replaces n units from index i on by a text. Vectors of edits grow without copying text.
+  /// Replaces n units from index i on with a text. Vectors of edits grow without copying text.
   struct Edit {
     ssize_t i;
     mstring16 text;

@@ -1,5 +1,5 @@
 // Decodes JSON strings. Their escapes name UTF-16 code units, so the text is built in UTF-16: two surrogates
-// become a pair there by themselves, and the conversion to UTF-8 replaces an unpaired one by U+FFFD.
+// become a pair there by themselves, and the conversion to UTF-8 replaces an unpaired one with U+FFFD.
 
 #include <charconv>
 #include <iostream>

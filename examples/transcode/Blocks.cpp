@@ -150,7 +150,7 @@ void Blocks::DecodeUtf16(bool isEnd) {
 /// malformed and the stream doesn't replace it; always -1 in kCheck, which converts nothing
 template <class Stream, class CharOut, class CharIn>
 ssize_t Blocks::DecodeWhole(mirel::basic_xstring<CharOut>& dst, const CharIn* p, ssize_t n, bool isEnd) {
-  // A stream replaces by U+FFFD only, and drops nothing.
+  // A stream replaces with U+FFFD only, and drops nothing.
   const bool replaces = m_mode == Mode::kReplace && m_replacement == 0xFFFD;
   Stream stream(replaces ? mirel::OnMalformed::kReplace : mirel::OnMalformed::kStop);
   if (m_mode == Mode::kCheck || !stream.Append(dst, p, n))

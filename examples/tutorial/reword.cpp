@@ -1,4 +1,4 @@
-// Replaces one text by another in a file in any UTF.
+// Replaces one text with another in a file in any UTF.
 
 #include <cstdio>
 #include <cstdlib>

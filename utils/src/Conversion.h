@@ -1,4 +1,5 @@
-// What the conversions share: their common loop, and functions for malformed text.
+// What the conversions, checks and counts share: AppendUtf() is in Utf.cpp, FindMalformed(), ReasonOf() and
+// CutOffAtEnd() in Malformed.cpp, and Measure() in Lengths.cpp.
 
 #pragma once
 
@@ -7,6 +8,7 @@
 
 #include <utils/CodePoints.h>
 #include <utils/Malformed.h>
+#include <utils/xstring.h>
 
 #include "KernelTable.h"
 

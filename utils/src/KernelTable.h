@@ -6,7 +6,11 @@
 
 #pragma once
 
+#include <cstdint>
+#include <type_traits>
+
 #include <utils/VectorOfByte.h>
+#include <utils/xchar.h>
 
 namespace mirel::detail {
 
@@ -77,9 +81,9 @@ struct alignas(64) Shuffles {
 extern const Shuffles kKeepUnits;
 /// For 8 positions of two bytes: keeps the first byte of each, and the second of those whose bit is set.
 extern const Shuffles kKeepTwoBytes;
-/// For 4 positions of four bytes, of which the second is always dropped: keeps the first byte of each
-/// position, the last byte of those whose bit is set in the lower half of the mask, and the third byte of
-/// those whose bit is set in the upper half.
+/// For 4 positions of four bytes, of which the second byte is never kept: keeps the first byte of each
+/// position, its last byte if its bit in the lower half of the mask is set, and its third byte if its bit in
+/// the upper half is set.
 extern const Shuffles kKeepThreeBytes;
 /// For 8 bytes followed by the 3 bytes of U+FFFD: puts U+FFFD in place of the bytes whose bit is set. Rows of
 /// masks with more than four bits are cut off.

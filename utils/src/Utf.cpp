@@ -1,8 +1,7 @@
 // The conversions between UTF-8, UTF-16 and ASCII.
 //
 // Kernels convert blocks of text, straight into the destination's storage. What they leave, and all text on
-// processors without kernels, is converted one code point at a time: by the traits of Boost.Locale, and from
-// malformed text on, in lossy conversions, by utils/CodePoints.h.
+// processors without kernels, is converted one code point at a time by ScalarConversion.h.
 
 #include <utils/Storage.h>
 #include <utils/Utf.h>
@@ -11,17 +10,13 @@
 #include <cstring>
 #include <iterator>
 #include <limits>
-#include <type_traits>
-
-#include <boost/locale/utf.hpp>
 
 #include "Conversion.h"
+#include "ScalarConversion.h"
 
 namespace mirel {
 
 namespace {
-
-namespace utf = boost::locale::utf;
 
 constexpr ssize_t kMax = std::numeric_limits<ssize_t>::max();
 
@@ -45,33 +40,6 @@ namespace detail {
 
 namespace {
 
-/// Converts one code point at a time, and decides what is well-formed. Never inlined: otherwise 14 units that
-/// the kernels convert take 1.5 times as long.
-template <class CharOut, class CharIn>
-[[gnu::noinline]] Progress<CharIn> ConvertScalar(const CharIn* src, const CharIn* srcEnd, CharOut* out,
-                                                 const CharOut* outEnd) {
-  // As unsigned units: a signed byte from 80 on is negative. The comparison with 0x80 below would take it for
-  // ASCII, and the traits would convert it implicitly.
-  using Unsigned = std::make_unsigned_t<CharIn>;
-  using Encoding = utf::utf_traits<CharOut>;
-  const Unsigned* p = reinterpret_cast<const Unsigned*>(src);
-  const Unsigned* const end = reinterpret_cast<const Unsigned*>(srcEnd);
-  Stop stop = Stop::kEnd;
-  while (p != end) {
-    const Unsigned* next = p;
-    const utf::code_point c =
-        *p < 0x80 ? utf::code_point{*next++} : utf::utf_traits<Unsigned>::decode(next, end);
-    const bool isMalformed = c == utf::illegal || c == utf::incomplete;
-    if (isMalformed || outEnd - out < Encoding::width(c)) {
-      stop = isMalformed ? Stop::kMalformed : Stop::kNoRoom;
-      break;
-    }
-    out = Encoding::encode(c, out);
-    p = next;
-  }
-  return {reinterpret_cast<const CharIn*>(p), out, stop};
-}
-
 /// Converts from malformed text on, and replaces what is malformed, until the text seems to be well-formed:
 /// in blocks, or one code point at a time where there are no kernels or less than a block of text or room is
 /// left. If it reports Stop::kMalformed, the conversion goes on, whether malformed text follows or not.
@@ -81,18 +49,7 @@ Progress<CharIn> Replace(const UnitKernels<CharIn>* kernels, const CharIn* p, co
   if (kernels != nullptr)
     if (const auto blocks = kernels->replace(p, end, out, outEnd, replacements); blocks.p != p)
       return blocks;
-  for (const CharIn* malformed = p; p != end && p - malformed < kWellFormedBeforeKernels;) {
-    const Sequence sequence = Decode(p, end);
-    if (outEnd - out < EncodedLength<CharOut>(sequence.codePoint))
-      return {p, out, Stop::kNoRoom};
-    out = Encode(sequence.codePoint, out);
-    p += sequence.length;
-    if (!sequence.isWellFormed) {
-      ++replacements;
-      malformed = p;
-    }
-  }
-  return {p, out, p == end ? Stop::kEnd : Stop::kMalformed};
+  return ReplaceScalar(p, end, out, outEnd, replacements);
 }
 
 /// The most units of the result for one of the source, and the most of the source for one of the result.

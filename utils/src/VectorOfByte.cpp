@@ -1,10 +1,9 @@
 #include <utils/VectorOfByte.h>
 
 #include <cstdlib>
+#include <cstring>
 #include <limits>
 #include <new>
-
-#include <utils/Ranges.h>
 
 namespace mirel {
 
@@ -28,6 +27,12 @@ void FillBytes(uint8* dst, ssize_t n, uint8 x) {
   if (n != 0)
     std::memset(dst, x, static_cast<std::size_t>(n));
 }
+
+/// Asserts that [r1, r2) can be copied from. A macro, so that the report names the member.
+#define ASSERT_SOURCE(r1, r2)                                                                                \
+  (MIREL_ASSERT_AS((r1) <= (r2), "r1 <= r2"),                                                                \
+   MIREL_ASSERT_AS((r1) == (r2) || (r1) != nullptr,                                                          \
+                   "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)"))
 
 } // namespace
 
@@ -94,7 +99,7 @@ void VectorOfByte::resize(ssize_t n) {
 }
 
 void VectorOfByte::assign(const value_type* r1, const value_type* r2) {
-  MIREL_ASSERT_SOURCE(r1, r2);
+  ASSERT_SOURCE(r1, r2);
   if (owns(r1)) {
     VectorOfByte copy(r1, r2);
     return swap(copy);
@@ -120,7 +125,7 @@ void VectorOfByte::insertbytes(ssize_t i, ssize_t n) {
 
 void VectorOfByte::insert(ssize_t i, const value_type* r1, const value_type* r2) {
   MIREL_ASSERT(0 <= i && i <= size());
-  MIREL_ASSERT_SOURCE(r1, r2);
+  ASSERT_SOURCE(r1, r2);
   if (owns(r1)) {
     const VectorOfByte copy(r1, r2);
     return insert(i, copy.begin(), copy.end());
