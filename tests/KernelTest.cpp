@@ -1,4 +1,4 @@
-// Which kernels the library chooses. UtfTest.cpp, TextTest.cpp and VectorOfByteTest.cpp test each of them.
+// Which kernels the library chooses. UtfTest.cpp, TextTest.cpp and RangeAlgorithmsTest.cpp test each of them.
 #include "Support.h"
 
 #include <cstdio>

@@ -113,8 +113,9 @@ template <class CharOut, class CharIn> bool Convert(Text<CharOut>& out, const Te
   return Convert(out, View<CharIn>(source));
 }
 
-/// Calls f with each way to convert on this processor: a function like UtfToUtf(), and its name.
-template <class CharOut, class CharIn, class F> void ForEachWay(const F& f) {
+/// Calls f with each implementation of the conversion on this processor: a function like UtfToUtf(), and its
+/// name.
+template <class CharOut, class CharIn, class F> void ForEachConverter(const F& f) {
 #ifdef MIREL_SHARED // a shared library hides its kernels
   f(mirel::UtfToUtf<CharOut, CharIn>, "as chosen");
 #else
@@ -133,11 +134,12 @@ template <class CharOut, class CharIn, class F> void ForEachWay(const F& f) {
 #endif
 }
 
-/// Converts source in every way, into a destination that held text, and expects the oracle's result.
+/// Converts source by every implementation, into a destination that held text, and expects the oracle's
+/// result.
 template <class CharOut, class CharIn> void Check(View<CharIn> source) {
   static thread_local Text<CharOut> expected;
   const bool isWellFormed = Convert(expected, source);
-  ForEachWay<CharOut, CharIn>([&](const auto& convert, const char* name) {
+  ForEachConverter<CharOut, CharIn>([&](const auto& convert, const char* name) {
     basic_xstring<CharOut> dst(3, 'x'); // without room, so that the conversion makes it grow
     const CharIn* const src = source.data();
     const ssize_t srcLen = static_cast<ssize_t>(source.size());

@@ -109,7 +109,7 @@ TEST(Utf, StaysWithinItsRoom) {
 
 /// Expects that the destination keeps its capacity, or gets that of the result and its terminator.
 template <class CharOut, class CharIn> void CheckCapacity(const Text<CharIn>& text, bool isWellFormed) {
-  ForEachWay<CharOut, CharIn>([&](const auto& convert, const char* name) {
+  ForEachConverter<CharOut, CharIn>([&](const auto& convert, const char* name) {
     for (const ssize_t before : {0, 1, 30, 400, 2000}) {
       basic_xstring<CharOut> dst;
       dst.reserve(before);

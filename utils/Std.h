@@ -16,8 +16,8 @@
 #include "Integers.h"
 #include "MovableString.h"
 #include "Precondition.h"
+#include "RangeAlgorithms.h"
 #include "Storage.h"
-#include "VectorOfByte.h"
 #include "xstring.h"
 #include "xvector.h"
 

@@ -16,6 +16,7 @@
 #include "Integers.h"
 #include "NotOffered.h"
 #include "Precondition.h"
+#include "RangeAlgorithms.h"
 #include "Ranges.h"
 #include "VectorOfByte.h"
 #include "xchar.h"

@@ -9,7 +9,7 @@
 #include <cstdint>
 #include <type_traits>
 
-#include <utils/VectorOfByte.h>
+#include <utils/RangeAlgorithms.h>
 #include <utils/xchar.h>
 
 namespace mirel::detail {

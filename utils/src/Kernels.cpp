@@ -4,7 +4,7 @@
 #include "KernelTable.h"
 
 #include <utils/Kernels.h>
-#include <utils/VectorOfByte.h>
+#include <utils/RangeAlgorithms.h>
 
 // The kernels assume little-endian byte order.
 #if defined(MIREL_KERNELS) && __BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__

@@ -1,7 +1,9 @@
 // The scalar path of the searches for pointers to code units: for processors without kernels, and for the
 // needles and sets that a kernel leaves to it.
 
-#include <utils/VectorOfByte.h>
+#include <utils/RangeAlgorithms.h>
+
+#include <iterator>
 
 #include "KernelTable.h"
 
