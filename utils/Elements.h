@@ -16,8 +16,8 @@ namespace mirel {
 
 /// @name Element ranges
 /// A range is half open and given by two pointers; a source may have other iterators. An empty range may be a
-/// pair of null pointers. Overload resolution decides how a source is copied: `const T*` as one block,
-/// anything else in a loop.
+/// pair of null pointers. Overload resolution decides how p_copy() copies: from `const char8*` to `char8*`
+/// and from `const char16*` to `char16*` as one block, anything else in a loop.
 /// @snippet examples/reference.cpp element ranges
 /// @{
 

@@ -1,6 +1,6 @@
 /// @file
-/// Calls that vectors and strings don't have: deleted, with a return type, or the type of a parameter Hint,
-/// that names what to write instead.
+/// Calls that vectors and strings don't offer, declared as deleted. In the compiler's message, the return
+/// type or the type of a parameter Hint names what to write instead.
 ///
 /// The operators take their arguments by user-defined conversions, so overload resolution prefers whatever
 /// operator a program or another header declares for such arguments, those of utils/Std.h included. Deleted
@@ -84,8 +84,8 @@ template <class C> struct TextUnit<C*> { typedef std::remove_cv_t<C> type; };
 template <class U, class... C> constexpr bool kIsOneOf = (std::is_same_v<U, C> || ...);
 
 /// The hint for an argument of type X where text of T is expected. It is defined only for text of other
-/// units, for standard strings, and for reverse iterators, which would be taken for the pointers that they
-/// convert to.
+/// units, for standard strings and string views, and for reverse iterators, which would be taken for the
+/// pointers that they convert to.
 template <class T, class X, class U = typename TextUnit<std::decay_t<X>>::type, class = void>
 struct InPlaceOf {};
 template <class T, class X>

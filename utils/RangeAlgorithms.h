@@ -36,8 +36,8 @@ template <class It1, class It2> int LexicographicalCompareX(It1 x1, It1 x2, It2 
   return y1 == y2 ? 0 : -1;
 }
 
-/// Orders two ranges of bytes. A difference within the common length yields the value of memcmp, of any size;
-/// otherwise the lengths decide: -1, 0 or 1.
+/// Orders two ranges of bytes. If they differ within the common length, returns memcmp's value, which needn't
+/// be -1 or 1; otherwise the lengths decide: -1, 0 or 1.
 inline int LexicographicalCompareX(const unsigned char* x1, const unsigned char* x2, const unsigned char* y1,
                                    const unsigned char* y2) {
   const ssize_t lenX = x2 - x1;
@@ -79,8 +79,9 @@ template <class It1, class It2> bool IsPrefix(It1 x1, It1 x2, It2 y1, It2 y2) {
 /// worst the cost is linear in the haystack for one element, and in the product of both lengths for a needle
 /// or a set. It is linear in the sum of the lengths for needles if both ranges have random-access iterators
 /// over integers, and for all searches if every pointer is a `const char8*` or every one a `const char16*`.
-/// Such pointers select overloads of the same names and results, which use SIMD instructions if the processor
-/// has them; a pointer to units that aren't const doesn't.
+/// Such pointers, with a v of the same unit type, select overloads of the same names and results, which use
+/// SIMD instructions if the processor has them. A pointer to units that aren't const, or a v of another type,
+/// selects the template.
 /// @snippet examples/reference.cpp searching ranges
 /// @{
 
@@ -94,7 +95,7 @@ template <class It, class T> It Find(It i1, It i2, const T& v) {
 /// Finds the start of the first occurrence of [y1, y2) in [x1, x2); returns x2 if there is none. An empty
 /// needle is found at x1.
 template <class It1, class It2> It1 FindFirstSubSequence(It1 x1, It1 x2, It2 y1, It2 y2) {
-  if constexpr (detail::kAreIntegers<It1, It2>) {
+  if constexpr (detail::kAreOverIntegers<It1, It2>) {
     return detail::FindNeedle(x1, x2, y1, y2);
   } else {
     while (x1 != x2 && !IsPrefix(x1, x2, y1, y2))
@@ -128,7 +129,7 @@ template <class It, class T> It FindLast(It i1, It i2, const T& v) {
 /// Finds the start of the last occurrence of [y1, y2) in [x1, x2); returns x2 if there is none. An empty
 /// needle is found at x2.
 template <class It1, class It2> It1 FindLastSubSequence(It1 x1, It1 x2, It2 y1, It2 y2) {
-  if constexpr (detail::kAreIntegers<It1, It2>) {
+  if constexpr (detail::kAreOverIntegers<It1, It2>) {
     return detail::FindLastNeedle(x1, x2, y1, y2);
   } else {
     It1 p = x2;
@@ -174,9 +175,10 @@ template <class T> struct SearchKernels {
   ssize_t (*findDifference)(P x, P y, ssize_t n);
 };
 
-/// Returns the best kernels of this processor for such units, or the scalar path. The result never changes,
+/// Returns this processor's best kernels for 8-bit code units, or the scalar path. The result never changes,
 /// so a loop needs to ask only once.
 [[gnu::const]] MIREL_API const SearchKernels<char8>& BestSearches(const char8*);
+/// Returns this processor's best kernels for 16-bit code units, or the scalar path. The result never changes.
 [[gnu::const]] MIREL_API const SearchKernels<char16>& BestSearches(const char16*);
 
 /// Returns whether a range is so short that the loops in this file are faster than a call of a kernel.

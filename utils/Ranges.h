@@ -86,8 +86,8 @@ template <class It>
 constexpr bool kIsVolatile =
     std::is_volatile_v<std::remove_reference_t<typename std::iterator_traits<It>::reference>>;
 
-/// Returns whether It is a contiguous iterator over units as wide as T. kIsContiguous isn't instantiated for
-/// other elements, since it would instantiate the standard containers of those.
+/// Returns whether It is a contiguous iterator over non-volatile units as wide as T. kIsContiguous isn't
+/// instantiated for other elements, since it would instantiate the standard containers of those.
 template <class T, class It> constexpr bool StandsForPointer() { // decided at compile time
   if constexpr (!kIsUnit<T, ValueType<It>> || kIsVolatile<It>)
     return false;

@@ -142,14 +142,15 @@ template <class It1, class It2> It1 FindLastNeedle(It1 x1, It1 x2, It2 y1, It2 y
   return found == end && y1 != y2 ? x2 : found.base() - (y2 - y1);
 }
 
-template <class It, class = void> inline constexpr bool kIsIntegers = false;
+template <class It, class = void> inline constexpr bool kIsOverIntegers = false;
 template <class It>
-inline constexpr bool kIsIntegers<It, std::void_t<typename std::iterator_traits<It>::iterator_category>> =
+inline constexpr bool kIsOverIntegers<It, std::void_t<typename std::iterator_traits<It>::iterator_category>> =
     std::is_integral_v<typename std::iterator_traits<It>::value_type>&& std::is_base_of_v<
         std::random_access_iterator_tag, typename std::iterator_traits<It>::iterator_category>;
 
 /// Whether both are random-access iterators over integers.
-template <class It1, class It2> inline constexpr bool kAreIntegers = kIsIntegers<It1>&& kIsIntegers<It2>;
+template <class It1, class It2>
+inline constexpr bool kAreOverIntegers = kIsOverIntegers<It1>&& kIsOverIntegers<It2>;
 
 } // namespace detail
 

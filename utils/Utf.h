@@ -144,7 +144,7 @@ inline bool Utf8FromUtf16(string8& dst, const xvector<char16>& text) {
   return Utf8FromUtf16(dst, text.data(), text.size());
 }
 /// Converts a view's text, or a literal, from UTF-16 to UTF-8. The text is copied to the stack a block at a
-/// time, since char16_t is another type than char16.
+/// time, since char16_t is a different type from char16.
 MIREL_API bool Utf8FromUtf16(string8& dst, std::u16string_view text);
 
 /// @}

@@ -266,8 +266,8 @@ public:
 
   /// @}
 
-  // Overloads for integers of any type, which match an integer exactly and call the declared overload of
-  // their name; then deleted overloads.
+  // Overloads for integers of any type, which match an integer exactly and call the documented overload of
+  // the same name; then deleted overloads.
   /// @cond
 
   template <class N, class X, detail::IfIntegers<N, X> = 0>

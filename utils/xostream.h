@@ -35,8 +35,9 @@ using IfOneOf = std::enable_if_t<(std::is_same_v<std::remove_cv_t<C>, Types> || 
 /// after "@pre", before anything is written. One thread at a time may use a stream.
 ///
 /// @par Calls of the sink
-/// Text that needs neither indent nor padding reaches the sink in one call, other text in one call for each
-/// 512 bytes or for each longer line.
+/// Text that needs neither indent nor padding reaches the sink in one call. Other text is gathered, with its
+/// spaces, into calls of up to 512 bytes; a line of 512 bytes or more, or a whole text of that size while
+/// there is no indent, has a call of its own.
 /// @par A sink that throws
 /// Its exception ends the member that was called, and goes to the caller. The bytes of the throwing call
 /// count as not written, and the rest of what the member writes is dropped. The next member calls the sink
@@ -68,7 +69,7 @@ public:
 
   /// Writes the pn bytes at p to the sink before it returns. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void write(const xchar* p, ssize_t pn);
-  /// Writes the pn bytes at p to the sink, as write(). @pre "pn == 0 || (pn > 0 && p != nullptr)"
+  /// Writes the pn bytes at p to the sink, as write() does. @pre "pn == 0 || (pn > 0 && p != nullptr)"
   void writebytes(const uint8* p, ssize_t pn);
 
   /// @}

@@ -48,7 +48,7 @@ inline ssize_t GetStringLength(const char16* s) {
 ///
 /// A null-terminated argument (`const T*` without a count) ends before its first null. It is measured once,
 /// before anything else is checked or changed, and then treated as a pointer and a count. A literal null
-/// pointer doesn't compile as one.
+/// pointer in its place doesn't compile.
 /// @pre "s != nullptr" of every null-terminated argument
 ///
 /// Two integers in braces that initialise a string are a count and a unit: string8{3, 'x'} has three units.
@@ -231,7 +231,7 @@ public:
   basic_xstring(P r, N rn) : Base(static_cast<const T*>(r), detail::Count(rn)) {}
   template <class N, class X, detail::IfIntegers<N, X> = 0>
   explicit basic_xstring(N count, X x) MIREL_FITS(T, x) : Base(detail::Count(count), detail::Unit<T>(x)) {}
-  /// Takes `s = {}`, which would otherwise assign a null pointer.
+  /// Takes `s = {}`, which is ambiguous without this overload: {} also initialises a null pointer.
   basic_xstring<T>& operator=(std::initializer_list<detail::NoUnit>) {
     this->clear();
     return *this;
@@ -284,9 +284,9 @@ extern template class basic_xstring<char16>;
 /// null. What is well-formed is defined by the Unicode Standard: table 3-7 for UTF-8, definition D91 for
 /// UTF-16. A failed allocation throws std::bad_alloc; a UTF conversion then leaves the beginning of the
 /// result in the destination; the conversion from ASCII leaves the destination as it was. On return the
-/// destination has its old capacity, or room for the result and the terminator of c_str() if that is more.
-/// The source may not lie in the destination. A null pointer with a count of 0 is an empty source; src
-/// isn't checked otherwise.
+/// destination has its old capacity, or room for the result and the terminator of c_str() if that is more; an
+/// empty source adds no capacity. The source may not lie in the destination. A null pointer with a count of 0
+/// is an empty source; src isn't checked otherwise.
 /// @snippet examples/reference.cpp conversions
 /// @{
 

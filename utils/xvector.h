@@ -32,8 +32,9 @@ namespace mirel {
 /// of a substring. Indices and counts are in elements, and signed. An integer of any type may stand for an
 /// index, a count or an element: a literal 0 is one of these, never a pointer. utils/Ranges.h says which
 /// iterators a range may have, and how its elements are read; a single element is read as its unsigned value
-/// too. Clang refuses a constant that doesn't fit. So does g++ if it optimises, but it only warns of one that
-/// is searched for, and may take a variable for a constant if it knows the value.
+/// too, and truncated if it doesn't fit, even in a search. Clang refuses a constant that doesn't fit. So does
+/// g++ if it optimises, but it only warns of one that is searched for, and may take a variable for a
+/// constant if it knows the value.
 ///
 /// @par Bad arguments
 /// They stop the process with the text given after "@pre", before anything has changed. They are never
@@ -566,9 +567,9 @@ public:
   /// @pre "pn == 0 || (pn > 0 && p != nullptr)"
   /// @pre "r1 <= r2"
   ///
-  /// Nothing is allocated. At worst the cost is linear in the searched length for one element; in the sum of
-  /// both lengths for needles and sets that are contiguous units of the vector's width, and for needles of
-  /// any integers with random-access iterators; otherwise in the product of both lengths.
+  /// A search allocates nothing. At worst its cost is linear in the searched length for one element; in the
+  /// sum of both lengths for needles and sets that are contiguous units of the vector's width, and for
+  /// needles of any integers with random-access iterators; otherwise in the product of both lengths.
   /// @snippet examples/reference.cpp search
   /// @{
 
@@ -722,8 +723,8 @@ public:
   /// @}
 
   // Overloads for integers of any type, then deleted overloads. An integer matches the former exactly, so
-  // that a literal 0 is an index, a count or an element, never a null pointer. Each calls the declared
-  // overload of its name, and converts elements by their unsigned value.
+  // that a literal 0 is an index, a count or an element, never a null pointer. Each calls the documented
+  // overload of the same name, and converts elements by their unsigned value.
   /// @cond
 
   template <class P, class N, detail::IfPointerAndCount<P, const T*, N> = 0>

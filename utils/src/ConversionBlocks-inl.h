@@ -75,15 +75,15 @@ template <class D> HWY_INLINE hn::Mask<D> IsEqual(D d, hn::Vec<D> v, uint8_t x) 
 template <class D> HWY_INLINE hn::Mask<D> IsAtLeast(D d, hn::Vec<D> v, uint8_t x) {
   return hn::Eq(hn::Max(v, Broadcast(d, x)), v);
 }
-/// Which bytes are in [80, x), in hexadecimal; 0 stands for 100.
+/// Returns which bytes are in [80, x), in hexadecimal; 0 stands for 100.
 template <class D> HWY_INLINE hn::Mask<D> IsFrom80Below(D d, hn::Vec<D> v, uint8_t x) {
   const hn::RebindToSigned<D> di;
   return hn::RebindMask(d, hn::Lt(hn::BitCast(di, v), hn::BitCast(di, Broadcast(d, x))));
 }
 template <class D> HWY_INLINE hn::Mask<D> IsNonAscii(D d, hn::Vec<D> v) { return IsFrom80Below(d, v, 0); }
 
-/// Returns yes where the mask is set, no elsewhere. If plain char is unsigned, g++ 12 miscompiles a blend of
-/// bytes: it compares the mask with 0 as char, and never blends.
+/// Returns `yes` where the mask is set, `no` elsewhere. If plain char is unsigned, g++ 12 miscompiles a blend
+/// of bytes: it compares the mask with 0 as char, and never blends.
 template <class M, class V> HWY_INLINE V Select(M mask, V yes, V no) {
 #if defined(__CHAR_UNSIGNED__) && HWY_ARCH_X86
   return hn::Or(hn::IfThenElseZero(mask, yes), hn::IfThenZeroElse(mask, no));
@@ -133,7 +133,7 @@ template <class Unit> HWY_INLINE hn::Vec<Narrow> LoadPart(const Unit* from, ssiz
   uint64_t low = 0, high = 0;
   if (n >= 8) {
     low = LoadWord<uint64_t>(p);
-    // Two shifts, by 64 bits in all if n is 8.
+    // Two shifts, since a single one by 64 bits, if n is 8, would be undefined.
     high = LoadWord<uint64_t>(p + n - 8) >> 4 * (16 - n) >> 4 * (16 - n);
   } else if (n >= 4) {
     low = LoadWord<uint32_t>(p) | LoadWord<uint32_t>(p + n - 4) << 8 * (n - 4);
@@ -143,8 +143,8 @@ template <class Unit> HWY_INLINE hn::Vec<Narrow> LoadPart(const Unit* from, ssiz
   return hn::BitCast(Narrow(), hn::InterleaveLower(hn::Set(d, low), hn::Set(d, high)));
 }
 
-/// Stores what the shuffle for a mask keeps of 16 bytes: kLeast of them, and kEach for each of the mask's
-/// bits. All 16 bytes at out are written. The mask is in bits 4 to 11 of mask16, where it is the offset of
+/// Stores what the shuffle for a mask keeps of 16 bytes: kLeast of them, and kEach for each bit set in the
+/// mask. All 16 bytes at out are written. The mask is in bits 4 to 11 of mask16, where it is the offset of
 /// its row. Returns the end of what is kept.
 template <int kLeast, int kEach>
 HWY_INLINE uint8_t* StoreKept(hn::Vec<Narrow> v, const Shuffles& shuffles, uint64_t mask16, uint8_t* out) {

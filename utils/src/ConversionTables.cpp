@@ -27,7 +27,7 @@ struct PairFault {
   int first, firstLast, second, secondLast, bit;
 };
 /// From table 3-7 of the Unicode Standard. Two faults share a bit only if they differ in a single nibble:
-/// otherwise nibbles of the one could combine with nibbles of the other to pairs that aren't faults.
+/// otherwise nibbles of one and nibbles of the other could form pairs that aren't faults.
 constexpr PairFault kFaults[] = {
     {0xC0, 0xFF, 0x00, 0x7F, 0}, {0xC0, 0xFF, 0xC0, 0xFF, 0}, // a continuation byte is missing
     {0x00, 0x7F, 0x80, 0xBF, 1},                              // an unexpected continuation byte

@@ -86,7 +86,7 @@ extern const Shuffles kKeepTwoBytes;
 /// the upper half is set.
 extern const Shuffles kKeepThreeBytes;
 /// For 8 bytes followed by the 3 bytes of U+FFFD: puts U+FFFD in place of the bytes whose bit is set. Rows of
-/// masks with more than four bits are cut off.
+/// masks with more than four bits set are cut off.
 extern const Shuffles kReplaceUnits;
 
 /// What can be wrong with two adjacent bytes, a bit for each kind of fault. Two bytes have a fault if both

@@ -47,7 +47,7 @@ template <class Tag> struct Utf16Block {
 
   /// Returns bytes whose highest bit tells that the unit isn't ASCII.
   HWY_INLINE hn::Vec<D> NonAscii() const { return hn::Or(hn::SaturatedAdd(high, Broadcast(d, 0x7F)), low); }
-  /// Returns whether the block is ASCII, from the units as loaded: ASCII then needs no high bytes.
+  /// Returns whether the block is ASCII. It tests the units as loaded, so ASCII text never needs `high`.
   HWY_INLINE bool IsAscii() const {
     const ToUnits<D> du;
     return hn::AllTrue(du, hn::Eq(hn::And(hn::BitCast(du, any), hn::Set(du, 0xFF80)), hn::Zero(du)));
@@ -57,12 +57,12 @@ template <class Tag> struct Utf16Block {
   HWY_INLINE hn::Mask<D> Is(uint8_t kind, uint8_t mask) const {
     return IsEqual(d, hn::And(high, Broadcast(d, mask)), kind);
   }
-  /// Returns the bits of each unit from the sixth on, masked by kept.
+  /// Returns bits 6 to 13 of each unit, masked by kept, which includes the lowest two bits.
   HWY_INLINE hn::Vec<D> UpperBits(uint8_t kept) const {
     return hn::Or(Left<2>(d, high, kept & 0xFC), Right<6>(d, low, 0x03));
   }
 
-  /// Stores a block without units from 800 on. Returns the end of its bytes.
+  /// Stores a block without units from 0x800 on. Returns the end of its bytes.
   HWY_INLINE uint8_t* StoreTwo(uint64_t two, uint8_t* out) const {
     const auto lead = hn::Or(UpperBits(0x1F), Broadcast(d, 0xC0));
     const auto first = Select(IsNonAscii(d, NonAscii()), lead, low);
@@ -80,7 +80,7 @@ template <class Tag> struct Utf16Block {
       // A high surrogate gives the first three bytes, the third with bits of the low surrogate. The low
       // surrogate gives the last byte.
       const auto isHigh = Is(0xD8, 0xFC), isLow = Is(0xDC, 0xFC);
-      const auto upper = hn::Add(UpperBits(0x0F), Broadcast(d, 1)); // the bits from the 16th on
+      const auto upper = hn::Add(UpperBits(0x0F), Broadcast(d, 1)); // bits 16 to 20 of the code point
       const auto lead4 = hn::Or(Right<2>(d, upper, 0x07), Broadcast(d, 0xF0));
       first = Select(isLow, last, Select(isHigh, lead4, first));
       const auto second = hn::Or(Left<4>(d, upper, 0x30), Right<2>(d, low, 0x0F));

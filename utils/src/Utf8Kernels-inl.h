@@ -41,7 +41,7 @@ HWY_INLINE Planes<D> UnitsOf(D d, hn::Vec<D> a, hn::Vec<D> b, hn::Vec<D> c) {
     high = hn::Or(high, hn::IfThenZeroElse(isTwo, Left<4>(d, a, 0xF0)));
   if constexpr (kMaxBytes > 3) {
     high = Select(isContinuation, hn::Or(hn::And(high, Broadcast(d, 0x03)), Broadcast(d, 0xDC)), high);
-    // The bits from the 16th on, less 1, as the high surrogate has them.
+    // Bits 16 to 20 of the code point, less 1, as the high surrogate has them.
     const auto upper = hn::Sub(hn::Or(Left<2>(d, a, 0x1C), Right<4>(d, b, 0x03)), Broadcast(d, 1));
     const auto lower = hn::Or(Left<2>(d, b, 0x3C), Right<4>(d, c, 0x03));
     const auto isFour = IsAtLeast(d, a, 0xF0);
@@ -60,7 +60,7 @@ template <class D> HWY_INLINE void StoreWidened(D d, hn::Vec<D> bytes, uint8_t* 
 }
 
 /// Returns how many bytes before end begin a sequence that end cuts off; at least three bytes precede end.
-/// They alone tell where the next block begins, long before the masks do.
+/// It reads only those three, so it tells where the next block begins long before the masks do.
 HWY_INLINE ssize_t CutOff(const uint8_t* end) {
   const uint32_t isLead =
       uint32_t{end[-1] >= 0xC0} | uint32_t{end[-2] >= 0xE0} << 1 | uint32_t{end[-3] >= 0xF0} << 2;
@@ -108,8 +108,8 @@ template <int kVectors, class D> struct Utf8Block {
 
   HWY_INLINE bool IsAscii() const { return BitsAt<0>() == 0; }
 
-  /// Returns the positions of lead bytes that the next byte may not follow: the sequence would be overlong, a
-  /// surrogate, or above U+10FFFF.
+  /// Returns the positions of lead bytes that the next byte, if it is a continuation byte, may not follow:
+  /// the sequence would be overlong, a surrogate, or above U+10FFFF.
   template <bool kHasFourBytes> HWY_INLINE uint64_t BadLeads() const {
     return Bits([](auto lead, auto next) HWY_ATTR {
       const D d;
@@ -208,8 +208,8 @@ template <int kVectors, class D> struct Utf8Block {
   HWY_INLINE Replaced Replace(uint8_t* out) const {
     const uint64_t allNonAscii = BitsAt<0>();
     const uint64_t allContinuations = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC0); });
-    // The last byte may begin a sequence if it is in [C2, F5). Where it can't, the next block's place is
-    // known without waiting for CutOff(), which takes twice as long as all else here.
+    // The last byte may begin a sequence if it is in [C2, F5). If it can't, the next block's place is
+    // known without CutOff(); waiting for that takes twice as long as all else here.
     if (allContinuations == 0 && static_cast<uint8_t>(p[kUnits - 1] - 0xC2) >= 0xF5 - 0xC2) {
       StoreLoneBytes(out);
       return {{kUnits, kUnits}, Count(allNonAscii)};

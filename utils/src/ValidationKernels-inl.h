@@ -52,8 +52,7 @@ template <bool kIsCounted> struct Utf8Scan {
   ssize_t continuations, fourBytes;
   bool followsAscii;
 
-  // Not a constructor: g++ compiles the constructors that it generates for the library's own target, not for
-  // the kernels'.
+  // Not a constructor: g++ compiles implicit constructors for the library's own target, not for the kernels'.
   static HWY_INLINE Utf8Scan Begin() { return {hn::Zero(D()), 0, 0, true}; }
 
   /// Returns whether the text stays well-formed through the block at p, except for a sequence that the
@@ -114,7 +113,8 @@ template <bool kIsCounted, class D> struct Utf16Scan {
   using Block = Utf16Block<D>;
   static constexpr ssize_t kUnits = Block::kUnits;
 
-  /// How many bytes fewer than three the units take: one for each unit below 800, another for each below 80.
+  /// How many bytes fewer than three the units take: one for each unit below 0x800, another for each
+  /// below 0x80.
   hn::Vec<hn::Repartition<uint64_t, D>> lacking;
   ssize_t surrogates, zeros;
   uint64_t isCutOff; ///< 1 if the block before ends with a high surrogate
@@ -154,7 +154,7 @@ template <bool kIsCounted, class D> struct Utf16Scan {
 };
 
 /// Scans UTF-16 in blocks as far as it is well-formed. Where it stops, a sequence begins. The last block ends
-/// with the text, so the text must have as many units as a block.
+/// with the text, so the text must have at least as many units as a block.
 template <bool kIsCounted, class D>
 HWY_INLINE Measured<char16> ScanUtf16(const char16* const begin, const char16* end) {
   auto scan = Utf16Scan<kIsCounted, D>::Begin();
