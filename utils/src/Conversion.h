@@ -6,8 +6,8 @@
 #include <cstdint>
 #include <cstring>
 
-#include <utils/CodePoints.h>
 #include <utils/Malformed.h>
+#include <utils/Sequences.h>
 #include <utils/xstring.h>
 
 #include "KernelTable.h"
@@ -43,8 +43,8 @@ MalformedReason ReasonOf(const char16* p, const char16* end, const Sequence& seq
 ssize_t CutOffAtEnd(const char8* begin, const char8* end);
 ssize_t CutOffAtEnd(const char16* begin, const char16* end);
 
-/// Skips whole groups of eight ASCII bytes at the beginning of a text that the kernels don't take: that
-/// checks 14 bytes in half the time of a loop over single bytes.
+/// Skips whole groups of eight ASCII bytes at the beginning of a text that the kernels don't take. SWAR (SIMD
+/// within a register) checks 14 bytes in half the time of a loop over single bytes.
 inline const char8* SkipAscii(const char8* p, const char8* end) {
   for (uint64_t word = 0; end - p >= ssize_t(sizeof(word)); p += sizeof(word)) {
     std::memcpy(&word, p, sizeof(word));
@@ -55,14 +55,5 @@ inline const char8* SkipAscii(const char8* p, const char8* end) {
 }
 /// Skips nothing; it lets the templates call SkipAscii() for both widths.
 inline const char16* SkipAscii(const char16* p, const char16*) { return p; }
-
-/// The fewest units for which a kernel that checks or counts pays: a shorter text is decoded one code point
-/// at a time in the time that a kernel takes to copy it into a block. It can't be below 16: the kernels for
-/// UTF-16 read a whole block that ends with the text. Conversions have no such limit.
-constexpr ssize_t kLeastForKernels = 24;
-
-/// Once the scalar path decodes malformed text, it goes on until this many units in a row are well-formed:
-/// where malformed sequences are dense, the kernels would be tried in vain.
-constexpr ssize_t kWellFormedBeforeKernels = 64;
 
 } // namespace mirel::detail

@@ -44,7 +44,7 @@ template <class T> struct Measured {
 
 /// What one instruction set offers for text of one width. The conversions read nothing outside [p, end) and
 /// write nothing outside [out, outEnd), but may write more of it than they report. skip() and measure() take
-/// no text of fewer than kLeastForKernels units (Conversion.h): for UTF-16 they read a whole block that ends
+/// no text of fewer than kLeastForKernels units: for UTF-16 they read a whole block that ends
 /// with the text.
 template <class T> struct UnitKernels {
   using Out = OtherUnit<T>;
@@ -68,6 +68,15 @@ struct Kernels : UnitKernels<char8>, UnitKernels<char16> {
   /// these are; fewer than 16 are left.
   ssize_t (*utf16FromAscii)(const char8* src, ssize_t n, char16* out);
 };
+
+/// The fewest units for which a kernel that checks or counts pays: a shorter text is decoded one code point
+/// at a time in the time that a kernel takes to copy it into a block. It can't be below 16: the kernels for
+/// UTF-16 read a whole block that ends with the text. Conversions have no such limit.
+constexpr ssize_t kLeastForKernels = 24;
+
+/// Once the scalar path decodes malformed text, it goes on until this many units in a row are well-formed:
+/// where malformed sequences are dense, the kernels would be tried in vain.
+constexpr ssize_t kWellFormedBeforeKernels = 64;
 
 // The tables of the conversions, once for all instruction sets. They are defined in a file of their own, so
 // that g++ doesn't see their values: it builds a vector of known value anew at each use, with three

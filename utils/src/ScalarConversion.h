@@ -2,7 +2,7 @@
 // the kernels leave.
 //
 // Well-formed text is decoded by the traits of Boost.Locale. From malformed text on, a lossy conversion
-// decodes by utils/CodePoints.h, which knows maximal subparts. One decoder for both took 1.25 to 1.45 times
+// decodes by utils/Sequences.h, which knows maximal subparts. One decoder for both took 1.25 to 1.45 times
 // as long.
 
 #pragma once
@@ -11,9 +11,8 @@
 
 #include <boost/locale/utf.hpp>
 
-#include <utils/CodePoints.h>
+#include <utils/Sequences.h>
 
-#include "Conversion.h"
 #include "KernelTable.h"
 
 namespace mirel::detail {
