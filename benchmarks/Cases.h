@@ -20,15 +20,15 @@ using mirel::char16;
 using mirel::char8;
 using mirel::ssize_t;
 
-/// The work of one party in a case: once, for its result, and in the timed loop.
-struct Party {
+/// The work of one contender in a case: once, for its result, and in the timed loop.
+struct Contender {
   std::function<long long()> once;
   std::function<void(benchmark::State&)> loop;
 };
 
-/// Makes a party of its work, which returns what can be compared with the other parties: an index, a size or
-/// a checksum.
-template <class Work> Party Of(Work work) {
+/// Makes a contender of its work, which returns what can be compared with the other contenders: an index, a
+/// size or a checksum.
+template <class Work> Contender Of(Work work) {
   return {[work] { return static_cast<long long>(work()); },
           [work](benchmark::State& state) {
             for (auto _ : state) {
@@ -40,8 +40,8 @@ template <class Work> Party Of(Work work) {
           }};
 }
 
-/// Makes a party that does its work with each of the texts, which live as long as the program.
-template <class Text, class Work> Party Over(const std::vector<Text>& texts, Work work) {
+/// Makes a contender that does its work with each of the texts, which live as long as the program.
+template <class Text, class Work> Contender Over(const std::vector<Text>& texts, Work work) {
   return Of([&texts, work] {
     long long sum = 0;
     for (const Text& text : texts)
@@ -50,19 +50,19 @@ template <class Text, class Work> Party Over(const std::vector<Text>& texts, Wor
   });
 }
 
-/// One benchmark and its parties. Their results must agree, since only equal work can be compared.
+/// One benchmark and its contenders. Their results must agree, since only equal work can be compared.
 class Case {
 public:
-  Case(const std::string& area, const std::string& work, const std::string& data, std::size_t size,
+  Case(const std::string& area, const std::string& operation, const std::string& data, std::size_t size,
        const std::string& unit)
-      : m_name(area + ";" + work + ";" + data + ";" + std::to_string(size) + ";" + unit),
+      : m_name(area + ";" + operation + ";" + data + ";" + std::to_string(size) + ";" + unit),
         m_isLong(size >= std::size_t(1) << 19) {}
 
-  Case& Against(const std::string& who, const Party& party) {
+  Case& Against(const std::string& who, const Contender& contender) {
     const std::string name = m_name + ";" + who;
-    auto run = [name, party, expected = m_expected, checked = false](benchmark::State& state) mutable {
+    auto run = [name, contender, expected = m_expected, checked = false](benchmark::State& state) mutable {
       if (!checked) {
-        const long long result = party.once();
+        const long long result = contender.once();
         if (expected->value_or(result) != result) {
           std::fprintf(stderr, "%s: %lld, others %lld\n", name.c_str(), result, **expected);
           std::exit(1);
@@ -70,7 +70,7 @@ public:
         *expected = result;
         checked = true;
       }
-      party.loop(state);
+      contender.loop(state);
     };
     auto* const registered = benchmark::RegisterBenchmark(name.c_str(), run);
     if (m_isLong)

@@ -1,5 +1,5 @@
-// Conversions between UTF-8 and UTF-16. Each party converts into the type in which its users hold text, and
-// reuses storage if it can, except in the cases with a fresh string.
+// Conversions between UTF-8 and UTF-16. Each contender converts into the type in which its users hold text,
+// and reuses storage if it can, except in the cases with a fresh string.
 #include "Library.h"
 #include "Simdutf.h"
 #include "Texts.h"
@@ -20,7 +20,7 @@ namespace {
 
 constexpr std::size_t kMaxUnits = std::size_t(4) << 20;
 
-/// A buffer that is large enough for every conversion, for the parties that write into raw buffers.
+/// A buffer that is large enough for every conversion, for the contenders that write into raw buffers.
 char* Buffer8() {
   static auto& buffer = *new std::vector<char>(3 * kMaxUnits + 64);
   return buffer.data();
@@ -62,8 +62,8 @@ void RegisterToUtf16(const Language& language, std::size_t size) {
   Case to("Conversions", "UTF-8 to UTF-16", language.name, size, "bytes");
   AddLibrary(to, size <= 64, [&](const Library& library) { return library.toUtf16(texts, false); });
 #ifdef HAVE_SIMDUTF
-  for (const SimdutfParty& party : Simdutf())
-    to.Against(party.first, Over(texts, [kernels = party.second](const std::string& text) {
+  for (const SimdutfContender& contender : Simdutf())
+    to.Against(contender.first, Over(texts, [kernels = contender.second](const std::string& text) {
                  return kernels->convert_utf8_to_utf16le(text.data(), text.size(), Buffer16());
                }));
 #endif
@@ -99,8 +99,8 @@ void RegisterToUtf8(const Language& language, std::size_t size) {
   Case to("Conversions", "UTF-16 to UTF-8", language.name, size, "16-bit units");
   AddLibrary(to, size <= 64, [&](const Library& library) { return library.toUtf8(texts, false); });
 #ifdef HAVE_SIMDUTF
-  for (const SimdutfParty& party : Simdutf())
-    to.Against(party.first, Over(texts, [kernels = party.second](const std::u16string& text) {
+  for (const SimdutfContender& contender : Simdutf())
+    to.Against(contender.first, Over(texts, [kernels = contender.second](const std::u16string& text) {
                  return kernels->convert_utf16le_to_utf8(text.data(), text.size(), Buffer8());
                }));
 #endif
@@ -141,13 +141,13 @@ void RegisterFresh(const Language& language, std::size_t size) {
   AddLibrary(to, size <= 64, [&](const Library& library) { return library.toUtf16(utf8, true); });
   AddLibrary(from, size <= 64, [&](const Library& library) { return library.toUtf8(utf16, true); });
 #ifdef HAVE_SIMDUTF
-  for (const SimdutfParty& party : Simdutf()) {
-    to.Against(party.first, Over(utf8, [kernels = party.second](const std::string& text) {
+  for (const SimdutfContender& contender : Simdutf()) {
+    to.Against(contender.first, Over(utf8, [kernels = contender.second](const std::string& text) {
                  std::u16string result(kernels->utf16_length_from_utf8(text.data(), text.size()), u'\0');
                  benchmark::DoNotOptimize(result.c_str());
                  return kernels->convert_utf8_to_utf16le(text.data(), text.size(), result.data());
                }));
-    from.Against(party.first, Over(utf16, [kernels = party.second](const std::u16string& text) {
+    from.Against(contender.first, Over(utf16, [kernels = contender.second](const std::u16string& text) {
                    std::string result(kernels->utf8_length_from_utf16le(text.data(), text.size()), '\0');
                    benchmark::DoNotOptimize(result.c_str());
                    return kernels->convert_utf16le_to_utf8(text.data(), text.size(), result.data());
@@ -163,7 +163,7 @@ void RegisterFresh(const Language& language, std::size_t size) {
 }
 
 /// Registers conversions of text with an FF, which never occurs in UTF-8, about every `every` bytes. Each
-/// party is called again after every FF, so that it reports all of them.
+/// contender is called again after every FF, so that it reports all of them.
 void RegisterMalformed(const Language& language, const char* data, std::size_t every) {
   auto& malformed = *new Malformed{TextsIn<char>(language, std::size_t(1) << 16)[0], {0}};
   std::string& text = malformed.text;
@@ -176,9 +176,9 @@ void RegisterMalformed(const Language& language, const char* data, std::size_t e
   Case reports("Malformed text", data, language.name, std::size_t(1) << 16, "bytes");
   AddLibrary(reports, false, [&](const Library& library) { return library.reportMalformed(malformed); });
 #ifdef HAVE_SIMDUTF
-  for (const SimdutfParty& party : Simdutf())
-    reports.Against(party.first,
-                    Reporting(malformed, [kernels = party.second](const char* from, std::size_t n) {
+  for (const SimdutfContender& contender : Simdutf())
+    reports.Against(contender.first,
+                    Reporting(malformed, [kernels = contender.second](const char* from, std::size_t n) {
                       const auto result = kernels->convert_utf8_to_utf16le_with_errors(from, n, Buffer16());
                       return result.error != simdutf::SUCCESS;
                     }));

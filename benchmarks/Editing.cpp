@@ -25,8 +25,8 @@ template <class T> void RegisterBuilding(ssize_t count) {
   const auto ours = [] { return mirel::basic_xstring<T>(); };
   const auto theirs = [] { return StdString<T>(); };
   const auto vector = [] { return std::vector<Std>(); };
-  const auto edits = [count](const char* work, const char* data) {
-    return Case("Building", work, data, static_cast<std::size_t>(count),
+  const auto edits = [count](const char* operation, const char* data) {
+    return Case("Building", operation, data, static_cast<std::size_t>(count),
                 std::string("edits, ") + Width<T>::kUnit);
   };
   edits("push_back", "from empty")
@@ -77,8 +77,10 @@ template <class T> void RegisterChanging(ssize_t size) {
   const auto& ours = *new mirel::basic_xstring<T>(OurOf<T>(theirs));
   auto& ourTarget = *new mirel::basic_xstring<T>(ours);
   auto& theirTarget = *new StdString<T>(theirs);
-  const auto pair = [&](const char* work, const char* data, auto ourWork, auto theirWork) {
-    Case("Editing", work, data, usize, Width<T>::kUnit).Ours(ourWork).Against(Width<T>::kPeer, theirWork);
+  const auto pair = [&](const char* operation, const char* data, auto ourWork, auto theirWork) {
+    Case("Editing", operation, data, usize, Width<T>::kUnit)
+        .Ours(ourWork)
+        .Against(Width<T>::kPeer, theirWork);
   };
   pair(
       "copy", "construction", [&] { return mirel::basic_xstring<T>(ours).size(); },
@@ -125,18 +127,19 @@ template <class T> void RegisterChanging(ssize_t size) {
       });
 }
 
-/// Registers work with strings of 10 units; standard strings hold 10 bytes without an allocation.
+/// Registers benchmarks of strings of 10 units; standard strings hold 10 bytes without an allocation.
 template <class T> void RegisterShortStrings() {
   static const auto theirs = StdOf<T>("ten units.");
   static const auto ours = OurOf<T>(theirs);
-  const auto pair = [](const char* work, const char* data, std::size_t count, auto ourWork, auto theirWork) {
-    Case("Short strings", work, data, count, std::string("strings of 10 ") + Width<T>::kUnit)
+  const auto pair = [](const char* operation, const char* data, std::size_t count, auto ourWork,
+                       auto theirWork) {
+    Case("Short strings", operation, data, count, std::string("strings of 10 ") + Width<T>::kUnit)
         .Ours(ourWork)
         .Against(Width<T>::kPeer, theirWork);
   };
-  const auto each = [pair](const char* work, auto workWith) {
+  const auto each = [pair](const char* operation, auto workWith) {
     pair(
-        work, "of one, and destruction", 1, [workWith] { return workWith(ours); },
+        operation, "of one, and destruction", 1, [workWith] { return workWith(ours); },
         [workWith] { return workWith(theirs); });
   };
   each("construction", [](auto& s) {
@@ -191,9 +194,9 @@ template <class T> void RegisterShortStrings() {
       ++counts[word];
     return counts.size();
   };
-  const auto all = [pair](const char* work, const char* data, auto workWith) {
+  const auto all = [pair](const char* operation, const char* data, auto workWith) {
     pair(
-        work, data, kCount, [workWith] { return workWith(ourWords); },
+        operation, data, kCount, [workWith] { return workWith(ourWords); },
         [workWith] { return workWith(theirWords); });
   };
   all("push_back of strings", "std::vector, from empty", grow);

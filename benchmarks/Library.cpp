@@ -13,13 +13,13 @@ template <class T> const mirel::basic_xstring<T>& Held(const StdString<T>& text)
   return at != held.end() ? at->second : held.emplace(&text, OurOf<T>(text)).first->second;
 }
 
-template <class T> Party Search(Op op, const StdString<T>& text, const StdString<T>& what) {
-  return Searching(op, Held<T>(text), Held<T>(what));
+template <class T> Contender Search(Op op, const StdString<T>& text, const StdString<T>& needle) {
+  return Searching(op, Held<T>(text), Held<T>(needle));
 }
 
 /// Converts each of the texts by convert(destination, pointer, size).
 template <class Out, class In, class Convert>
-Party Converting(const std::vector<StdString<In>>& texts, bool isFresh, Convert convert) {
+Contender Converting(const std::vector<StdString<In>>& texts, bool isFresh, Convert convert) {
   const auto into = [convert](mirel::basic_xstring<Out>& destination, const StdString<In>& text) {
     convert(destination, reinterpret_cast<const In*>(text.data()), static_cast<ssize_t>(text.size()));
   };
@@ -37,19 +37,19 @@ Party Converting(const std::vector<StdString<In>>& texts, bool isFresh, Convert 
   });
 }
 
-Party ToUtf16(const std::vector<std::string>& texts, bool isFresh) {
+Contender ToUtf16(const std::vector<std::string>& texts, bool isFresh) {
   return Converting<char16, char8>(texts, isFresh, [](auto& to, const char8* from, ssize_t n) {
     return mirel::Utf16FromUtf8(to, from, n);
   });
 }
 
-Party ToUtf8(const std::vector<std::u16string>& texts, bool isFresh) {
+Contender ToUtf8(const std::vector<std::u16string>& texts, bool isFresh) {
   return Converting<char8, char16>(texts, isFresh, [](auto& to, const char16* from, ssize_t n) {
     return mirel::Utf8FromUtf16(to, from, n);
   });
 }
 
-Party ReportMalformed(const Malformed& malformed) {
+Contender ReportMalformed(const Malformed& malformed) {
   static auto& reused = *new mirel::string16;
   return Reporting(malformed, [](const char* text, std::size_t size) {
     return !mirel::Utf16FromUtf8(reused, text, static_cast<ssize_t>(size));

@@ -9,23 +9,25 @@
 enum class Op { kFindUnit, kRfindUnit, kFind, kRfind, kFirstOf, kLastOf, kFirstNotOf, kLastNotOf, kSplit };
 
 /// Searches in our strings or in standard ones, which live as long as the program.
-template <class String> Party Searching(Op op, const String& s, const String& what) {
+template <class String> Contender Searching(Op op, const String& s, const String& needle) {
   using Size = decltype(s.size());
   constexpr Size kLast = static_cast<Size>(-1);
   switch (op) {
-  case Op::kFindUnit: return Of([&s, unit = what[0]] { return s.find(unit); });
-  case Op::kRfindUnit: return Of([&s, unit = what[0]] { return s.rfind(unit); });
-  case Op::kFind: return Of([&s, &what] { return s.find(what); });
-  case Op::kRfind: return Of([&s, &what] { return s.rfind(what); });
-  case Op::kFirstOf: return Of([&s, &what] { return s.find_first_of(what.data(), 0, what.size()); });
-  case Op::kLastOf: return Of([&s, &what] { return s.find_last_of(what.data(), kLast, what.size()); });
-  case Op::kFirstNotOf: return Of([&s, &what] { return s.find_first_not_of(what.data(), 0, what.size()); });
-  case Op::kLastNotOf: return Of([&s, &what] { return s.find_last_not_of(what.data(), kLast, what.size()); });
+  case Op::kFindUnit: return Of([&s, unit = needle[0]] { return s.find(unit); });
+  case Op::kRfindUnit: return Of([&s, unit = needle[0]] { return s.rfind(unit); });
+  case Op::kFind: return Of([&s, &needle] { return s.find(needle); });
+  case Op::kRfind: return Of([&s, &needle] { return s.rfind(needle); });
+  case Op::kFirstOf: return Of([&s, &needle] { return s.find_first_of(needle.data(), 0, needle.size()); });
+  case Op::kLastOf: return Of([&s, &needle] { return s.find_last_of(needle.data(), kLast, needle.size()); });
+  case Op::kFirstNotOf:
+    return Of([&s, &needle] { return s.find_first_not_of(needle.data(), 0, needle.size()); });
+  case Op::kLastNotOf:
+    return Of([&s, &needle] { return s.find_last_not_of(needle.data(), kLast, needle.size()); });
   case Op::kSplit: break;
   }
-  return Of([&s, &what] {
+  return Of([&s, &needle] {
     long long words = 0;
-    for (Size at = 0; (at = s.find_first_of(what.data(), at, what.size())) != kLast; ++at)
+    for (Size at = 0; (at = s.find_first_of(needle.data(), at, needle.size())) != kLast; ++at)
       ++words;
     return words;
   });
@@ -38,7 +40,7 @@ struct Malformed {
 };
 
 /// Counts the parts that a conversion, given a pointer and a size, reports as malformed.
-template <class IsMalformed> Party Reporting(const Malformed& malformed, IsMalformed isMalformed) {
+template <class IsMalformed> Contender Reporting(const Malformed& malformed, IsMalformed isMalformed) {
   return Of([&malformed, isMalformed] {
     const std::string& text = malformed.text;
     int reports = 0;
@@ -51,11 +53,11 @@ template <class IsMalformed> Party Reporting(const Malformed& malformed, IsMalfo
 /// One version of the library. The arguments of its functions live as long as the program. A conversion
 /// reuses its destination, or converts into a fresh string and calls c_str().
 struct Library {
-  Party (*search8)(Op op, const std::string& text, const std::string& what);
-  Party (*search16)(Op op, const std::u16string& text, const std::u16string& what);
-  Party (*toUtf16)(const std::vector<std::string>& texts, bool isFresh);
-  Party (*toUtf8)(const std::vector<std::u16string>& texts, bool isFresh);
-  Party (*reportMalformed)(const Malformed& malformed);
+  Contender (*search8)(Op op, const std::string& text, const std::string& needle);
+  Contender (*search16)(Op op, const std::u16string& text, const std::u16string& needle);
+  Contender (*toUtf16)(const std::vector<std::string>& texts, bool isFresh);
+  Contender (*toUtf8)(const std::vector<std::u16string>& texts, bool isFresh);
+  Contender (*reportMalformed)(const Malformed& malformed);
 };
 
 extern const Library kOurs;

@@ -42,22 +42,22 @@ long long IndexOf(const std::string& text, std::size_t size) {
 }
 
 template <class T>
-Party OurSearch(const Library& library, Op op, const StdString<T>& text, const StdString<T>& what) {
+Contender OurSearch(const Library& library, Op op, const StdString<T>& text, const StdString<T>& needle) {
   if constexpr (sizeof(T) == 1)
-    return library.search8(op, text, what);
+    return library.search8(op, text, needle);
   else
-    return library.search16(op, text, what);
+    return library.search16(op, text, needle);
 }
 
-/// Registers a search with ours and the standard string as parties, and with the earlier version if the text
-/// is short or withEarlierVersion.
+/// Registers a search with ours and the standard string as contenders, and with the earlier version if the
+/// text is short or withEarlierVersion.
 template <class T>
-Case Search(Op op, const std::string& work, const std::string& data, const StdString<T>& text,
-            const StdString<T>& what, bool withEarlierVersion = false) {
-  Case search(Width<T>::kArea, work, data, text.size(), Width<T>::kUnit);
+Case Search(Op op, const std::string& operation, const std::string& data, const StdString<T>& text,
+            const StdString<T>& needle, bool withEarlierVersion = false) {
+  Case search(Width<T>::kArea, operation, data, text.size(), Width<T>::kUnit);
   AddLibrary(search, withEarlierVersion || text.size() <= 64,
-             [&](const Library& library) { return OurSearch<T>(library, op, text, what); });
-  return search.Against(Width<T>::kPeer, Searching(op, text, what));
+             [&](const Library& library) { return OurSearch<T>(library, op, text, needle); });
+  return search.Against(Width<T>::kPeer, Searching(op, text, needle));
 }
 
 /// Registers searches for a unit that isn't in the text.
@@ -71,8 +71,8 @@ template <class T> void RegisterUnit(const StdString<T>& text) {
   }
 #ifdef HAVE_SIMDUTF
   if constexpr (sizeof(T) == 2)
-    for (const SimdutfParty& party : Simdutf())
-      find.Against(party.first, [&text, kernels = party.second] {
+    for (const SimdutfContender& contender : Simdutf())
+      find.Against(contender.first, [&text, kernels = contender.second] {
         const char16_t* const end = text.data() + text.size();
         const char16_t* const at = kernels->find(text.data(), end, u'Z');
         return IndexOf(text, at == end ? nullptr : at);
@@ -90,28 +90,29 @@ template <class T> void RegisterUnit(const StdString<T>& text) {
 }
 
 template <class T>
-void RegisterNeedle(const StdString<T>& text, const std::string& needle, const char* first) {
-  const std::string data = std::to_string(needle.size()) + " units, first one " + first;
-  const auto& what = KeptOf<T>(needle);
-  Case find = Search<T>(Op::kFind, "find(needle)", data + ", absent", text, what);
-  Search<T>(Op::kRfind, "rfind(needle)", data + ", absent", text, what);
+void RegisterNeedle(const StdString<T>& text, const std::string& ascii, const char* first) {
+  const std::string data = std::to_string(ascii.size()) + " units, first one " + first;
+  const auto& needle = KeptOf<T>(ascii);
+  Case find = Search<T>(Op::kFind, "find(needle)", data + ", absent", text, needle);
+  Search<T>(Op::kRfind, "rfind(needle)", data + ", absent", text, needle);
   if constexpr (sizeof(T) == 1)
-    find.Against("memmem",
-                 [&] { return IndexOf(text, ::memmem(text.data(), text.size(), what.data(), what.size())); });
-  if (needle.size() != 12)
+    find.Against("memmem", [&] {
+      return IndexOf(text, ::memmem(text.data(), text.size(), needle.data(), needle.size()));
+    });
+  if (ascii.size() != 12)
     return;
 #ifdef HAVE_QT
   if constexpr (sizeof(T) == 1) {
     const auto& qt = *new QByteArray(text.data(), qsizetype(text.size()));
-    find.Against("QByteArray", [&] { return qt.indexOf(what.c_str()); });
+    find.Against("QByteArray", [&] { return qt.indexOf(needle.c_str()); });
   } else {
     const auto& qt = *new QString(reinterpret_cast<const QChar*>(text.data()), qsizetype(text.size()));
-    find.Against("QString", [&] { return qt.indexOf(QStringView(what.data(), qsizetype(what.size()))); });
+    find.Against("QString", [&] { return qt.indexOf(QStringView(needle.data(), qsizetype(needle.size()))); });
   }
 #endif
   StdString<T> end = text;
-  std::copy(what.begin(), what.end(), end.end() - 12);
-  Search<T>(Op::kFind, "find(needle)", data + ", at the end", Kept<T>(end), what);
+  std::copy(needle.begin(), needle.end(), end.end() - 12);
+  Search<T>(Op::kFind, "find(needle)", data + ", at the end", Kept<T>(end), needle);
 }
 
 /// Registers searches for a set whose members aren't in the text; in both directions if the set is ASCII.
@@ -139,8 +140,8 @@ template <class T> void RegisterComparisons(const StdString<T>& text) {
   const auto& other = Kept<T>(text);
   const auto& ours = *new mirel::basic_xstring<T>(OurOf<T>(text));
   const auto& ourOther = *new mirel::basic_xstring<T>(ours);
-  const auto pair = [&](const char* work, const char* data, auto ourWork, auto theirWork) {
-    Case(Width<T>::kArea, work, data, text.size(), Width<T>::kUnit)
+  const auto pair = [&](const char* operation, const char* data, auto ourWork, auto theirWork) {
+    Case(Width<T>::kArea, operation, data, text.size(), Width<T>::kUnit)
         .Ours(ourWork)
         .Against(Width<T>::kPeer, theirWork);
   };
@@ -201,10 +202,10 @@ void RegisterScripts(std::size_t size) {
   std::u16string cyrillic, mixed;
   int word = 0;
   for (const char c : Words(size)) {
-    const auto letter = static_cast<char16_t>(c - 'a');
-    cyrillic += c == ' ' ? u' ' : char16_t(u'\u0430' + letter);
+    const auto offset = static_cast<char16_t>(c - 'a');
+    cyrillic += c == ' ' ? u' ' : char16_t(u'\u0430' + offset);
     const char16_t scripts[] = {u'a', u'\u03B1', u'\u0430', u'\u4E00'}; // each word in the next one
-    mixed += c == ' ' ? u' ' : char16_t(scripts[word % 4] + letter);
+    mixed += c == ' ' ? u' ' : char16_t(scripts[word % 4] + offset);
     word += c == ' ';
   }
   const auto& cyrillicText = Kept<char16>(cyrillic);

@@ -10,11 +10,11 @@
 #include <simdutf.h>
 #include <utils/Kernels.h>
 
-using SimdutfParty = std::pair<std::string, const simdutf::implementation*>;
+using SimdutfContender = std::pair<std::string, const simdutf::implementation*>;
 
 /// Returns simdutf's kernels for the instructions that ours use, if it has such, and its best ones for this
 /// processor.
-inline const std::vector<SimdutfParty>& Simdutf() {
+inline const std::vector<SimdutfContender>& Simdutf() {
   static const auto kParties = [] {
     const std::string ours = mirel::KernelName();
     const char* const same = ours == "AVX2"   ? "haswell"
@@ -22,11 +22,11 @@ inline const std::vector<SimdutfParty>& Simdutf() {
                              : ours == "NEON" ? "arm64"
                                               : "fallback";
     const auto& all = simdutf::get_available_implementations();
-    std::vector<SimdutfParty> parties;
+    std::vector<SimdutfContender> contenders;
     if (const auto* const kernels = all[same]; kernels && kernels->supported_by_runtime_system())
-      parties.emplace_back("simdutf, same level", kernels);
-    parties.emplace_back("simdutf, best", all.detect_best_supported());
-    return parties;
+      contenders.emplace_back("simdutf, same level", kernels);
+    contenders.emplace_back("simdutf, best", all.detect_best_supported());
+    return contenders;
   }();
   return kParties;
 }

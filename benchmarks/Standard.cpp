@@ -28,8 +28,8 @@ template <class T> void RegisterComparing(ssize_t size) {
   if constexpr (sizeof(T) == 1)
     std::transform(ours->begin(), ours->end(), theirs->begin(), [](auto& s) { return mirel::View(s); });
   const std::string peer = std::string(Width<T>::kPeer) + "_view";
-  const auto pair = [&](const char* work, const char* data, auto workWith) {
-    Case("Standard library", work, data, usize, Width<T>::kUnit)
+  const auto pair = [&](const char* operation, const char* data, auto workWith) {
+    Case("Standard library", operation, data, usize, Width<T>::kUnit)
         .Ours([=] { return workWith(*ours); })
         .Against(peer, [=] { return workWith(*theirs); });
   };
@@ -40,8 +40,8 @@ template <class T> void RegisterComparing(ssize_t size) {
   pair("<", "another last unit", [](const auto& s) { return s[0] < s[2]; });
 }
 
-/// Registers work with standard containers of strings of 16 units, which are too long for a standard string
-/// to hold without an allocation.
+/// Registers benchmarks of standard containers of strings of 16 units, which are too long for a standard
+/// string to hold without an allocation.
 template <class T> void RegisterContainers() {
   constexpr std::size_t kCount = 1000;
   using Std = StdString<T>;
@@ -53,8 +53,8 @@ template <class T> void RegisterContainers() {
     copied.push_back(OurOf<T>(theirs.back()));
     ours.push_back(copied.back());
   }
-  const auto with = [](const char* work, const char* data) {
-    return Case("Standard library", work, data, kCount, std::string("strings of 16 ") + Width<T>::kUnit);
+  const auto with = [](const char* operation, const char* data) {
+    return Case("Standard library", operation, data, kCount, std::string("strings of 16 ") + Width<T>::kUnit);
   };
   const auto grow = [](auto& words) {
     return [&words] {
@@ -93,8 +93,8 @@ template <class T> void RegisterContainers() {
       return changed[kCount / 2][10];
     };
   };
-  const auto all = [&](const char* work, const char* data, auto workWith) {
-    with(work, data)
+  const auto all = [&](const char* operation, const char* data, auto workWith) {
+    with(operation, data)
         .Ours(workWith(ours))
         .Against(Width<T>::kPeer, workWith(theirs))
         .Against("strings that copy", workWith(copied));

@@ -1,5 +1,6 @@
-// Checks, counts, walks and lossy conversions. A party that can detect malformed text does: simdutf, whose
-// functions only count, checks the text first. u_countChar32 and utfcpp's unchecked iterators detect none.
+// Checks, counts, walks and lossy conversions. A contender that can detect malformed text does: simdutf,
+// whose functions only count, checks the text first. u_countChar32 and utfcpp's unchecked iterators detect
+// none.
 #include "Cases.h"
 #include "Simdutf.h"
 #include "Texts.h"
@@ -49,16 +50,16 @@ void RegisterChecks8(const Language& language, std::size_t size) {
   count.Against("ours",
                 Over(texts, [](const std::string& s) { return mirel::CountCodePoints(s.data(), Size(s)); }));
 #ifdef HAVE_SIMDUTF
-  for (const SimdutfParty& party : Simdutf()) {
-    const auto* const k = party.second;
-    check.Against(party.first,
+  for (const SimdutfContender& contender : Simdutf()) {
+    const auto* const k = contender.second;
+    check.Against(contender.first,
                   Over(texts, [k](const std::string& s) { return k->validate_utf8(s.data(), s.size()); }));
-    length.Against(party.first, Over(texts, [k](const std::string& s) {
+    length.Against(contender.first, Over(texts, [k](const std::string& s) {
                      return k->validate_utf8(s.data(), s.size())
                                 ? k->utf16_length_from_utf8(s.data(), s.size())
                                 : 0;
                    }));
-    count.Against(party.first, Over(texts, [k](const std::string& s) {
+    count.Against(contender.first, Over(texts, [k](const std::string& s) {
                     return k->validate_utf8(s.data(), s.size()) ? k->count_utf8(s.data(), s.size()) : 0;
                   }));
   }
@@ -93,17 +94,17 @@ void RegisterChecks16(const Language& language, std::size_t size) {
   count.Against(
       "ours", Over(texts, [](const std::u16string& s) { return mirel::CountCodePoints(Units(s), Size(s)); }));
 #ifdef HAVE_SIMDUTF
-  for (const SimdutfParty& party : Simdutf()) {
-    const auto* const k = party.second;
-    check.Against(party.first, Over(texts, [k](const std::u16string& s) {
+  for (const SimdutfContender& contender : Simdutf()) {
+    const auto* const k = contender.second;
+    check.Against(contender.first, Over(texts, [k](const std::u16string& s) {
                     return k->validate_utf16le(s.data(), s.size());
                   }));
-    length.Against(party.first, Over(texts, [k](const std::u16string& s) {
+    length.Against(contender.first, Over(texts, [k](const std::u16string& s) {
                      return k->validate_utf16le(s.data(), s.size())
                                 ? k->utf8_length_from_utf16le(s.data(), s.size())
                                 : 0;
                    }));
-    count.Against(party.first, Over(texts, [k](const std::u16string& s) {
+    count.Against(contender.first, Over(texts, [k](const std::u16string& s) {
                     return k->validate_utf16le(s.data(), s.size()) ? k->count_utf16le(s.data(), s.size()) : 0;
                   }));
   }

@@ -11,8 +11,8 @@ int main(int argc, char** argv) {
   RegisterTexts();
   benchmark::AddCustomContext("kernels", mirel::KernelName());
 #ifdef HAVE_SIMDUTF
-  for (const auto& [party, kernels] : Simdutf())
-    benchmark::AddCustomContext(party,
+  for (const auto& [contender, kernels] : Simdutf())
+    benchmark::AddCustomContext(contender,
                                 std::string(kernels->name()) + ", " + std::string(kernels->description()));
 #endif
 #ifdef HAVE_BEFORE

@@ -3,7 +3,7 @@
 
 usage: report.py OUTPUT-DIRECTORY NAME=RESULTS.json...
 
-A ratio is the peer's time divided by ours: above 1 we are ahead. The parties run many times, interleaved at random; the
+A ratio is the peer's time divided by ours: above 1 we are ahead. The contenders run many times, interleaved at random; the
 ratio is that of the medians. A ratio for several texts is their geometric mean.
 """
 
@@ -44,11 +44,11 @@ GLANCE = [
     ("sorting and storing short strings", "push_back of strings|copy and sort|insertion of keys", "*", "* bytes", "1,000"),
 ]
 
-Case = collections.namedtuple("Case", "area work data size unit")
+Case = collections.namedtuple("Case", "area operation data size unit")
 
 
 class Run:
-    """The results of one program: times[case][party] lists the time of each repetition."""
+    """The results of one program: times[case][contender] lists the time of each repetition."""
 
     def __init__(self, path):
         results = json.loads(pathlib.Path(path).read_text())
@@ -56,10 +56,10 @@ class Run:
         self.times = {}
         for run in results["benchmarks"]:
             if run["run_type"] == "iteration":
-                area, work, data, size, unit, party = re.sub("/repeats:.*", "", run["run_name"]).split(";")
-                case = self.times.setdefault(Case(area, work, data, int(size), unit), {})
-                case.setdefault(party, []).append(run["real_time"])
-        self.times = {case: parties for case, parties in self.times.items() if "ours" in parties}
+                area, operation, data, size, unit, contender = re.sub("/repeats:.*", "", run["run_name"]).split(";")
+                case = self.times.setdefault(Case(area, operation, data, int(size), unit), {})
+                case.setdefault(contender, []).append(run["real_time"])
+        self.times = {case: contenders for case, contenders in self.times.items() if "ours" in contenders}
 
     @functools.lru_cache(maxsize=None)
     def ratio(self, case, peer):
@@ -80,17 +80,17 @@ class Run:
         return statistics.quantiles(means, n=4)[2] if len(means) > 1 else means[0]
 
     def peers(self, cases):
-        """The parties of all the cases, except the library itself in another way or another version."""
+        """The contenders of all the cases, except the library itself in another way or another version."""
         common = set.intersection(*(set(self.times[case]) for case in cases)) if cases else set()
         return sorted(p for p in common if p not in ("ours", EARLIER) and not p.startswith("our "))
 
     def closest_peer(self, cases):
         return min(self.peers(cases), key=lambda peer: self.mean(cases, peer), default=None)
 
-    def select(self, works, data="", unit="", column=None):
+    def select(self, operations, data="", unit="", column=None):
         """The cases that match the patterns, of which an empty one matches all, and the column of sizes."""
-        return [c for c in self.times if any(fnmatch.fnmatchcase(c.work, w.replace("[]", "[[]]"))
-                                             for w in works.split("|"))
+        return [c for c in self.times if any(fnmatch.fnmatchcase(c.operation, w.replace("[]", "[[]]"))
+                                             for w in operations.split("|"))
                 and fnmatch.fnmatchcase(c.data, data or "*") and fnmatch.fnmatchcase(c.unit, unit or "*")
                 and (column is None or column_of(c.size) == column)]
 
@@ -115,8 +115,8 @@ def table(header, alignment, rows):
 
 def glance(run):
     rows = []
-    for label, works, data, unit, column in GLANCE:
-        cases = run.select(works, data, unit, column)
+    for label, operations, data, unit, column in GLANCE:
+        cases = run.select(operations, data, unit, column)
         peer = run.closest_peer(cases)
         amounts = sorted({f"{number(case.size)} {case.unit}" for case in cases})
         ratio = f"{run.mean(cases, peer):.2f}" if peer else ""
@@ -130,7 +130,7 @@ def measure_goal(run, cases, peers, goal):
     for case in cases:
         for peer in peers:
             if run.has(case, peer):
-                groups.setdefault((case.work, case.unit, peer), []).append(case)
+                groups.setdefault((case.operation, case.unit, peer), []).append(case)
     if not groups:
         return None
     means = {group: run.mean(members, group[2]) for group, members in groups.items()}
@@ -161,7 +161,7 @@ def goals_table(runs):
         beside_earlier = row[column] == EARLIER  # the goal is to be as fast as that
         goal = 1.0 if beside_earlier else float(row[column])
         peers = [EARLIER] if beside_earlier else row["peer"].split("|")
-        found = [run.select(row["work"], row["data"], row["unit"], column) for run in runs.values()]
+        found = [run.select(row["operation"], row["data"], row["unit"], column) for run in runs.values()]
         results = [measure_goal(run, cases, peers, goal) for run, cases in zip(runs.values(), found)]
         missed = [r for r in results if r and not r[1]]
         sizes = sorted({case.size for case in sum(found, [])})
@@ -170,8 +170,8 @@ def goals_table(runs):
         if missed:
             reason = "within the spread" if all(r[2] for r in missed) else row["reason"] or "**below**"
         reached += not missed and all(results)
-        work = row["work"].replace("|", ", ") + (f": {row['data']}" if row["data"] else "")
-        rows.append([work.replace("*", "…"), " or ".join(peers), ", ".join(map(number, sizes)) or column,
+        operation = row["operation"].replace("|", ", ") + (f": {row['data']}" if row["data"] else "")
+        rows.append([operation.replace("*", "…"), " or ".join(peers), ", ".join(map(number, sizes)) or column,
                      " or ".join(units) or row["unit"] or "units", f"{goal:g}",
                      *(r[0] if r else "–" for r in results), reason])
     return rows, reached
@@ -184,9 +184,9 @@ def long_table(runs, area):
     rows = {}
     for case in cases:
         for peer in {p: None for run in runs.values() for p in run.times.get(case, {}) if p != "ours"}:
-            rows.setdefault((case.work, case.data, case.unit, peer), {})[case.size] = case
+            rows.setdefault((case.operation, case.data, case.unit, peer), {})[case.size] = case
     lines = []
-    for (work, data, unit, peer), by_size in sorted(rows.items()):
+    for (operation, data, unit, peer), by_size in sorted(rows.items()):
         cells, spreads = [], []
         for size in sizes:
             case = by_size.get(size)
@@ -199,7 +199,7 @@ def long_table(runs, area):
                     low, middle, high = statistics.quantiles(singles, n=4)
                     spreads.append((high - low) / 2 / middle)
         spread = f"±{statistics.median(spreads):.0%}" if spreads else ""
-        lines.append([work, data, unit, peer, *cells, spread])
+        lines.append([operation, data, unit, peer, *cells, spread])
     header = ["benchmark", "data", "unit", "peer", *map(number, sizes), "spread"]
     return table(header, ["---"] * 4 + ["--:"] * (len(sizes) + 1), lines)
 
@@ -210,33 +210,33 @@ def plot(name, run, path):
         columns = {column: [c for c in cases if column_of(c.size) == column] for column in SIZES}
         return label, {column: run.mean(group, peer) for column, group in columns.items() if group}
 
-    def by_peer(work):
-        cases = run.select(work)
+    def by_peer(operation):
+        cases = run.select(operation)
         rows = [row(peer, cases, peer) for peer in run.peers(cases)]
         return sorted(rows, key=lambda r: statistics.geometric_mean(r[1].values()))
 
-    def by_work(*areas):
+    def by_operation(*areas):
         groups = {}
         for case in run.times:
-            if case.area in areas and case.size != 200 and case.work not in CONVERSIONS:
-                groups.setdefault(case.work, []).append(case)
-        for work, cases in sorted(groups.items()):
+            if case.area in areas and case.size != 200 and case.operation not in CONVERSIONS:
+                groups.setdefault(case.operation, []).append(case)
+        for operation, cases in sorted(groups.items()):
             kinds = {case.unit: [c for c in cases if c.unit == case.unit] for case in cases}
             for unit, members in kinds.items():
                 peer = run.closest_peer(members)
                 width = "" if len(kinds) == 1 else ", bytes" if unit.endswith("bytes") else ", 16-bit"
                 if peer:
-                    yield row(f"{work}{width}: {peer}", members, peer)
+                    yield row(f"{operation}{width}: {peer}", members, peer)
 
     panels = [("UTF-8 to UTF-16, mean over all texts", by_peer(CONVERSIONS[0])),
               ("UTF-16 to UTF-8, mean over all texts", by_peer(CONVERSIONS[1])),
-              ("Searches in bytes", list(by_work("Searches in bytes"))),
-              ("Searches in 16-bit units", list(by_work("Searches in 16-bit units"))),
-              ("Building and editing", list(by_work("Building", "Editing"))),
+              ("Searches in bytes", list(by_operation("Searches in bytes"))),
+              ("Searches in 16-bit units", list(by_operation("Searches in 16-bit units"))),
+              ("Building and editing", list(by_operation("Building", "Editing"))),
               ("Fresh, malformed, worst cases, short strings",
-               list(by_work("Conversions into a fresh string", "Malformed text", "Worst cases", "Short strings"))),
-              ("Text: checking, counting, walking", list(by_work("Text"))),
-              ("Lossy conversions", list(by_work("Lossy conversions")))]
+               list(by_operation("Conversions into a fresh string", "Malformed text", "Worst cases", "Short strings"))),
+              ("Text: checking, counting, walking", list(by_operation("Text"))),
+              ("Lossy conversions", list(by_operation("Lossy conversions")))]
     heights = [max(len(panels[i][1]), len(panels[i + 1][1]), 1) + 3 for i in range(0, len(panels), 2)]
     figure, grid = plt.subplots(len(heights), 2, figsize=(13, 10), height_ratios=heights)
     for axes, (title, rows) in zip(grid.flat, panels):
@@ -291,7 +291,7 @@ def main():
              "- columns: the compiler and optimisation of the program; the library and simdutf are release builds (-O3)",
              "  by the same compiler",
              f"- command: `./dev bench`, with `--simdutf` and `--before` for those peers; {repetitions} repetitions of "
-             "each party, 9 for the", "  longest, interleaved at random",
+             "each contender, 9 for the", "  longest, interleaved at random",
              "- conversions of up to 64 units go through eight texts in turn; texts of 12 to 16 units end between code points",
              "- absolute times on a shared machine mean little, so the tables have none", "",
              "## Goals", "",

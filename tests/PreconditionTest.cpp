@@ -81,7 +81,7 @@ template <class V, class... A> struct CallOf {
 };
 #define CALL(PARAMETERS, ...)                                                                                \
   {                                                                                                          \
-#__VA_ARGS__, [&] PARAMETERS { static_cast<void>(v), __VA_ARGS__; }                                      \
+#__VA_ARGS__, [&] PARAMETERS { static_cast<void>(v); static_cast<void>(__VA_ARGS__); }                       \
   }
 #define WITHOUT(...) CALL((auto& v), __VA_ARGS__)
 #define WITH_I(...) CALL((auto& v, ssize_t i), __VA_ARGS__)
@@ -125,24 +125,24 @@ void ExpectStops(V& v, const std::string& text, const std::vector<std::tuple<A..
 template <class T> class Precondition : public testing::Test {};
 TYPED_TEST_SUITE(Precondition, CodeUnits);
 
-using One = std::vector<std::tuple<ssize_t>>;
-using Two = std::vector<std::tuple<ssize_t, ssize_t>>;
+using Singles = std::vector<std::tuple<ssize_t>>;
+using Pairs = std::vector<std::tuple<ssize_t, ssize_t>>;
 const std::vector<std::tuple<>> kOnce = {{}};
 
 // Bad values for a string of three units.
-const One kBadIndex = {{-1}, {4}, {kMin}, {kMax}};
-const One kBadElement = {{-1}, {3}, {kMin}, {kMax}};
-const One kBadReverse = {{-2}, {3}, {kMin}, {kMax}};
-const One kBadLengthFrom2 = {{-2}, {2}, {kMin}, {kMax}};
-const One kBadCount = {{-1}, {kMin}};
-const Two kBadSubrange = {{-1, 1},      {0, -1},      {1, 3},       {4, 0},    {1, kMax},
-                          {kMax, kMax}, {kMin, kMax}, {kMin, kMin}, {kMax, 1}, {2, kMin}};
-const Two kBadIndices = {{-1, 1}, {2, 1}, {0, 4}, {4, 4}, {0, kMax}, {kMin, kMin}};
-const Two kBadIterators = {{-1, 1}, {2, 1}, {0, 4}, {4, 4}};
+const Singles kBadIndex = {{-1}, {4}, {kMin}, {kMax}};
+const Singles kBadElement = {{-1}, {3}, {kMin}, {kMax}};
+const Singles kBadReverse = {{-2}, {3}, {kMin}, {kMax}};
+const Singles kBadLengthFrom2 = {{-2}, {2}, {kMin}, {kMax}};
+const Singles kBadCount = {{-1}, {kMin}};
+const Pairs kBadSubrange = {{-1, 1},      {0, -1},      {1, 3},       {4, 0},    {1, kMax},
+                            {kMax, kMax}, {kMin, kMax}, {kMin, kMin}, {kMax, 1}, {2, kMin}};
+const Pairs kBadIndices = {{-1, 1}, {2, 1}, {0, 4}, {4, 4}, {0, kMax}, {kMin, kMin}};
+const Pairs kBadIterators = {{-1, 1}, {2, 1}, {0, 4}, {4, 4}};
 
 // If a call is bad in two ways, with an index of 99 for example, the first check must report it.
 
-TYPED_TEST(Precondition, OfSubranges) {
+TYPED_TEST(Precondition, StopsBadSubranges) {
   using S = basic_xstring<TypeParam>;
   const S r = Of<TypeParam>("xyz");
   const TypeParam x = 'x';
@@ -161,7 +161,7 @@ TYPED_TEST(Precondition, OfSubranges) {
                WITH_I1_I2(v.replace(v.begin() + i1, v.begin() + i2, -1, x))});
 }
 
-TYPED_TEST(Precondition, OfIndicesAndCounts) {
+TYPED_TEST(Precondition, StopsBadIndicesAndCounts) {
   using T = TypeParam;
   using S = basic_xstring<T>;
   const S r = Of<T>("xyz");
@@ -177,7 +177,7 @@ TYPED_TEST(Precondition, OfIndicesAndCounts) {
   ExpectStops(s, kIndex, kBadIndex,
               {WITH_I(v.insert(i, r)), WITH_I(v.insert(i, r, 0, 1)), WITH_I(v.insert(i, q, 1)),
                WITH_I(v.insert(i, z))});
-  ExpectStops(s, kIndex, One{{-1}, {4}}, {WITH_I(v.insert(v.begin() + i, x))});
+  ExpectStops(s, kIndex, Singles{{-1}, {4}}, {WITH_I(v.insert(v.begin() + i, x))});
   ExpectStops(s, kElement, kBadElement, {WITH_I(v[i] = x)});
   ExpectStops(s, kCount, kBadCount,
               {WITH_N(xvector<T>(n, x)), WITH_N(v.assign(n, x)), WITH_N(v.append(n, x)),
@@ -188,7 +188,7 @@ TYPED_TEST(Precondition, OfIndicesAndCounts) {
   ExpectStops(s, "newSize >= 0", kBadCount, {WITH_N(v.resize(n, x))});
   const auto filled = [](ssize_t n) { return [n](T*, ssize_t) { return n; }; };
   ExpectStops(s, "0 <= most", kBadCount, {WITH_N(mirel::FillFrom(v, n, filled(0)))});
-  ExpectStops(s, "0 <= filled && filled <= most", One{{-1}, {1}, {kMax}, {kMin}},
+  ExpectStops(s, "0 <= filled && filled <= most", Singles{{-1}, {1}, {kMax}, {kMin}},
               {WITH_N(mirel::FillFrom(v, 0, filled(n)))});
 }
 
@@ -205,7 +205,7 @@ void ExpectRangeStops(S& s, It from, It to, const char* copying, const char* sea
         {WITH_R1_R2(v.contains(r1, r2, 0)), FORWARD(WITH_R1_R2, r1, r2), REVERSE(WITH_R1_R2, r1, r2)});
 }
 
-TYPED_TEST(Precondition, OfRanges) {
+TYPED_TEST(Precondition, StopsBadRanges) {
   using T = TypeParam;
   using S = basic_xstring<T>;
   const S r = Of<T>("xyz");
@@ -247,7 +247,7 @@ TYPED_TEST(Precondition, OfRanges) {
   EXPECT_EDIT(s, s.push_back(0, ints.begin(), ints.end()), "abc");
 }
 
-TYPED_TEST(Precondition, OfNullTerminatedArguments) {
+TYPED_TEST(Precondition, StopsNullStrings) {
   using T = TypeParam;
   using S = basic_xstring<T>;
   S s = Of<T>("abc");
@@ -260,7 +260,7 @@ TYPED_TEST(Precondition, OfNullTerminatedArguments) {
                REVERSE(WITH_Z, z, 99)});
 }
 
-TYPED_TEST(Precondition, OfPointersAndCounts) {
+TYPED_TEST(Precondition, StopsBadPointersAndCounts) {
   using T = TypeParam;
   using S = basic_xstring<T>;
   const S r = Of<T>("xyz");
@@ -281,7 +281,7 @@ TYPED_TEST(Precondition, OfPointersAndCounts) {
                WITHOUT(constEmpty.rbegin()--)});
 }
 
-TYPED_TEST(Precondition, OfElementRanges) {
+TYPED_TEST(Precondition, StopsBadElementRanges) {
   using T = TypeParam;
   using mirel::p_copy, mirel::p_create;
   auto s = Of<T>("abc");
@@ -302,10 +302,10 @@ TYPED_TEST(Precondition, OfElementRanges) {
   EXPECT_EDIT(s, p_create(q + 3, q, 'x'), "abc");
 }
 
-TEST(Precondition, OfBuffers) {
+TEST(Precondition, StopsBadCallsOfBuffers) {
   const uint8_t byte = 1;
   VectorOfByte b{1, 2, 3};
-  ExpectStops(b, "size_ >= 0", One{{4}, {kMax}}, {WITH_N(v.pop_back(n))});
+  ExpectStops(b, "size_ >= 0", Singles{{4}, {kMax}}, {WITH_N(v.pop_back(n))});
   ExpectStops(b, kCount, kBadCount, {WITH_N(v.pop_back(n)), WITH_N(v.growbytes(n))});
   ExpectStops(b, "0 <= n", kBadCount, {WITH_N(v.resize(n)), WITH_N(v.insertbytes(3, n))});
   ExpectStops(b, kIndex, kBadIndex, {WITH_I(v.insertbytes(i, -1))});
@@ -317,7 +317,7 @@ template <class V> class PreconditionOfAny : public testing::Test {};
 using Containers = testing::Types<string8, string16, VectorOfByte>;
 TYPED_TEST_SUITE(PreconditionOfAny, Containers);
 
-TYPED_TEST(PreconditionOfAny, StringOrBuffer) {
+TYPED_TEST(PreconditionOfAny, StopsBadCallsOfStringsAndBuffers) {
   using V = TypeParam;
   using P = const typename V::value_type*;
   const typename V::value_type x = 'x';
@@ -331,7 +331,7 @@ TYPED_TEST(PreconditionOfAny, StringOrBuffer) {
   ExpectStops(s, kMoveTo, kBadSubrange, {WITH_I_N(v.move(i, 99, n))});
   ExpectStops(s, kMoveFrom, kBadElement, {WITH_I(v.move(0, i, 1))});
   ExpectStops(s, kIterators, kBadIterators, {WITH_I1_I2(v.erase(v.begin() + i1, v.begin() + i2))});
-  ExpectStops(s, kIterator, One{{-1}, {3}}, {WITH_I(v.erase(v.begin() + i))});
+  ExpectStops(s, kIterator, Singles{{-1}, {3}}, {WITH_I(v.erase(v.begin() + i))});
   ExpectStops(s, kIndex, kBadIndex,
               {WITH_I(v.insert(i, x)), WITH_I(v.insert(i, -1, x)), WITH_I(v.insert(i, q + 1, q)),
                WITH_I(v.insert(i, +null, q))});
@@ -350,7 +350,7 @@ TYPED_TEST(PreconditionOfAny, StringOrBuffer) {
                WITHOUT(constEmpty.back())});
 }
 
-TEST(Precondition, OfConversionsAndText) {
+TEST(Precondition, StopsBadConversions) {
   string16 wide = Of<char16>("abc");
   string8 narrow = Of<char8>("abc");
   ExpectStops(wide, "srcLen >= 0", kBadCount, {WITH_N(Utf16FromUtf8(v, "a", n))});
@@ -374,7 +374,7 @@ TEST(Precondition, OfConversionsAndText) {
   ExpectStops(wide, "0 <= offset && offset < pn", kOnce, {WITHOUT(mirel::ExplainMalformed("", 0, 0))});
 }
 
-TEST(Precondition, OfStreams) {
+TEST(Precondition, StopsBadCallsOfStreams) {
   struct : mirel::IOutputStream {
     void WriteStream(const void*, ssize_t) override {}
     void FlushStream() override {}

@@ -99,7 +99,7 @@ template <class T, class... U> void ExpectElements() {
   std::apply([](const auto&... v) { (ExpectAll<T>(v.data(), v.data() + kSize, kCopies<T, U>), ...); }, units);
 }
 
-TYPED_TEST(Range, OfElementsOfAnyType) {
+TYPED_TEST(Range, MayHaveElementsOfAnyType) {
   ExpectElements<TypeParam, char, signed char, unsigned char, short, unsigned short, char16_t, int, wchar_t,
                  char32_t, long long, Scoped>();
 }
@@ -123,13 +123,13 @@ template <class T, class U> void ExpectIterators() {
 #endif
 }
 
-TYPED_TEST(Range, OfAnyIterators) {
+TYPED_TEST(Range, MayHaveAnyIterators) {
   ExpectIterators<TypeParam, signed char>();
   ExpectIterators<TypeParam, short>();
   ExpectIterators<TypeParam, int>();
 }
 
-TYPED_TEST(Range, OfStringsAndViewsAndOurs) {
+TYPED_TEST(Range, MayComeFromAnyStringOrView) {
   using T = TypeParam;
   const std::string narrow = kUnits;
   const std::u16string wide = u"ab\xE9\x80";

@@ -63,8 +63,8 @@ TYPED_TEST(StdLibrary, OperatorsOrderUnsignedUnits) {
       EXPECT_EQ(Relations(std::string(textA), M(b)), relation);
     }
   }
-  const S zero(1, 0);
-  EXPECT_TRUE(zero > S().c_str()) << "a null counts in a string and ends a null-terminated one";
+  const S null(1, 0);
+  EXPECT_TRUE(null > S().c_str()) << "a null counts in a string and ends a null-terminated one";
 }
 
 // Comparisons that aren't ours keep their meaning.
@@ -197,8 +197,8 @@ TYPED_TEST(StdLibrary, FillFromKeepsWhatWasWritten) {
   using S = basic_xstring<TypeParam>;
   S s = Of<TypeParam>("ab");
   const auto fill = [](unsigned n) {
-    return [n](TypeParam* p, ssize_t most) {
-      EXPECT_GE(most, ssize_t(n));
+    return [n](TypeParam* p, ssize_t room) {
+      EXPECT_GE(room, ssize_t(n));
       std::fill(p, p + n, TypeParam('x'));
       return n;
     };

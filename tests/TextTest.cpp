@@ -55,7 +55,7 @@ template <class T> class UtfText : public testing::Test {};
 TYPED_TEST_SUITE(UtfText, CodeUnits);
 
 /// One or two sequences between n equal ones on both sides: every kind of block, and every place in it.
-TYPED_TEST(UtfText, SequencesAtEveryPlaceInABlock) {
+TYPED_TEST(UtfText, SequencesAtEveryPlaceInABlockAreReadAsByTheOracle) {
   const auto& pieces = Pieces(TypeParam());
   const Text<TypeParam> fault(1, static_cast<TypeParam>(sizeof(TypeParam) == 1 ? 0xFF : 0xDC00));
   for (std::size_t n = 0; n < 135; ++n)

@@ -12,7 +12,7 @@ namespace {
 
 using namespace oracle;
 
-TEST(Utf, EveryScalarValueBothWays) {
+TEST(Utf, EveryScalarValueConvertsBothWays) {
   Text<char8> allBytes, bytes;
   Text<char16> allUnits, units;
   for (char32_t c = 0; c <= 0x10FFFF; ++c) {
@@ -30,10 +30,10 @@ TEST(Utf, EveryScalarValueBothWays) {
   Check<char16>(View<char8>(allBytes));
   Check<char8>(View<char16>(allUnits));
   ASSERT_TRUE(Convert(units, allBytes));
-  ASSERT_TRUE(units == allUnits) << "the oracle's two directions differ";
+  ASSERT_EQ(units, allUnits) << "the oracle's two directions differ";
 }
 
-TEST(Utf, EverySequenceOfUpToThreeBytes) {
+TEST(Utf, EverySequenceOfUpToThreeBytesConvertsAsByTheOracle) {
   for (unsigned bytes = 0; bytes < 1u << 24; ++bytes) {
     const char8 text[] = {static_cast<char8>(bytes >> 16), static_cast<char8>(bytes >> 8),
                           static_cast<char8>(bytes)};
@@ -50,7 +50,7 @@ TEST(Utf, EverySequenceOfUpToThreeBytes) {
   }
 }
 
-TEST(Utf, FourBytes) {
+TEST(Utf, FourBytesConvertAsByTheOracle) {
   const unsigned nearContinuations[] = {0x7F, 0x80, 0x9A, 0xBF, 0xC0};
   for (unsigned lead = 0xF0; lead < 0x100; ++lead)
     for (unsigned second = 0; second < 0x100; ++second)
@@ -151,7 +151,7 @@ TEST(Utf, APairMayStandWhereAPartOfAViewEnds) {
   }
 }
 
-TEST(Utf, AsciiOfEveryLength) {
+TEST(Utf, NonAsciiBecomesAQuestionMarkAtEveryPlace) {
   mirel::string16 wide;
   for (std::size_t n = 1; n < 100; ++n)
     for (std::size_t at = 0; at < n; ++at) {

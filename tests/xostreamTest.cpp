@@ -106,7 +106,10 @@ TEST(XOStream, IndentsWhatFollowsANewline) {
   os.put(5);
   os.endl();
   os.ends();
-  os << [](xostream& o) -> xostream& { return o.Indent(0), o; };
+  os << [](xostream& o) -> xostream& {
+    o.Indent(0);
+    return o;
+  };
   const std::string spaces(18, ' ');
   EXPECT_EQ(sink.text, "a\n" + spaces + "b\n 5\n " + std::string(1, '\0'));
   EXPECT_EQ(sink.flushes, 1);

@@ -88,7 +88,7 @@ constexpr bool kIsVolatile =
 
 /// Returns whether It is a contiguous iterator over non-volatile units as wide as T. kIsContiguous isn't
 /// instantiated for other elements, since it would instantiate the standard containers of those.
-template <class T, class It> constexpr bool StandsForPointer() { // decided at compile time
+template <class T, class It> constexpr bool IsContiguousOver() { // decided at compile time
   if constexpr (!kIsUnit<T, ValueType<It>> || kIsVolatile<It>)
     return false;
   else
@@ -290,7 +290,7 @@ template <class T, class It> UnitSpan<T> Span(It r1, It r2) {
 /// contiguous over units as wide as T: other elements must be converted, and other iterators don't reveal
 /// whether they point into the vector.
 template <class T, class It> auto Source(It r1, It r2) {
-  if constexpr (StandsForPointer<T, It>())
+  if constexpr (IsContiguousOver<T, It>())
     return Span<T>(r1, r2);
   else
     return UnitCopy<T>(r1, r2);
@@ -303,7 +303,7 @@ template <class It> constexpr void RequireForward() {
 
 /// Returns the units of [r1, r2) as a needle. A search reads them more than once, contains() only once.
 template <class T, class It> auto Needle(It r1, It r2) {
-  if constexpr (StandsForPointer<T, It>())
+  if constexpr (IsContiguousOver<T, It>())
     return Span<T>(r1, r2);
   else
     return ValueRange<It>(r1, r2);

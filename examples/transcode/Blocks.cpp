@@ -16,7 +16,7 @@ constexpr ssize_t kMaxUnfinished = 3;
 
 /// The well-formed units at the beginning of a text, and what follows them: nothing, an incomplete sequence,
 /// or a malformed one.
-struct Piece {
+struct Chunk {
   ssize_t size;
   ssize_t malformed;  ///< the number of units of the malformed sequence
   const char* reason; ///< null if there is none
@@ -24,7 +24,7 @@ struct Piece {
 
 /// Finds the first fault of UTF-8 or UTF-16. A sequence at the end that the next block may complete isn't a
 /// fault; a stream decides that.
-template <class T> Piece FindPiece(const T* p, ssize_t n, bool isEnd) {
+template <class T> Chunk FindChunk(const T* p, ssize_t n, bool isEnd) {
   const ssize_t size = mirel::FindMalformed(p, n);
   if (size < 0)
     return {n, 0, nullptr};
@@ -36,7 +36,7 @@ template <class T> Piece FindPiece(const T* p, ssize_t n, bool isEnd) {
   return {size, malformed.length, Describe(malformed.reason)};
 }
 
-Piece FindPieceOfUtf32(const char32_t* p, ssize_t n) {
+Chunk FindChunkOfUtf32(const char32_t* p, ssize_t n) {
   const auto isSurrogate = [](char32_t c) { return c >> 11 == 0xD800 >> 11; };
   const ssize_t size = std::find_if(p, p + n, [&](char32_t c) { return c > 0x10FFFF || isSurrogate(c); }) - p;
   if (size == n)
@@ -45,7 +45,7 @@ Piece FindPieceOfUtf32(const char32_t* p, ssize_t n) {
           isSurrogate(p[size]) ? "surrogate in UTF-32" : Describe(mirel::MalformedReason::kBeyondUnicode)};
 }
 
-Piece FindPieceOfAscii(const char16* p, ssize_t n) {
+Chunk FindChunkOfAscii(const char16* p, ssize_t n) {
   const ssize_t size = LengthBelow(0x80, p, n);
   return {size, size < n, size < n ? "byte above 7F" : nullptr};
 }
@@ -124,8 +124,8 @@ void Blocks::DecodeUtf8(bool isEnd) {
   m_text.clear();
   m_size = DecodeWhole<mirel::Utf8Stream>(m_text, m_buffer.data(), m_filled, isEnd);
   if (m_size < 0)
-    DecodePieces(m_buffer.data(), m_filled,
-                 [isEnd](const char* p, ssize_t n) { return FindPiece(p, n, isEnd); });
+    DecodeChunks(m_buffer.data(), m_filled,
+                 [isEnd](const char* p, ssize_t n) { return FindChunk(p, n, isEnd); });
 }
 
 void Blocks::DecodeUtf16(bool isEnd) {
@@ -142,8 +142,8 @@ void Blocks::DecodeUtf16(bool isEnd) {
   if (m_hasUtf8)
     mirel::Utf16FromUtf8(m_text, m_utf8);
   else
-    DecodePieces(m_units16.data(), m_units16.size(),
-                 [isEnd](const char16* p, ssize_t n) { return FindPiece(p, n, isEnd); });
+    DecodeChunks(m_units16.data(), m_units16.size(),
+                 [isEnd](const char16* p, ssize_t n) { return FindChunk(p, n, isEnd); });
 }
 
 /// Converts all units at once: the fast path. @return how many units make complete sequences, or -1 if one is
@@ -170,7 +170,7 @@ ssize_t Blocks::DecodeWhole(mirel::basic_xstring<CharOut>& dst, const CharIn* p,
 
 void Blocks::DecodeUtf32() {
   ReadUnits(m_units32, m_buffer.data(), m_filled, m_order);
-  DecodePieces(m_units32.data(), static_cast<ssize_t>(m_units32.size()), FindPieceOfUtf32);
+  DecodeChunks(m_units32.data(), static_cast<ssize_t>(m_units32.size()), FindChunkOfUtf32);
 }
 
 void Blocks::DecodeBytes() {
@@ -180,23 +180,23 @@ void Blocks::DecodeBytes() {
     return;
   }
   m_units16.swap(m_text);
-  DecodePieces(m_units16.data(), m_filled, FindPieceOfAscii);
+  DecodeChunks(m_units16.data(), m_filled, FindChunkOfAscii);
 }
 
-/// Decodes the block piece by piece, with a fault after each piece but the last.
-template <class T, class FindPiece> void Blocks::DecodePieces(const T* p, ssize_t n, FindPiece findPiece) {
+/// Decodes the block chunk by chunk, with a fault after each chunk but the last.
+template <class T, class FindChunk> void Blocks::DecodeChunks(const T* p, ssize_t n, FindChunk findChunk) {
   const ssize_t unitSize = UnitSize(m_from.form);
   m_text.clear();
   m_utf8.clear();
   for (ssize_t i = 0;;) {
-    const Piece piece = findPiece(p + i, n - i);
+    const Chunk chunk = findChunk(p + i, n - i);
     if (m_mode != Mode::kCheck)
-      AppendText(m_text, p + i, piece.size);
-    i += piece.size;
+      AppendText(m_text, p + i, chunk.size);
+    i += chunk.size;
     m_size = i * unitSize;
-    if (piece.reason == nullptr || !ContinuesAfter({m_size, piece.reason}, piece.malformed * unitSize))
+    if (chunk.reason == nullptr || !ContinuesAfter({m_size, chunk.reason}, chunk.malformed * unitSize))
       return;
-    i += piece.malformed;
+    i += chunk.malformed;
   }
 }
 

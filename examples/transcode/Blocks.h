@@ -74,7 +74,7 @@ private:
   ssize_t DecodeWhole(mirel::basic_xstring<CharOut>& dst, const CharIn* p, ssize_t n, bool isEnd);
   void DecodeUtf32();
   void DecodeBytes();
-  template <class T, class FindPiece> void DecodePieces(const T* p, ssize_t n, FindPiece findPiece);
+  template <class T, class FindChunk> void DecodeChunks(const T* p, ssize_t n, FindChunk findChunk);
   bool ContinuesAfter(const Fault& fault, ssize_t length);
   ByteOrder OrderByMark() const;
 

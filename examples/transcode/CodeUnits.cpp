@@ -8,10 +8,10 @@ namespace transcode {
 namespace {
 
 bool IsMachineOrder(ByteOrder order) {
-  const char16 one = 1;
-  char first;
-  std::memcpy(&first, &one, 1);
-  return (first == 1) == (order == ByteOrder::kLittle);
+  const char16 unit = 1;
+  char firstByte;
+  std::memcpy(&firstByte, &unit, 1);
+  return (firstByte == 1) == (order == ByteOrder::kLittle);
 }
 
 void SwapBytes(string16& units) {
@@ -84,20 +84,20 @@ std::string_view BytesOf(const string16& s) {
   return {reinterpret_cast<const char*>(s.data()), 2 * static_cast<std::size_t>(s.size())};
 }
 
-std::string_view Encode(const string16& text, Form form, ByteOrder order, Room& room) {
+std::string_view Encode(const string16& text, Form form, ByteOrder order, Scratch& scratch) {
   switch (form) {
-  case Form::kUtf8: mirel::Utf8FromUtf16(room.bytes, text); break;
+  case Form::kUtf8: mirel::Utf8FromUtf16(scratch.bytes, text); break;
   case Form::kUtf16:
     if (IsMachineOrder(order))
       return BytesOf(text);
-    room.units = text;
-    SwapBytes(room.units);
-    return BytesOf(room.units);
-  case Form::kUtf32: Utf32FromUtf16(room.bytes, text, order); break;
+    scratch.units = text;
+    SwapBytes(scratch.units);
+    return BytesOf(scratch.units);
+  case Form::kUtf32: Utf32FromUtf16(scratch.bytes, text, order); break;
   case Form::kLatin1:
-  case Form::kAscii: NarrowUnits(room.bytes, text); break;
+  case Form::kAscii: NarrowUnits(scratch.bytes, text); break;
   }
-  return BytesOf(room.bytes);
+  return BytesOf(scratch.bytes);
 }
 
 } // namespace transcode

@@ -31,11 +31,11 @@ std::string_view BytesOf(const string8& s);
 std::string_view BytesOf(const string16& s);
 
 /// Storage for the result of Encode().
-struct Room {
+struct Scratch {
   string16 units;
   string8 bytes;
 };
-/// Encodes a text in a form that has all its code points. The result refers to the text or to the room.
-std::string_view Encode(const string16& text, Form form, ByteOrder order, Room& room);
+/// Encodes a text in a form that has all its code points. The result refers to the text or to the scratch.
+std::string_view Encode(const string16& text, Form form, ByteOrder order, Scratch& scratch);
 
 } // namespace transcode

@@ -18,12 +18,12 @@ std::string_view Outgoing::Encode(Blocks& block) {
   if (isAsItWas && m_to.form == Form::kUtf8)
     return block.Utf8();
   if (isAsItWas)
-    return transcode::Encode(text, m_to.form, m_order, m_room);
+    return transcode::Encode(text, m_to.form, m_order, m_scratch);
   m_text.clear();
   if (getsMark)
     m_text.push_back(kByteOrderMark);
   AppendLines(text.begin() + hasMark, text.end());
-  return transcode::Encode(m_text, m_to.form, m_order, m_room);
+  return transcode::Encode(m_text, m_to.form, m_order, m_scratch);
 }
 
 std::string_view Outgoing::EndFile() {
@@ -31,7 +31,7 @@ std::string_view Outgoing::EndFile() {
   if (m_keepsCr)
     m_text.push_back('\r');
   m_keepsCr = false;
-  return transcode::Encode(m_text, m_to.form, m_order, m_room);
+  return transcode::Encode(m_text, m_to.form, m_order, m_scratch);
 }
 
 /// Leaves out the mark, and replaces, drops or stops at code points that the encoding lacks.

@@ -56,7 +56,7 @@ private:
   int64 m_unmappableCount = 0;
   string16 m_fitting; ///< the text without what the encoding lacks
   string16 m_text;    ///< the text with other line ends, or another beginning
-  Room m_room;
+  Scratch m_scratch;
 };
 
 } // namespace transcode

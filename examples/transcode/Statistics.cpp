@@ -95,7 +95,7 @@ bool Statistics::IsSameAfterRoundTrip(Blocks& block) {
   const bool isUtf8 = block.From() == Form::kUtf8; // the text has been converted to UTF-16 already
   if (!isUtf8)
     mirel::Utf16FromUtf8(m_roundTripText, block.Utf8());
-  return Encode(isUtf8 ? block.Text() : m_roundTripText, block.From(), block.Order(), m_room) ==
+  return Encode(isUtf8 ? block.Text() : m_roundTripText, block.From(), block.Order(), m_scratch) ==
          block.Bytes();
 }
 

@@ -42,7 +42,7 @@ private:
   int64 m_line = 0; ///< code points of the line that continues in the next block
   bool m_isSameAfterRoundTrip = true;
   string16 m_roundTripText;
-  Room m_room;
+  Scratch m_scratch;
 };
 
 } // namespace transcode

@@ -1,5 +1,5 @@
 // What the conversions, checks and counts share: AppendUtf() is in Utf.cpp, FindMalformed(), ReasonOf() and
-// CutOffAtEnd() in Malformed.cpp, and Measure() in Lengths.cpp.
+// IncompleteAtEnd() in Malformed.cpp, and Measure() in Lengths.cpp.
 
 #pragma once
 
@@ -40,15 +40,15 @@ MalformedReason ReasonOf(const char16* p, const char16* end, const Sequence& seq
 
 /// Returns how many units at the end of [begin, end), which isn't empty, begin a sequence that further units
 /// may complete.
-ssize_t CutOffAtEnd(const char8* begin, const char8* end);
-ssize_t CutOffAtEnd(const char16* begin, const char16* end);
+ssize_t IncompleteAtEnd(const char8* begin, const char8* end);
+ssize_t IncompleteAtEnd(const char16* begin, const char16* end);
 
 /// Skips whole groups of eight ASCII bytes at the beginning of a text that the kernels don't take. SWAR (SIMD
 /// within a register) checks 14 bytes in half the time of a loop over single bytes.
 inline const char8* SkipAscii(const char8* p, const char8* end) {
-  for (uint64_t word = 0; end - p >= ssize_t(sizeof(word)); p += sizeof(word)) {
-    std::memcpy(&word, p, sizeof(word));
-    if ((word & 0x8080808080808080) != 0)
+  for (uint64_t bytes = 0; end - p >= ssize_t(sizeof(bytes)); p += sizeof(bytes)) {
+    std::memcpy(&bytes, p, sizeof(bytes));
+    if ((bytes & 0x8080808080808080) != 0)
       break;
   }
   return p;

@@ -119,10 +119,10 @@ template <class Unit> HWY_INLINE const uint8_t* BytesOf(const Unit* p) {
 }
 template <class Unit> HWY_INLINE uint8_t* BytesOf(Unit* p) { return reinterpret_cast<uint8_t*>(p); }
 
-template <class Word> HWY_INLINE uint64_t LoadWord(const uint8_t* p) {
-  Word word;
-  std::memcpy(&word, p, sizeof(word));
-  return word;
+template <class Integer> HWY_INLINE uint64_t LoadUnaligned(const uint8_t* p) {
+  Integer x;
+  std::memcpy(&x, p, sizeof(x));
+  return x;
 }
 
 /// Loads the given number of units, at most 16 bytes of them, followed by zeros.
@@ -132,11 +132,11 @@ template <class Unit> HWY_INLINE hn::Vec<Narrow> LoadPart(const Unit* from, ssiz
   const ssize_t bytes = units * ssize_t(sizeof(Unit)), n = bytes < 16 ? bytes : 16;
   uint64_t low = 0, high = 0;
   if (n >= 8) {
-    low = LoadWord<uint64_t>(p);
+    low = LoadUnaligned<uint64_t>(p);
     // Two shifts, since a single one by 64 bits, if n is 8, would be undefined.
-    high = LoadWord<uint64_t>(p + n - 8) >> 4 * (16 - n) >> 4 * (16 - n);
+    high = LoadUnaligned<uint64_t>(p + n - 8) >> 4 * (16 - n) >> 4 * (16 - n);
   } else if (n >= 4) {
-    low = LoadWord<uint32_t>(p) | LoadWord<uint32_t>(p + n - 4) << 8 * (n - 4);
+    low = LoadUnaligned<uint32_t>(p) | LoadUnaligned<uint32_t>(p + n - 4) << 8 * (n - 4);
   } else if (n > 0) {
     low = p[0] | uint64_t{p[n / 2]} << 8 * (n / 2) | uint64_t{p[n - 1]} << 8 * (n - 1);
   }

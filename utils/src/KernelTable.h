@@ -44,7 +44,7 @@ template <class T> struct Measured {
 
 /// What one instruction set offers for text of one width. The conversions read nothing outside [p, end) and
 /// write nothing outside [out, outEnd), but may write more of it than they report. skip() and measure() take
-/// no text of fewer than kLeastForKernels units: for UTF-16 they read a whole block that ends
+/// no text of fewer than kMinUnitsForKernels units: for UTF-16 they read a whole block that ends
 /// with the text.
 template <class T> struct UnitKernels {
   using Out = OtherUnit<T>;
@@ -72,7 +72,7 @@ struct Kernels : UnitKernels<char8>, UnitKernels<char16> {
 /// The fewest units for which a kernel that checks or counts pays: a shorter text is decoded one code point
 /// at a time in the time that a kernel takes to copy it into a block. It can't be below 16: the kernels for
 /// UTF-16 read a whole block that ends with the text. Conversions have no such limit.
-constexpr ssize_t kLeastForKernels = 24;
+constexpr ssize_t kMinUnitsForKernels = 24;
 
 /// Once the scalar path decodes malformed text, it goes on until this many units in a row are well-formed:
 /// where malformed sequences are dense, the kernels would be tried in vain.

@@ -30,7 +30,7 @@ template <class T> Lengths Measure(const Kernels* kernels, const T* p, const T* 
   const UnitKernels<T>* const k = kernels;
   Lengths lengths{0, 0};
   while (p != end) {
-    const bool hasKernels = k != nullptr && end - p >= kLeastForKernels;
+    const bool hasKernels = k != nullptr && end - p >= kMinUnitsForKernels;
     if (hasKernels) {
       const Measured<T> measured = k->measure(p, end);
       lengths.codePoints += measured.lengths.codePoints;

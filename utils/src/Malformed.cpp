@@ -44,7 +44,7 @@ MalformedReason ReasonOf(const char16*, const char16*, const Sequence& sequence)
   return sequence.isWellFormed ? MalformedReason::kNone : MalformedReason::kUnpairedSurrogate;
 }
 
-ssize_t CutOffAtEnd(const char8* begin, const char8* end) {
+ssize_t IncompleteAtEnd(const char8* begin, const char8* end) {
   for (int k = 1; k <= 3 && end - begin >= k; ++k)
     if (const char8* const p = end - k; !IsContinuation(*p)) {
       const Sequence sequence = Decode(p, end);
@@ -53,11 +53,11 @@ ssize_t CutOffAtEnd(const char8* begin, const char8* end) {
   return 0;
 }
 
-ssize_t CutOffAtEnd(const char16*, const char16* end) { return IsHighSurrogate(end[-1]) ? 1 : 0; }
+ssize_t IncompleteAtEnd(const char16*, const char16* end) { return IsHighSurrogate(end[-1]) ? 1 : 0; }
 
 template <class T> const T* FindMalformed(const Kernels* kernels, const T* p, const T* end) {
   const UnitKernels<T>* const k = kernels;
-  p = k != nullptr && end - p >= kLeastForKernels ? k->skip(p, end) : SkipAscii(p, end);
+  p = k != nullptr && end - p >= kMinUnitsForKernels ? k->skip(p, end) : SkipAscii(p, end);
   while (p != end) {
     const Sequence sequence = Decode(p, end);
     if (!sequence.isWellFormed)

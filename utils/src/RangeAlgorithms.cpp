@@ -12,9 +12,9 @@ namespace mirel::detail {
 namespace {
 
 /// A set of code units, one bit for each possible unit.
-template <class T> class UnitBits {
+template <class T> class UnitBitset {
 public:
-  UnitBits(const T* y1, const T* y2) {
+  UnitBitset(const T* y1, const T* y2) {
     for (; y1 != y2; ++y1)
       m_words[UnitValue(*y1) / 64] |= uint64_t(1) << UnitValue(*y1) % 64;
   }
@@ -25,15 +25,15 @@ private:
 };
 
 /// Returns the first unit of [p, end) that is in [y1, y2) or, if !isMember, isn't; end if there is none. The
-/// UnitBits are filled only if comparing with each member finds nothing in the first `near` units.
+/// UnitBitset is filled only if comparing with each member finds nothing in the first `near` units.
 template <class It, class T> It FindInSet(It p, It end, const T* y1, const T* y2, bool isMember) {
-  const ssize_t near = 8 + ssize_t(sizeof(UnitBits<T>) / 8 / (std::size_t(y2 - y1) + 1));
+  const ssize_t near = 8 + ssize_t(sizeof(UnitBitset<T>) / 8 / (std::size_t(y2 - y1) + 1));
   for (const It stop = end - p < near ? end : p + near; p != stop; ++p)
     if ((mirel::Find(y1, y2, *p) != y2) == isMember)
       return p;
   if (p == end)
     return p;
-  const UnitBits<T> set(y1, y2);
+  const UnitBitset<T> set(y1, y2);
   while (p != end && set.Has(*p) != isMember)
     ++p;
   return p;

@@ -194,7 +194,7 @@ bool Utf8FromUtf16(string8& dst, std::u16string_view text) {
     const std::size_t n = std::min(text.size(), std::size(part));
     std::memcpy(part, text.data(), n * sizeof(char16));
     // A surrogate pair that the part's end would cut off is left to the next part.
-    const ssize_t cutOff = n < text.size() ? detail::CutOffAtEnd(part, part + n) : 0;
+    const ssize_t cutOff = n < text.size() ? detail::IncompleteAtEnd(part, part + n) : 0;
     isWellFormed = detail::AppendStrict(dst, part, static_cast<ssize_t>(n) - cutOff);
     text.remove_prefix(n - static_cast<std::size_t>(cutOff));
   }

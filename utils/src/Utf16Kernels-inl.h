@@ -72,10 +72,11 @@ template <class Tag> struct Utf16Block {
 
   /// Stores any block. Returns the end of its bytes.
   template <bool kHasSurrogates> HWY_INLINE uint8_t* StoreThree(const UnitMasks& masks, uint8_t* out) const {
-    const auto marker = Broadcast(d, 0x80), lead3 = hn::Or(Right<4>(d, high, 0x0F), Broadcast(d, 0xE0));
+    const auto continuation = Broadcast(d, 0x80), lead3 = hn::Or(Right<4>(d, high, 0x0F), Broadcast(d, 0xE0));
     auto first = Select(IsNonAscii(d, ThreeBytes()), lead3, hn::Or(UpperBits(0x1F), Broadcast(d, 0xC0)));
     first = Select(IsNonAscii(d, NonAscii()), first, low);
-    auto middle = hn::Or(UpperBits(0x3F), marker), last = hn::Or(hn::And(low, Broadcast(d, 0x3F)), marker);
+    auto middle = hn::Or(UpperBits(0x3F), continuation),
+         last = hn::Or(hn::And(low, Broadcast(d, 0x3F)), continuation);
     if constexpr (kHasSurrogates) {
       // A high surrogate gives the first three bytes, the third with bits of the low surrogate. The low
       // surrogate gives the last byte.
@@ -84,25 +85,25 @@ template <class Tag> struct Utf16Block {
       const auto lead4 = hn::Or(Right<2>(d, upper, 0x07), Broadcast(d, 0xF0));
       first = Select(isLow, last, Select(isHigh, lead4, first));
       const auto second = hn::Or(Left<4>(d, upper, 0x30), Right<2>(d, low, 0x0F));
-      middle = Select(isHigh, hn::Or(second, marker), middle);
+      middle = Select(isHigh, hn::Or(second, continuation), middle);
       const auto third = hn::Or(Left<4>(d, low, 0x30),
                                 hn::And(Window<1>(d, UpperBits(0x0F), hn::Zero(d)), Broadcast(d, 0x0F)));
-      last = Select(isHigh, hn::Or(third, marker), last);
+      last = Select(isHigh, hn::Or(third, continuation), last);
     }
     // Four bytes for each unit: first, first, middle, last. The masks of even and of odd groups of four units
     // are kept apart, so that both masks of a group stand side by side.
     const ToUnits<D> du;
     const auto leads0 = hn::BitCast(du, hn::InterleaveLower(d, first, first));
     const auto leads1 = hn::BitCast(du, hn::InterleaveUpper(d, first, first));
-    const auto rests0 = hn::BitCast(du, hn::InterleaveLower(d, middle, last));
-    const auto rests1 = hn::BitCast(du, hn::InterleaveUpper(d, middle, last));
+    const auto continuations0 = hn::BitCast(du, hn::InterleaveLower(d, middle, last));
+    const auto continuations1 = hn::BitCast(du, hn::InterleaveUpper(d, middle, last));
     const uint64_t even = (masks.two & 0x0F0F0F0F) << 4 | (masks.three & 0x0F0F0F0F) << 8;
     const uint64_t odd = (masks.two & 0xF0F0F0F0) | (masks.three & 0xF0F0F0F0) << 4;
     return StoreHalves<4, 1>(d,
-                             {hn::BitCast(d, hn::InterleaveLower(du, leads0, rests0)),
-                              hn::BitCast(d, hn::InterleaveUpper(du, leads0, rests0)),
-                              hn::BitCast(d, hn::InterleaveLower(du, leads1, rests1)),
-                              hn::BitCast(d, hn::InterleaveUpper(du, leads1, rests1))},
+                             {hn::BitCast(d, hn::InterleaveLower(du, leads0, continuations0)),
+                              hn::BitCast(d, hn::InterleaveUpper(du, leads0, continuations0)),
+                              hn::BitCast(d, hn::InterleaveLower(du, leads1, continuations1)),
+                              hn::BitCast(d, hn::InterleaveUpper(du, leads1, continuations1))},
                              kKeepThreeBytes, {even, odd, even >> 8, odd >> 8}, out);
   }
 

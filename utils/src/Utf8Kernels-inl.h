@@ -61,7 +61,7 @@ template <class D> HWY_INLINE void StoreWidened(D d, hn::Vec<D> bytes, uint8_t* 
 
 /// Returns how many bytes before end begin a sequence that end cuts off; at least three bytes precede end.
 /// It reads only those three, so it tells where the next block begins long before the masks do.
-HWY_INLINE ssize_t CutOff(const uint8_t* end) {
+HWY_INLINE ssize_t IncompleteAtEnd(const uint8_t* end) {
   const uint32_t isLead =
       uint32_t{end[-1] >= 0xC0} | uint32_t{end[-2] >= 0xE0} << 1 | uint32_t{end[-3] >= 0xF0} << 2;
   return static_cast<ssize_t>((hwy::Num0BitsBelowLS1Bit_Nonzero32(isLead | 8) + 1) % 4);
@@ -166,7 +166,7 @@ template <int kVectors, class D> struct Utf8Block {
         StoreWidened(D(), Get<0>(k), out - 2 * from + 2 * k * kLanes<D>);
       return {to - from, to - from};
     }
-    const ssize_t stop = to == kUnits ? kUnits - CutOff(p + kUnits) : to;
+    const ssize_t stop = to == kUnits ? kUnits - IncompleteAtEnd(p + kUnits) : to;
     // A lead byte that is cut off is checked as well: it may stand where a continuation byte is missing.
     const uint64_t checked = FirstBits(stop + 1) & ~FirstBits(from), positions = checked & FirstBits(stop);
     const uint64_t continuations = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC2); });
@@ -209,12 +209,12 @@ template <int kVectors, class D> struct Utf8Block {
     const uint64_t allNonAscii = BitsAt<0>();
     const uint64_t allContinuations = Bits([](auto v, auto) HWY_ATTR { return IsFrom80Below(D(), v, 0xC0); });
     // The last byte may begin a sequence if it is in [C2, F5). If it can't, the next block's place is
-    // known without CutOff(); waiting for that takes twice as long as all else here.
+    // known without IncompleteAtEnd(); waiting for that takes twice as long as all else here.
     if (allContinuations == 0 && static_cast<uint8_t>(p[kUnits - 1] - 0xC2) >= 0xF5 - 0xC2) {
       StoreLoneBytes(out);
       return {{kUnits, kUnits}, Count(allNonAscii)};
     }
-    const ssize_t stop = kUnits - CutOff(p + kUnits);
+    const ssize_t stop = kUnits - IncompleteAtEnd(p + kUnits);
     const uint64_t continuations = allContinuations & FirstBits(stop);
     const uint64_t highest2 = allNonAscii & ~continuations;
     // The lead bytes that the next byte may follow, if it is a continuation byte.

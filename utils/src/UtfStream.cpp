@@ -40,7 +40,7 @@ ssize_t UtfStream<CharOut, CharIn>::CompletePending(basic_xstring<CharOut>& dst,
   const ssize_t n = std::min(pn, ssize_t(std::size(units)) - m_pending);
   std::copy_n(p, n, units + m_pending);
   const ssize_t all = m_pending + n, taken = detail::Decode(units, units + all).length - m_pending;
-  if (detail::CutOffAtEnd(units, units + all) == all) {
+  if (detail::IncompleteAtEnd(units, units + all) == all) {
     std::copy_n(p, n, m_kept + m_pending);
     m_pending = all;
     return n;
@@ -59,7 +59,7 @@ bool UtfStream<CharOut, CharIn>::Append(basic_xstring<CharOut>& dst, const CharI
   while (m_pending != 0 && p != end) // none is pending once the stream has stopped
     p += CompletePending(dst, p, end - p);
   if (p != end && !HasStopped()) {
-    const ssize_t cutOff = detail::CutOffAtEnd(p, end);
+    const ssize_t cutOff = detail::IncompleteAtEnd(p, end);
     Convert(dst, p, end - p - cutOff, end);
     m_pending = HasStopped() ? 0 : cutOff;
     std::copy_n(end - cutOff, m_pending, m_kept);

@@ -101,7 +101,7 @@ template <bool kIsCounted> HWY_INLINE Measured<char8> ScanUtf8(const char8* cons
       scan.followsAscii = true; // zeros follow the text
     }
   }
-  const ssize_t cutOff = scan.followsAscii ? 0 : CutOff(BytesOf(p)); // left to the scalar path
+  const ssize_t cutOff = scan.followsAscii ? 0 : IncompleteAtEnd(BytesOf(p)); // left to the scalar path
   const ssize_t codePoints = p - begin - scan.continuations - (cutOff > 0);
   p -= cutOff;
   return {p, {codePoints, codePoints + scan.fourBytes - (cutOff > 0 && UnitValue(*p) >= 0xF0)}};

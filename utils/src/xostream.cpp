@@ -23,7 +23,7 @@ public:
   explicit IndentingBuffer(IOutputStream& os) : sink(&os) {}
 
   /// Writes the block to the sink. Every member of xostream that writes ends with this call.
-  void Deliver() { HandOver(block, filled); }
+  void FlushBlock() { WriteToSink(block, filled); }
 
   IOutputStream* sink; ///< null once closed
   ssize_t indent = 0;
@@ -49,7 +49,7 @@ protected:
   }
 
   int sync() override {
-    Deliver();
+    FlushBlock();
     if (sink != nullptr)
       sink->FlushStream();
     return 0;
@@ -62,7 +62,7 @@ private:
   void AddIndent() {
     while (gathered < indent) {
       if (filled == kBlockSize)
-        Deliver();
+        FlushBlock();
       const ssize_t n = std::min(indent - gathered, kBlockSize - filled);
       std::memset(block + filled, ' ', static_cast<std::size_t>(n));
       filled += n;
@@ -73,14 +73,14 @@ private:
   /// Adds text that needs no indent.
   void Add(const char* p, ssize_t n) {
     if (n >= kBlockSize) {
-      Deliver();
+      FlushBlock();
       gathered = After(p, n);
-      return HandOver(p, n);
+      return WriteToSink(p, n);
     }
     const ssize_t fitting = std::min(n, kBlockSize - filled);
     Copy(p, fitting);
     if (fitting < n) {
-      Deliver();
+      FlushBlock();
       Copy(p + fitting, n - fitting);
     }
   }
@@ -97,7 +97,7 @@ private:
 
   /// Writes bytes to the sink. If it throws, they count as not written and are dropped, because the exception
   /// tells the caller of them. The next bytes get the part of the indent that is still missing.
-  void HandOver(const char* p, ssize_t n) {
+  void WriteToSink(const char* p, ssize_t n) {
     const ssize_t after = std::exchange(gathered, written);
     filled = 0;
     if (sink != nullptr && n > 0)
@@ -151,7 +151,7 @@ public:
 
   void PutBytes(const char* p, ssize_t pn) {
     buffer.sputn(p, pn);
-    buffer.Deliver();
+    buffer.FlushBlock();
   }
 
   /// Writes a number or an address. It clears the state first: a sink that threw during an earlier one has
@@ -159,7 +159,7 @@ public:
   template <class X> void Put(X x) {
     clear();
     *this << x;
-    buffer.Deliver();
+    buffer.FlushBlock();
   }
 
   detail::IndentingBuffer buffer;
@@ -171,7 +171,7 @@ xostream::xostream(IOutputStream& os) : m_os(new IndentingOutputStreamToOStream(
 xostream::~xostream() { delete m_os; }
 
 void xostream::close() {
-  m_os->buffer.Deliver();
+  m_os->buffer.FlushBlock();
   if (IOutputStream* const sink = std::exchange(m_os->buffer.sink, nullptr))
     sink->FlushStream();
 }
