@@ -11,7 +11,7 @@ namespace mirel {
 enum class MalformedReason {
   kNone,                   ///< It is well-formed.
   kTruncated,              ///< The end of the text, or a non-continuation byte, cuts the sequence off.
-  kUnexpectedContinuation, ///< A byte 80 to BF that continues no sequence, as after a malformed lead byte.
+  kUnexpectedContinuation, ///< A byte 80 to BF that continues no sequence, as after a malformed one.
   kOverlong,               ///< A longer sequence than the code point needs; C0 and C1 begin nothing else.
   kSurrogate,              ///< A surrogate, D800 to DFFF, encoded in UTF-8.
   kBeyondUnicode,          ///< A value above U+10FFFF: F4 followed by 90 to BF.

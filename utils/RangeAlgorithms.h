@@ -16,7 +16,7 @@
 namespace mirel {
 
 /// @name Comparing ranges
-/// A range is a pair of pointers or iterators, the second one past the last element. Code units compare as
+/// A range is a pair of pointers or iterators; the second points past the last element. Code units compare as
 /// unsigned values in both widths. An empty range may be a pair of null pointers. At worst the cost is linear
 /// in the shorter length.
 /// @snippet examples/reference.cpp comparing ranges

@@ -1,9 +1,9 @@
 /// @file
 /// Sequences: the code units of one code point, decoded and encoded.
 ///
-/// It knows pointers to code units, neither strings nor kernels. Ranges of code points, checks and counts
-/// decode by it what no kernel does, and so do lossy conversions from malformed text on. Up to there all
-/// conversions have a scalar path of their own.
+/// It knows pointers to code units, neither strings nor kernels. Ranges of code points use it; checks and
+/// counts use it for text that no kernel handles. The conversions have a scalar path of their own for
+/// well-formed text; lossy ones use this file from malformed text on.
 
 #pragma once
 

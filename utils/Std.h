@@ -223,7 +223,7 @@ std::basic_ostream<char, Traits>& operator<<(std::basic_ostream<char, Traits>& o
 ///       ;
 ///
 /// Over many calls, each unit is moved a constant number of times on average. If f throws, the contents stay
-/// as they were. f may not use dst.
+/// as they were, and so they do if a failed allocation throws std::bad_alloc. f may not use dst.
 /// @pre "0 <= most"; then, for f's result, "0 <= filled && filled <= most"
 /// @return what f returned, as an ssize_t
 template <class T, class N, class F, detail::IfIntegers<N> = 0>

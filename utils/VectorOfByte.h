@@ -36,7 +36,7 @@ struct Storage; // gives the conversions and FillFrom() access to a vector's sto
 ///
 /// A source that lies in the buffer itself gives the result as if it had been copied first. Bad arguments
 /// stop the process with the text after "@pre", before anything has changed. A source is checked after all
-/// offsets and counts: it may not be reversed, nor its beginning be null unless its end is.
+/// offsets and counts: it may not be reversed, nor may its beginning be null unless its end is.
 /// @pre "src1 == src2 || (src1 < src2 && src1 != nullptr && dst != nullptr)" of each source
 ///
 /// A failed allocation throws std::bad_alloc before anything has changed. Whatever may grow the buffer may
@@ -96,7 +96,7 @@ public:
   void growbytes(ssize_t count) {
     MIREL_ASSERT(0 <= count);
     if (count <= m_capacity - size_)
-      size_ += count; // all that insertbytes() does at the end if there is room
+      size_ += count; // all that insertbytes(size(), count) does if there is room
     else
       insertbytes(size(), count);
   }

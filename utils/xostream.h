@@ -76,7 +76,7 @@ public:
   /// @name Writing values
   /// Write values as `<<` of the standard streams does, padded to width(), which is 0 again afterwards. Wide
   /// characters are written as UTF-8, and as U+FFFD if they aren't Unicode scalar values. The `<<` of an
-  /// xostream takes strings and manipulators only.
+  /// xostream takes 8-bit strings and manipulators only.
   /// @snippet examples/reference.cpp writing values
   /// @{
 

@@ -92,7 +92,7 @@ template <class M, class V> HWY_INLINE V Select(M mask, V yes, V no) {
 #endif
 }
 
-/// The k-th 16 bytes of a vector.
+/// Returns the k-th 16 bytes of a vector, k counted from 0.
 template <int k, class D> HWY_INLINE hn::Vec<Narrow> SixteenBytes(D, hn::Vec<D> v) {
   if constexpr (kLanes<D> == 16)
     return v;

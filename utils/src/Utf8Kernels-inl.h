@@ -18,8 +18,8 @@ namespace {
 /// The low and the high bytes of UTF-16 units.
 template <class D> struct Planes { hn::Vec<D> low, high; };
 
-/// The units of the code points that would begin with the bytes of a, if b and c hold the bytes one and two
-/// places further on.
+/// Returns the units of the code points that would begin with the bytes of a, if b and c hold the bytes one
+/// and two places further on.
 template <int kMaxBytes, class D>
 HWY_INLINE Planes<D> UnitsOf(D d, hn::Vec<D> a, hn::Vec<D> b, hn::Vec<D> c) {
   const auto isTwo = IsFrom80Below(d, a, 0xE0); // or a continuation byte
@@ -108,8 +108,8 @@ template <int kVectors, class D> struct Utf8Block {
 
   HWY_INLINE bool IsAscii() const { return BitsAt<0>() == 0; }
 
-  /// Returns the positions of lead bytes that the next byte, if it is a continuation byte, may not follow:
-  /// the sequence would be overlong, a surrogate, or above U+10FFFF.
+  /// Returns the positions of lead bytes from E0 on that the next byte, if it is a continuation byte, may not
+  /// follow: the sequence would be overlong, a surrogate, or above U+10FFFF.
   template <bool kHasFourBytes> HWY_INLINE uint64_t BadLeads() const {
     return Bits([](auto lead, auto next) HWY_ATTR {
       const D d;

@@ -154,7 +154,7 @@ public:
     buffer.FlushBlock();
   }
 
-  /// Writes a number or an address. It clears the state first: a sink that threw during an earlier one has
+  /// Writes a number or an address. It clears the state first: a sink that threw within an earlier `<<` has
   /// left badbit.
   template <class X> void Put(X x) {
     clear();
