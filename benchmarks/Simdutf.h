@@ -15,7 +15,7 @@ using SimdutfContender = std::pair<std::string, const simdutf::implementation*>;
 /// Returns simdutf's kernels for the instructions that ours use, if it has such, and its best ones for this
 /// processor.
 inline const std::vector<SimdutfContender>& Simdutf() {
-  static const auto kParties = [] {
+  static const auto kContenders = [] {
     const std::string ours = mirel::KernelName();
     const char* const same = ours == "AVX2"   ? "haswell"
                              : ours == "SSE4" ? "westmere"
@@ -28,6 +28,6 @@ inline const std::vector<SimdutfContender>& Simdutf() {
     contenders.emplace_back("simdutf, best", all.detect_best_supported());
     return contenders;
   }();
-  return kParties;
+  return kContenders;
 }
 #endif

@@ -3,8 +3,8 @@
 
 usage: report.py OUTPUT-DIRECTORY NAME=RESULTS.json...
 
-A ratio is the peer's time divided by ours: above 1 we are ahead. The contenders run many times, interleaved at random; the
-ratio is that of the medians. A ratio for several texts is their geometric mean.
+A ratio is the peer's time divided by ours: above 1 we are ahead. The contenders run many times, interleaved at random;
+the ratio is that of the medians. A ratio for several texts is their geometric mean.
 """
 
 import collections

@@ -8,8 +8,7 @@ tools/mutants.txt lists the mutants: a file's name, and below it pairs of lines,
 and its replacement, with \\n for the end of a line. Each mutant is built in a copy of the tree, one copy for each
 processor, with the address sanitizer, which notices errors that happen to do no harm on this machine. A file marked
 "Release" gets an ordinary build, whose tests alone must notice. A mutant with an endless loop is killed when its time is
-up. Exits with 1 if a mutant survives, doesn't compile
-or no longer fits the source.
+up. Exits with 1 if a mutant survives, doesn't compile or no longer fits the source.
 """
 
 import argparse

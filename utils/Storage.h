@@ -23,7 +23,8 @@ struct Storage {
   template <class T> static void SetSize(xvector<T>& v, ssize_t size) {
     v.m_buffer.size_ = size * ssize_t(sizeof(T));
   }
-  /// Reduces the storage to capacity elements: at least 1, and no fewer than v has.
+  /// Reduces the storage to capacity elements, if it is larger. capacity must be at least 1 and at least the
+  /// size.
   template <class T> static void Shrink(xvector<T>& v, ssize_t capacity) {
     if (capacity < v.capacity())
       v.m_buffer.Shrink(capacity * ssize_t(sizeof(T)));

@@ -11,6 +11,7 @@
 #include <type_traits>
 #include <utility>
 
+#include "BasicTypes.h"
 #include "Integers.h"
 #include "NotOffered.h"
 #include "Precondition.h"

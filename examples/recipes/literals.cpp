@@ -1,5 +1,5 @@
-// u"..." literals and std::u16string, in and out. char16_t is a different type from char16, and a pointer to one
-// may not be used as a pointer to the other; members that take iterators convert unit by unit.
+// u"..." literals and std::u16string, in and out. char16_t is a different type from char16, and a pointer to
+// one may not be used as a pointer to the other; members that take iterators convert unit by unit.
 
 #include <cstdio>
 #include <string>

@@ -1,5 +1,5 @@
-// Reads a whole file into a string. FillFrom() lets the reader write directly into the string's storage, so
-// no byte is written twice.
+// Reads a whole file into a string. FillFrom() lets the reader write directly into the string's storage,
+// which isn't filled with zeros first.
 
 #include <algorithm>
 #include <cerrno>

@@ -81,7 +81,7 @@ int main() {
   FileSink file(stdout);
   WriteGreeting(file);
 
-  // More than a socket takes at once, to a reader in another thread.
+  // Write more than a socket takes at once; another thread reads it.
   int ends[2];
   Check(socketpair(AF_UNIX, SOCK_STREAM, 0, ends) == 0);
   Check(fcntl(ends[0], F_SETFL, O_NONBLOCK) == 0);

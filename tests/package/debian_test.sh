@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Installs the packages in a minimal chroot, uses them as README.md and the tutorial say, removes them, and looks for files
-# that are left.
+# Installs the packages in a minimal chroot, uses them as README.md and the tutorial say, removes them, and looks for
+# files that are left.
 # usage: debian_test.sh DIRECTORY-OF-PACKAGES ROOT.tar ROOT
 set -euo pipefail
 packages=$1 base=$2 root=$3

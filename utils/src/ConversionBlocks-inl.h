@@ -11,14 +11,10 @@
 // block to the next. The last block ends where the text ends. It overlaps what has been converted, and may
 // store that part again.
 //
-// The guard lets the file in once for each instruction set.
+// Kernels.cpp undefines the guard after each instruction set.
 
-#if defined(MIREL_CONVERSION_BLOCKS_TOGGLE) == defined(HWY_TARGET_TOGGLE)
-#ifdef MIREL_CONVERSION_BLOCKS_TOGGLE
-#undef MIREL_CONVERSION_BLOCKS_TOGGLE
-#else
-#define MIREL_CONVERSION_BLOCKS_TOGGLE
-#endif
+#ifndef MIREL_CONVERSION_BLOCKS
+#define MIREL_CONVERSION_BLOCKS
 
 #include <cstddef>
 #include <cstdint>

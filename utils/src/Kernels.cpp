@@ -27,6 +27,9 @@
 #include "Utf16Kernels-inl.h"
 #include "Utf8Kernels-inl.h"
 #include "ValidationKernels-inl.h"
+#undef MIREL_CONVERSION_BLOCKS
+#undef MIREL_UTF16_KERNELS
+#undef MIREL_UTF8_KERNELS
 
 namespace mirel::detail::HWY_NAMESPACE {
 namespace {

@@ -1,13 +1,9 @@
 // UTF-8 and ASCII to UTF-16 in SIMD instructions, compiled once for each instruction set by Kernels.cpp.
 //
-// The guard lets the file in once for each instruction set.
+// Kernels.cpp undefines the guard after each instruction set.
 
-#if defined(MIREL_UTF8_KERNELS_TOGGLE) == defined(HWY_TARGET_TOGGLE)
-#ifdef MIREL_UTF8_KERNELS_TOGGLE
-#undef MIREL_UTF8_KERNELS_TOGGLE
-#else
-#define MIREL_UTF8_KERNELS_TOGGLE
-#endif
+#ifndef MIREL_UTF8_KERNELS
+#define MIREL_UTF8_KERNELS
 
 #include "ConversionBlocks-inl.h"
 

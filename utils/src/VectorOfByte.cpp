@@ -196,4 +196,6 @@ int VectorOfByte::compare(ssize_t i, ssize_t n, const value_type* p, ssize_t pn)
   return LexicographicalCompareX(begin() + i, begin() + i + n, p, p + pn);
 }
 
+#undef ASSERT_SOURCE
+
 } // namespace mirel
