@@ -63,7 +63,7 @@ const detail::Kernels* detail::KernelsAt([[maybe_unused]] int k) {
   if (k-- == 0)
     return &N_NEON::kKernels;
 #endif
-#if HWY_TARGETS & HWY_AVX2
+#if HWY_TARGETS & HWY_AVX2 // in 64-bit programs: Highway doesn't compile it for 32 bits
   if (HAS("avx2") & HAS("bmi") & HAS("bmi2") & HAS("fma") & HAS("popcnt") && k-- == 0)
     return &N_AVX2::kKernels;
 #endif
