@@ -267,8 +267,8 @@ public:
 
   /// @}
 
-  // Overloads for integers of any type, which match an integer exactly and call the documented overload of
-  // the same name; then deleted overloads.
+  // Overloads for integers of any type. Each matches an integer exactly and calls the documented overload of
+  // its name. Deleted overloads follow.
   /// @cond
 
   template <class N, class X, detail::IfIntegers<N, X> = 0>

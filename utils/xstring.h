@@ -285,8 +285,8 @@ extern template class basic_xstring<char16>;
 /// UTF-16. A failed allocation throws std::bad_alloc; a UTF conversion then leaves the beginning of the
 /// result in the destination; the conversion from ASCII leaves the destination as it was. On return the
 /// destination has its old capacity, or room for the result and the terminator of c_str() if that is more; an
-/// empty source adds no capacity. The source may not lie in the destination. With a srcLen of
-/// 0, src may be a null pointer; with a larger one, src isn't checked.
+/// empty source adds no capacity. The source may not lie in the destination. With a srcLen of 0, src may be a
+/// null pointer; with a larger one, src isn't checked.
 /// @snippet examples/reference.cpp conversions
 /// @{
 

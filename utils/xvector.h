@@ -1046,8 +1046,8 @@ template <class T> void xvector<T>::ReplaceRange(ssize_t i, ssize_t n, const T* 
   p_copy(range, p, p + pn);
 }
 
-/// Replaces the n elements at index i by count elements equal to x. The argument may be an element of
-/// this vector, so x is passed by value.
+/// Replaces the n elements at index i with count elements equal to x. The argument may be an element of this
+/// vector, so x is passed by value.
 template <class T> void xvector<T>::FillRange(ssize_t i, ssize_t n, ssize_t count, T x) {
   T* const range = ResizeRange(i, n, count);
   p_create(range, range + count, x);
